@@ -1,0 +1,31 @@
+#ifndef QUAVEL_QVFSTREAM_H
+#define QUAVEL_QVFSTREAM_H
+
+#include <string>
+
+#include "quavel/QVStream.h"
+#include "quavel/export.h"
+
+namespace quavel {
+
+/// A file, read through its descriptor: one system call an operation and no buffer. A seek past
+/// the end succeeds and the reads there deliver nothing; one before the start is refused and
+/// leaves the position as it was.
+class QUAVEL_EXPORT QVFStream : public QVStream {
+ public:
+  /// Opens the file read-only. When that fails, the stream is empty and `errno` says why.
+  QVFStream(std::string const& path);
+  ~QVFStream() override;
+  QVFStream(QVFStream const&) = delete;
+  QVFStream& operator=(QVFStream const&) = delete;
+
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;
+  long getOffset() override;
+  void setOffset(long const& offset) override;
+
+  std::int32_t fd;  ///< Owned descriptor; -1: the file could not be opened.
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVFSTREAM_H

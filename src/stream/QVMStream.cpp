@@ -1,0 +1,31 @@
+#include "quavel/QVMStream.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace quavel {
+
+QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
+    : buffer(bytes), length(count) {}
+
+std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
+  std::size_t const delivered = std::min<std::size_t>(count, length - offset);
+  if (delivered > 0) {
+    std::memcpy(destination, buffer + offset, delivered);
+    offset += delivered;
+  }
+  return static_cast<std::int64_t>(delivered);
+}
+
+long QVMStream::getOffset() {
+  return static_cast<long>(offset - static_cast<std::uint64_t>(baseOffset));
+}
+
+void QVMStream::setOffset(long const& newOffset) {
+  // Unsigned, a target before the start lies beyond any length.
+  std::uint64_t const target =
+      static_cast<std::uint64_t>(baseOffset) + static_cast<std::uint64_t>(newOffset);
+  offset = std::min(target, length);
+}
+
+}  // namespace quavel

@@ -1,0 +1,90 @@
+#include "quavel/QVStream.h"
+
+#include <algorithm>
+
+namespace quavel {
+
+namespace {
+
+template <class Number>
+void reverseBytes(Number* number) {
+  auto* const bytes = reinterpret_cast<unsigned char*>(number);
+  std::reverse(bytes, bytes + sizeof(Number));
+}
+
+template <class Number>
+void reverseUnlessHostIs(ByteOrder order, QVStream const& stream, Number* number) {
+  if (stream.hostOrder != order) {
+    reverseBytes(number);
+  }
+}
+
+bool isReversed(QVStream const& stream) {
+  bool const isKnown =
+      stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
+  return isKnown && stream.byteOrder != stream.hostOrder;
+}
+
+template <class Number>
+bool readNumber(QVStream& stream, Number* number) {
+  auto* const bytes = reinterpret_cast<std::uint8_t*>(number);
+  if (stream.readBuffer(bytes, sizeof(Number)) != static_cast<std::int64_t>(sizeof(Number))) {
+    return false;
+  }
+  if (sizeof(Number) > 1 && isReversed(stream)) {
+    reverseBytes(number);
+  }
+  return true;
+}
+
+}  // namespace
+
+QVStream::QVStream() : hostOrder(hostBytesOrder()), byteOrder(ByteOrder::BigEndian) {}
+
+QVStream::~QVStream() = default;
+
+ByteOrder QVStream::hostBytesOrder() const {
+  unsigned short const one = 1;
+  bool const lowByteFirst = *reinterpret_cast<unsigned char const*>(&one) == 1;
+  return lowByteFirst ? ByteOrder::LittleEndian : ByteOrder::BigEndian;
+}
+
+bool QVStream::readChar(char* destination) { return readNumber(*this, destination); }
+bool QVStream::readByte(unsigned char* destination) { return readNumber(*this, destination); }
+bool QVStream::readSByte(signed char* destination) { return readNumber(*this, destination); }
+bool QVStream::readShort(unsigned short* destination) { return readNumber(*this, destination); }
+bool QVStream::readSShort(short* destination) { return readNumber(*this, destination); }
+bool QVStream::readLong(unsigned int* destination) { return readNumber(*this, destination); }
+bool QVStream::readSLong(int* destination) { return readNumber(*this, destination); }
+bool QVStream::readFloat(float* destination) { return readNumber(*this, destination); }
+bool QVStream::readDouble(double* destination) { return readNumber(*this, destination); }
+
+void QVStream::swapS(unsigned short* value) const { reverseBytes(value); }
+void QVStream::swapL(unsigned int* value) const { reverseBytes(value); }
+void QVStream::swapLL(unsigned long long* value) const { reverseBytes(value); }
+
+void QVStream::swapSLittleToHost(unsigned short* value) const {
+  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+}
+
+void QVStream::swapLLittleToHost(unsigned int* value) const {
+  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+}
+
+void QVStream::swapLLLitleToHost(unsigned long long* value) const {
+  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+}
+
+void QVStream::swapSBigToHost(unsigned short* value) const {
+  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+}
+
+void QVStream::swapLBigToHost(unsigned int* value) const {
+  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+}
+
+void QVStream::swapLLBigToHost(unsigned long long* value) const {
+  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+}
+
+}  // namespace quavel
