@@ -1,0 +1,28 @@
+#ifndef QUAVEL_QVTIFFHEADER_H
+#define QUAVEL_QVTIFFHEADER_H
+
+#include <cstdint>
+#include <memory>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVStream;
+
+/// The 8 bytes that open every TIFF structure (TIFF 6.0). Decides the byte order of all later
+/// reads.
+class QUAVEL_EXPORT QVTiffHeader {
+ public:
+  QVTiffHeader();
+
+  /// Reads at the stream's position. True: the stream stands just behind the header and its
+  /// `byteOrder` is set. False: it may stand inside, and `byteOrder` may already have changed.
+  bool read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic);
+
+  std::uint32_t firstIFDOffset = 0;  ///< Counted from the header's first byte.
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVTIFFHEADER_H

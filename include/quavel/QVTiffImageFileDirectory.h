@@ -1,0 +1,37 @@
+#ifndef QUAVEL_QVTIFFIMAGEFILEDIRECTORY_H
+#define QUAVEL_QVTIFFIMAGEFILEDIRECTORY_H
+
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <vector>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVStream;
+class QVTiffImageFileDirectoryEntry;
+
+/// A TIFF image file directory (IFD): its wanted entries by tag.
+class QUAVEL_EXPORT QVTiffImageFileDirectory {
+ public:
+  QVTiffImageFileDirectory();
+
+  /// Reads the directory at the stream's position, parsing the listed tags alone and only until
+  /// each was met once; an empty list wants every entry. Of a repeated tag the first entry counts.
+  /// False: the entry count, a tag, a wanted entry or the next directory's offset cannot be read;
+  /// only in the last case are the new `entries` kept.
+  bool read(std::shared_ptr<QVStream>& stream, std::vector<unsigned short> const& tags);
+
+  /// The entry kept for `tag`, or null.
+  std::shared_ptr<QVTiffImageFileDirectoryEntry> entryForTag(unsigned short const& tag) const;
+
+  std::uint32_t nextIFDOffset = 0;  ///< From the TIFF header; 0: this is the last directory.
+  /// Null until a `read` has walked the entries; replaced by each that does.
+  std::shared_ptr<std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>> entries;
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVTIFFIMAGEFILEDIRECTORY_H

@@ -1,0 +1,100 @@
+#ifndef QUAVEL_QVTIFFIMAGEFILEDIRECTORYENTRYVALUE_H
+#define QUAVEL_QVTIFFIMAGEFILEDIRECTORYENTRYVALUE_H
+
+#include <array>
+#include <cstdint>
+#include <memory>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVStream;
+
+/// The TIFF 6.0 field types: a type's code in the file, less one.
+enum class EntryValueType : std::uint8_t {
+  BYTE = 0,
+  ASCII = 1,
+  SHORT = 2,
+  LONG = 3,
+  RATIONAL = 4,
+  SBYTE = 5,
+  UNDEFINED = 6,
+  SSHORT = 7,
+  SLONG = 8,
+  SRATIONAL = 9,
+  FLOAT = 10,
+  DOUBLE = 11,
+};
+
+/// Field types by their code in the file. Code 13 (IFD) is an ordinary LONG; an entry refuses
+/// code 0 and the codes from 14 on before it looks here.
+inline constexpr std::array<EntryValueType, 14> fieldTypeToValueType = {
+    EntryValueType::UNDEFINED, EntryValueType::BYTE,      EntryValueType::ASCII,
+    EntryValueType::SHORT,     EntryValueType::LONG,      EntryValueType::RATIONAL,
+    EntryValueType::SBYTE,     EntryValueType::UNDEFINED, EntryValueType::SSHORT,
+    EntryValueType::SLONG,     EntryValueType::SRATIONAL, EntryValueType::FLOAT,
+    EntryValueType::DOUBLE,    EntryValueType::LONG,
+};
+
+/// An unsigned fraction as stored; the denominator may be 0.
+struct Rational {
+  std::uint32_t numerator;
+  std::uint32_t denominator;
+};
+
+/// A signed fraction as stored; the denominator may be 0.
+struct SRational {
+  std::int32_t numerator;
+  std::int32_t denominator;
+};
+
+/// One value of a directory entry. Every accessor answers for every type; a type that it cannot
+/// convert, UNDEFINED among them, gives zero.
+class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
+ public:
+  QVTiffImageFileDirectoryEntryValue() = default;
+
+  /// Reads one value of the type set in `type` at the stream's position, in its `byteOrder`.
+  /// False: the data ended, or the type holds no values; `value` is then to be taken as unset.
+  bool read(std::shared_ptr<QVStream>& stream);
+
+  /// Bytes that one value takes in a file; 0 for UNDEFINED and for what is no type.
+  static unsigned int sizeOfValueOfType(EntryValueType const& type);
+
+  /// @name As an integer
+  /// The stored integer widened to 32 bits by its own sign, then cut to the result's width.
+  /// Fractions and floats are truncated toward zero first; a fraction over 0 and a NaN give 0.
+  /// Floats saturate at the limits of int32, those of uint32 for `longValue`.
+  /// @{
+  char charValue() const;
+  std::uint8_t byteValue() const;
+  std::int8_t sbyteValue() const;
+  std::uint16_t shortValue() const;
+  std::int16_t sshortValue() const;
+  std::uint32_t longValue() const;
+  std::int32_t slongValue() const;
+  /// @}
+
+  /// @name As a floating-point number
+  /// Fractions are divided in the result's precision; one over 0 gives an infinity or NaN.
+  /// @{
+  float floatValue() const;
+  double doubleValue() const;
+  /// @}
+
+  /// @name As stored
+  /// The pair of a RATIONAL, respectively SRATIONAL; any other type gives 0/0.
+  /// @{
+  Rational rationalValue() const;
+  SRational sRationalValue() const;
+  /// @}
+
+  EntryValueType type = EntryValueType::UNDEFINED;
+  std::uint8_t value[8] =
+      {};  ///< In host byte order, left-justified; a fraction's numerator first.
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVTIFFIMAGEFILEDIRECTORYENTRYVALUE_H

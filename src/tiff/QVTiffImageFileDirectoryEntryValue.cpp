@@ -1,0 +1,224 @@
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+
+#include <cmath>
+#include <cstring>
+#include <limits>
+
+#include "quavel/QVStream.h"
+
+namespace quavel {
+
+namespace {
+
+using Value = QVTiffImageFileDirectoryEntryValue;
+
+template <class T>
+T stored(Value const& value) {
+  T result;
+  std::memcpy(&result, value.value, sizeof(T));
+  return result;
+}
+
+/// Reads one number of type T into the value's storage, `position` bytes in.
+template <class T>
+bool readInto(Value& value, QVStream& stream, bool (QVStream::*readNumber)(T*),
+              std::size_t position = 0) {
+  T number{};
+  if (!(stream.*readNumber)(&number)) {
+    return false;
+  }
+  std::memcpy(value.value + position, &number, sizeof(T));
+  return true;
+}
+
+std::uint32_t quotient(Rational const& fraction) {
+  return fraction.denominator == 0 ? 0 : fraction.numerator / fraction.denominator;
+}
+
+std::int32_t quotient(SRational const& fraction) {
+  if (fraction.denominator == 0) {
+    return 0;
+  }
+  // 64 bits hold the one quotient that 32 bits do not; cutting it gives the numerator back.
+  return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
+}
+
+template <class Integer>
+Integer truncated(double number) {
+  if (std::isnan(number)) {
+    return 0;
+  }
+  if (number <= static_cast<double>(std::numeric_limits<Integer>::min())) {
+    return std::numeric_limits<Integer>::min();
+  }
+  if (number >= static_cast<double>(std::numeric_limits<Integer>::max())) {
+    return std::numeric_limits<Integer>::max();
+  }
+  return static_cast<Integer>(number);
+}
+
+/// The value's low 32 bits; floats saturate at the limits of `Integer`, of 32 bits too.
+template <class Integer>
+std::uint32_t to32Bits(Value const& value) {
+  switch (value.type) {
+    case EntryValueType::BYTE:
+      return stored<std::uint8_t>(value);
+    case EntryValueType::ASCII:
+    case EntryValueType::SBYTE:
+      return static_cast<std::uint32_t>(stored<std::int8_t>(value));
+    case EntryValueType::SHORT:
+      return stored<std::uint16_t>(value);
+    case EntryValueType::SSHORT:
+      return static_cast<std::uint32_t>(stored<std::int16_t>(value));
+    case EntryValueType::LONG:
+    case EntryValueType::SLONG:
+      return stored<std::uint32_t>(value);
+    case EntryValueType::RATIONAL:
+      return quotient(stored<Rational>(value));
+    case EntryValueType::SRATIONAL:
+      return static_cast<std::uint32_t>(quotient(stored<SRational>(value)));
+    case EntryValueType::FLOAT:
+      return static_cast<std::uint32_t>(truncated<Integer>(stored<float>(value)));
+    case EntryValueType::DOUBLE:
+      return static_cast<std::uint32_t>(truncated<Integer>(stored<double>(value)));
+    case EntryValueType::UNDEFINED:
+      return 0;
+  }
+  return 0;  // `type` is public: it may hold what is no type
+}
+
+template <class Float, class Fraction>
+Float divided(Fraction const& fraction) {
+  return static_cast<Float>(fraction.numerator) / static_cast<Float>(fraction.denominator);
+}
+
+template <class Float>
+Float toFloat(Value const& value) {
+  switch (value.type) {
+    case EntryValueType::BYTE:
+      return stored<std::uint8_t>(value);
+    case EntryValueType::ASCII:
+    case EntryValueType::SBYTE:
+      return stored<std::int8_t>(value);
+    case EntryValueType::SHORT:
+      return stored<std::uint16_t>(value);
+    case EntryValueType::SSHORT:
+      return stored<std::int16_t>(value);
+    case EntryValueType::LONG:
+      return static_cast<Float>(stored<std::uint32_t>(value));
+    case EntryValueType::SLONG:
+      return static_cast<Float>(stored<std::int32_t>(value));
+    case EntryValueType::RATIONAL:
+      return divided<Float>(stored<Rational>(value));
+    case EntryValueType::SRATIONAL:
+      return divided<Float>(stored<SRational>(value));
+    case EntryValueType::FLOAT:
+      return stored<float>(value);
+    case EntryValueType::DOUBLE:
+      return static_cast<Float>(stored<double>(value));
+    case EntryValueType::UNDEFINED:
+      return 0;
+  }
+  return 0;  // `type` is public: it may hold what is no type
+}
+
+std::uint32_t bitsOf(Value const& value) { return to32Bits<std::int32_t>(value); }
+
+}  // namespace
+
+bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream) {
+  switch (type) {
+    case EntryValueType::BYTE:
+      return readInto(*this, *stream, &QVStream::readByte);
+    case EntryValueType::ASCII:
+      return readInto(*this, *stream, &QVStream::readChar);
+    case EntryValueType::SHORT:
+      return readInto(*this, *stream, &QVStream::readShort);
+    case EntryValueType::LONG:
+      return readInto(*this, *stream, &QVStream::readLong);
+    case EntryValueType::RATIONAL:
+      return readInto(*this, *stream, &QVStream::readLong) &&
+             readInto(*this, *stream, &QVStream::readLong, 4);
+    case EntryValueType::SBYTE:
+      return readInto(*this, *stream, &QVStream::readSByte);
+    case EntryValueType::SSHORT:
+      return readInto(*this, *stream, &QVStream::readSShort);
+    case EntryValueType::SLONG:
+      return readInto(*this, *stream, &QVStream::readSLong);
+    case EntryValueType::SRATIONAL:
+      return readInto(*this, *stream, &QVStream::readSLong) &&
+             readInto(*this, *stream, &QVStream::readSLong, 4);
+    case EntryValueType::FLOAT:
+      return readInto(*this, *stream, &QVStream::readFloat);
+    case EntryValueType::DOUBLE:
+      return readInto(*this, *stream, &QVStream::readDouble);
+    case EntryValueType::UNDEFINED:
+      return false;
+  }
+  return false;  // `type` is public: it may hold what is no type
+}
+
+unsigned int QVTiffImageFileDirectoryEntryValue::sizeOfValueOfType(EntryValueType const& type) {
+  switch (type) {
+    case EntryValueType::BYTE:
+    case EntryValueType::ASCII:
+    case EntryValueType::SBYTE:
+      return 1;
+    case EntryValueType::SHORT:
+    case EntryValueType::SSHORT:
+      return 2;
+    case EntryValueType::LONG:
+    case EntryValueType::SLONG:
+    case EntryValueType::FLOAT:
+      return 4;
+    case EntryValueType::RATIONAL:
+    case EntryValueType::SRATIONAL:
+    case EntryValueType::DOUBLE:
+      return 8;
+    case EntryValueType::UNDEFINED:
+      return 0;
+  }
+  return 0;  // the argument may hold what is no type
+}
+
+char QVTiffImageFileDirectoryEntryValue::charValue() const {
+  return static_cast<char>(bitsOf(*this));
+}
+
+std::uint8_t QVTiffImageFileDirectoryEntryValue::byteValue() const {
+  return static_cast<std::uint8_t>(bitsOf(*this));
+}
+
+std::int8_t QVTiffImageFileDirectoryEntryValue::sbyteValue() const {
+  return static_cast<std::int8_t>(bitsOf(*this));
+}
+
+std::uint16_t QVTiffImageFileDirectoryEntryValue::shortValue() const {
+  return static_cast<std::uint16_t>(bitsOf(*this));
+}
+
+std::int16_t QVTiffImageFileDirectoryEntryValue::sshortValue() const {
+  return static_cast<std::int16_t>(bitsOf(*this));
+}
+
+std::uint32_t QVTiffImageFileDirectoryEntryValue::longValue() const {
+  return to32Bits<std::uint32_t>(*this);
+}
+
+std::int32_t QVTiffImageFileDirectoryEntryValue::slongValue() const {
+  return static_cast<std::int32_t>(bitsOf(*this));
+}
+
+float QVTiffImageFileDirectoryEntryValue::floatValue() const { return toFloat<float>(*this); }
+
+double QVTiffImageFileDirectoryEntryValue::doubleValue() const { return toFloat<double>(*this); }
+
+Rational QVTiffImageFileDirectoryEntryValue::rationalValue() const {
+  return type == EntryValueType::RATIONAL ? stored<Rational>(*this) : Rational{0, 0};
+}
+
+SRational QVTiffImageFileDirectoryEntryValue::sRationalValue() const {
+  return type == EntryValueType::SRATIONAL ? stored<SRational>(*this) : SRational{0, 0};
+}
+
+}  // namespace quavel
