@@ -1,0 +1,61 @@
+#ifndef QUAVEL_QVMETADATA_H
+#define QUAVEL_QVMETADATA_H
+
+#include <cmath>
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVStream;
+class QVTiffImageFileDirectory;
+
+/// What a file tells about its image, and the base of the format readers that fill it. A field
+/// that the file does not give keeps its initial value: -1, NaN, the empty string or false. Texts
+/// are the file's own bytes up to the first NUL; tags are those of TIFF 6.0 and Exif.
+class QUAVEL_EXPORT QVMetadata {
+ public:
+  QVMetadata();
+  virtual ~QVMetadata();
+
+  /// Fills the record from a file, or a structure laid out like one, that begins at the stream's
+  /// position. Meant to be called once. False: the data is not a whole file of the format; fields
+  /// stored by then keep their values.
+  virtual bool read(std::shared_ptr<QVStream>& stream) = 0;
+
+  /// Takes the dates from an Exif directory. False: a date is there and is no text.
+  virtual bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+
+  /// The best date there is: the original one, else the digitized one, else the file's.
+  std::string captureDate() const;
+
+  std::int32_t width = -1;        ///< Of the full-size image, in pixels.
+  std::int32_t height = -1;       ///< Of the full-size image, in pixels.
+  std::int32_t orientation = -1;  ///< TIFF Orientation, unchecked; CR3 gives 1 when it is absent.
+  bool isRaw = false;             ///< The format is a camera's raw format.
+  std::string dateTimeOriginal;   ///< "YYYY:MM:DD HH:MM:SS" in well-made files, like all dates.
+  std::string dateTimeDigitized;
+  std::string dateTime;
+  bool hasShootingInfo = false;  ///< A shooting record was read into the fields below.
+  std::string model;             ///< Of the camera.
+  std::string lensModel;
+  std::int32_t iso = -1;                    ///< ISOSpeedRatings
+  float apexFNumber = std::nanf("");        ///< F-number that ApertureValue amounts to.
+  float apexExposureTime = std::nanf("");   ///< Seconds that ShutterSpeedValue amounts to.
+  float apertureValue = std::nanf("");      ///< APEX units.
+  float shutterSpeedValue = std::nanf("");  ///< APEX units.
+  float focalLength = std::nanf("");        ///< Millimetres.
+  std::int32_t whiteBalance = -1;           ///< Exif: 0 automatic, 1 manual.
+  std::int32_t meteringMode = -1;           ///< Exif MeteringMode.
+  float exposureBiasValue = std::nanf("");  ///< APEX units.
+  std::int32_t focalLengthIn35mmFilm = -1;  ///< Millimetres.
+  float exposureTime = std::nanf("");       ///< Seconds.
+  float fNumber = std::nanf("");
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVMETADATA_H

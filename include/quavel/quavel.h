@@ -1,0 +1,31 @@
+#ifndef QUAVEL_QUAVEL_H
+#define QUAVEL_QUAVEL_H
+
+#include "quavel/QV3FRImage.h"
+#include "quavel/QVARWImage.h"
+#include "quavel/QVCR2Image.h"
+#include "quavel/QVCR3Box.h"
+#include "quavel/QVCR3BoxHeader.h"
+#include "quavel/QVCR3CMT1Box.h"
+#include "quavel/QVCR3CMT2Box.h"
+#include "quavel/QVCR3Image.h"
+#include "quavel/QVCR3MoovBox.h"
+#include "quavel/QVCR3UUIDBox.h"
+#include "quavel/QVDNGImage.h"
+#include "quavel/QVFStream.h"
+#include "quavel/QVJPEGImage.h"
+#include "quavel/QVMStream.h"
+#include "quavel/QVMetadata.h"
+#include "quavel/QVNRWImage.h"
+#include "quavel/QVNefImage.h"
+#include "quavel/QVRafImage.h"
+#include "quavel/QVReader.h"
+#include "quavel/QVStream.h"
+#include "quavel/QVTiffHeader.h"
+#include "quavel/QVTiffImage.h"
+#include "quavel/QVTiffImageFileDirectory.h"
+#include "quavel/QVTiffImageFileDirectoryEntry.h"
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+#include "quavel/version.h"
+
+#endif  // QUAVEL_QUAVEL_H

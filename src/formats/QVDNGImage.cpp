@@ -1,0 +1,9 @@
+#include "quavel/QVDNGImage.h"
+
+namespace quavel {
+
+QVDNGImage::QVDNGImage() { isRaw = true; }
+
+QVDNGImage::~QVDNGImage() = default;
+
+}  // namespace quavel

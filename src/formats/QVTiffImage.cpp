@@ -1,0 +1,92 @@
+#include "quavel/QVTiffImage.h"
+
+#include "quavel/QVStream.h"
+#include "quavel/QVTiffImageFileDirectory.h"
+#include "quavel/QVTiffImageFileDirectoryEntry.h"
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+#include "tiff/Directories.h"
+#include "tiff/Tags.h"
+
+namespace quavel {
+
+using namespace detail;
+
+namespace {
+
+/// The first of the SubIFDs that says it is no reduced image; null when there is none.
+Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& subIFDs) {
+  if (!subIFDs->values) {
+    return nullptr;
+  }
+  for (auto const& offset : *subIFDs->values) {
+    auto subIFD =
+        readDirectoryAt(stream, offset->longValue(),
+                        {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
+    if (!subIFD) {
+      return nullptr;
+    }
+    auto const type = subIFD->entryForTag(tag::NewSubfileType);
+    if (!type) {
+      continue;  // one that does not say what it is, is never taken
+    }
+    auto const typeValue = singleValue(type);
+    if (!typeValue) {
+      return nullptr;
+    }
+    if (!isReducedImage(typeValue)) {
+      return subIFD;
+    }
+  }
+  return nullptr;
+}
+
+/// The directory of the full-size image; null on failure and when there is none.
+Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
+  auto const type = mainIFD->entryForTag(tag::NewSubfileType);
+  if (!type) {
+    return mainIFD;
+  }
+  auto const typeValue = singleValue(type);
+  if (!typeValue) {
+    return nullptr;
+  }
+  if (!isReducedImage(typeValue)) {
+    return mainIFD;
+  }
+  auto const subIFDs = mainIFD->entryForTag(tag::SubIFDs);
+  return subIFDs ? readFullImageSubIFD(stream, subIFDs) : nullptr;
+}
+
+}  // namespace
+
+bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
+  auto const mainIFD = readFirstDirectory(
+      stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
+               tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
+  if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
+    return false;
+  }
+
+  auto const fullImageIFD = chooseFullImageIFD(stream, mainIFD);
+  if (!fullImageIFD || !storeInfoFromFullImageIFD(fullImageIFD)) {
+    return false;
+  }
+
+  Directory exifIFD;
+  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
+                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
+                     exifIFD)) {
+    return false;
+  }
+  return !exifIFD || storeInfoFromExifIFD(exifIFD);
+}
+
+bool QVTiffImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  return storeNumber(ifd, tag::Orientation, orientation) && storeText(ifd, tag::DateTime, dateTime);
+}
+
+bool QVTiffImage::storeInfoFromFullImageIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  return storeNumber(ifd, tag::ImageWidth, width) && storeNumber(ifd, tag::ImageLength, height);
+}
+
+}  // namespace quavel

@@ -1,0 +1,27 @@
+#include "quavel/QVMetadata.h"
+
+#include "tiff/Directories.h"
+#include "tiff/Tags.h"
+
+namespace quavel {
+
+QVMetadata::QVMetadata() = default;
+
+QVMetadata::~QVMetadata() = default;
+
+bool QVMetadata::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  return detail::storeText(ifd, tag::DateTimeOriginal, dateTimeOriginal) &&
+         detail::storeText(ifd, tag::DateTimeDigitized, dateTimeDigitized);
+}
+
+std::string QVMetadata::captureDate() const {
+  if (!dateTimeOriginal.empty()) {
+    return dateTimeOriginal;
+  }
+  if (!dateTimeDigitized.empty()) {
+    return dateTimeDigitized;
+  }
+  return dateTime;
+}
+
+}  // namespace quavel

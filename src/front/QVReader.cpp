@@ -1,0 +1,78 @@
+#include "quavel/QVReader.h"
+
+#include <algorithm>
+#include <cctype>
+
+#include "quavel/QV3FRImage.h"
+#include "quavel/QVARWImage.h"
+#include "quavel/QVCR2Image.h"
+#include "quavel/QVCR3Image.h"
+#include "quavel/QVDNGImage.h"
+#include "quavel/QVFStream.h"
+#include "quavel/QVJPEGImage.h"
+#include "quavel/QVMStream.h"
+#include "quavel/QVNRWImage.h"
+#include "quavel/QVNefImage.h"
+#include "quavel/QVRafImage.h"
+#include "quavel/QVTiffImage.h"
+
+namespace quavel {
+
+namespace {
+
+template <class Format>
+std::shared_ptr<QVMetadata> make() {
+  return std::make_shared<Format>();
+}
+
+struct ExtensionRow {
+  char const* extension;
+  std::shared_ptr<QVMetadata> (*makeRecord)();
+};
+
+constexpr ExtensionRow kExtensions[] = {
+    {"tiff", make<QVTiffImage>}, {"tif", make<QVTiffImage>},  {"dng", make<QVDNGImage>},
+    {"nef", make<QVNefImage>},   {"cr2", make<QVCR2Image>},   {"raf", make<QVRafImage>},
+    {"arw", make<QVARWImage>},   {"jpeg", make<QVJPEGImage>}, {"jpg", make<QVJPEGImage>},
+    {"nrw", make<QVNRWImage>},   {"3fr", make<QV3FRImage>},   {"cr3", make<QVCR3Image>},
+};
+
+/// The record that a read of the whole stream fills, or null.
+std::shared_ptr<QVMetadata> readRecord(QVReader const& reader, std::string const& extension,
+                                       std::shared_ptr<QVStream> stream) {
+  auto record = reader.createMetadata(extension);
+  return record && record->read(stream) ? record : nullptr;
+}
+
+}  // namespace
+
+QVReader::QVReader(std::string const& path) {
+  std::string extension = getPathExtension(path);
+  std::transform(extension.begin(), extension.end(), extension.begin(),
+                 [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
+  metadata = readRecord(*this, extension, std::make_shared<QVFStream>(path));
+}
+
+QVReader::QVReader(unsigned char* buffer, unsigned long const& length,
+                   std::string const& extension) {
+  metadata = readRecord(*this, extension, std::make_shared<QVMStream>(buffer, length));
+}
+
+QVReader::~QVReader() = default;
+
+std::string QVReader::getPathExtension(std::string const& path) const {
+  // A "." in a folder's name counts too when the file's has none; no format is named so.
+  auto const dot = path.rfind('.');
+  return dot == std::string::npos ? std::string() : path.substr(dot + 1);
+}
+
+std::shared_ptr<QVMetadata> QVReader::createMetadata(std::string const& extension) const {
+  for (auto const& row : kExtensions) {
+    if (extension == row.extension) {
+      return row.makeRecord();
+    }
+  }
+  return nullptr;
+}
+
+}  // namespace quavel
