@@ -1,0 +1,31 @@
+#ifndef QUAVEL_QVCR3BOX_H
+#define QUAVEL_QVCR3BOX_H
+
+#include <memory>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVCR3BoxHeader;
+class QVStream;
+
+/// A box of an ISO base media file, stepped over; the base of those that are looked into.
+class QUAVEL_EXPORT QVCR3Box {
+ public:
+  virtual ~QVCR3Box();
+
+  /// Reads the box whose header is at the stream's position, which must have big-endian
+  /// `byteOrder`. True: the stream stands behind the box, even where that is past the end. False:
+  /// the header cannot be read, or its size does not even cover the header.
+  virtual bool read(std::shared_ptr<QVStream>& stream);
+
+  /// The header read last; null before a `read`.
+  std::shared_ptr<QVCR3BoxHeader> header() const;
+
+  std::shared_ptr<QVCR3BoxHeader> boxHeader;  ///< A fresh one for each `read`.
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVCR3BOX_H

@@ -1,0 +1,28 @@
+#ifndef QUAVEL_QVCR3BOXHEADER_H
+#define QUAVEL_QVCR3BOXHEADER_H
+
+#include <cstdint>
+#include <memory>
+
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVStream;
+
+/// The compact header of an ISO base media file's box (ISO/IEC 14496-12).
+class QUAVEL_EXPORT QVCR3BoxHeader {
+ public:
+  /// Reads the 8 bytes at the stream's position. False: the data ended inside.
+  bool read(std::shared_ptr<QVStream>& stream);
+
+  unsigned int size() const;
+  unsigned int type() const;
+
+  std::uint32_t boxSize = 0;  ///< Bytes, this header included.
+  std::uint32_t boxType = 0;  ///< The four characters as one big-endian number.
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVCR3BOXHEADER_H

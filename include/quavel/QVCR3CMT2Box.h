@@ -1,0 +1,48 @@
+#ifndef QUAVEL_QVCR3CMT2BOX_H
+#define QUAVEL_QVCR3CMT2BOX_H
+
+#include <cmath>
+#include <cstdint>
+#include <string>
+
+#include "quavel/QVCR3Box.h"
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVTiffImageFileDirectory;
+
+/// The box whose payload is a TIFF structure with the Exif directory. Units and absence are those
+/// of the record's fields of the same names.
+class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
+ public:
+  /// True: the stream stands behind the box, its `baseOffset` and `byteOrder` as they were. False:
+  /// another type of box, or a malformed payload, which leaves the stream as it was read.
+  bool read(std::shared_ptr<QVStream>& stream) override;
+  /// Reads the payload with the stream at its TIFF header and `baseOffset` there.
+  bool readExif(std::shared_ptr<QVStream>& stream);
+  /// Fills the fields below from the lens to the f-number, up to the first malformed one.
+  bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+
+  std::int32_t iso = -1;
+  std::string lensModel;
+  float apexFNumber = std::nanf("");
+  float apexExposureTime = std::nanf("");
+  float apertureValue = std::nanf("");
+  float shutterSpeedValue = std::nanf("");
+  float focalLength = std::nanf("");
+  std::int32_t whiteBalance = -1;
+  std::int32_t meteringMode = -1;
+  float exposureBiasValue = std::nanf("");
+  std::int32_t focalLengthIn35mmFilm = -1;
+  float exposureTime = std::nanf("");
+  float fNumber = std::nanf("");
+
+ private:
+  bool storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+  bool storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVCR3CMT2BOX_H

@@ -1,0 +1,28 @@
+#ifndef QUAVEL_QVCR3IMAGE_H
+#define QUAVEL_QVCR3IMAGE_H
+
+#include "quavel/QVMetadata.h"
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVCR3CMT1Box;
+class QVCR3CMT2Box;
+class QVCR3MoovBox;
+
+/// Reads a CR3 file, an ISO base media file. Gives the size, the orientation, the file's date, the
+/// camera, the lens and the exposure.
+class QUAVEL_EXPORT QVCR3Image : public QVMetadata {
+ public:
+  /// Sets `isRaw` whatever the outcome; all other fields only when the whole read succeeds.
+  bool read(std::shared_ptr<QVStream>& stream) override;
+
+ private:
+  bool storeInfoFromMoov(QVCR3MoovBox const& moov);
+  void storeInfoFromCMT1(QVCR3CMT1Box const& cmt1);
+  void storeInfoFromCMT2(QVCR3CMT2Box const& cmt2);
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVCR3IMAGE_H

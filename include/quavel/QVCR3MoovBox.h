@@ -1,0 +1,25 @@
+#ifndef QUAVEL_QVCR3MOOVBOX_H
+#define QUAVEL_QVCR3MOOVBOX_H
+
+#include "quavel/QVCR3Box.h"
+#include "quavel/export.h"
+
+namespace quavel {
+
+class QVCR3UUIDBox;
+
+/// The `moov` box, walked for its `uuid` children.
+class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
+ public:
+  /// False: another type of box, or a child that cannot be read.
+  bool read(std::shared_ptr<QVStream>& stream) override;
+
+  std::shared_ptr<QVCR3UUIDBox> uuidBox;  ///< The last `uuid` child, of any identifier; or null.
+
+ private:
+  bool readChildren(std::shared_ptr<QVStream>& stream, long end);
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVCR3MOOVBOX_H

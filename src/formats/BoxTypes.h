@@ -1,0 +1,19 @@
+#ifndef QUAVEL_SRC_FORMATS_BOXTYPES_H
+#define QUAVEL_SRC_FORMATS_BOXTYPES_H
+
+#include <cstdint>
+
+// Box types of a CR3 file: four characters as one big-endian number.
+namespace quavel::box {
+
+inline constexpr std::uint32_t Moov = 0x6d6f6f76;
+inline constexpr std::uint32_t Uuid = 0x75756964;
+inline constexpr std::uint32_t CMT1 = 0x434d5431;
+inline constexpr std::uint32_t CMT2 = 0x434d5432;
+
+/// Bytes of a box's size and type.
+inline constexpr std::uint32_t kHeaderSize = 8;
+
+}  // namespace quavel::box
+
+#endif  // QUAVEL_SRC_FORMATS_BOXTYPES_H

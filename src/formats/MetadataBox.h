@@ -1,0 +1,44 @@
+#ifndef QUAVEL_SRC_FORMATS_METADATABOX_H
+#define QUAVEL_SRC_FORMATS_METADATABOX_H
+
+#include <cstdint>
+#include <memory>
+
+#include "formats/BoxTypes.h"
+#include "quavel/QVCR3Box.h"
+#include "quavel/QVCR3BoxHeader.h"
+#include "quavel/QVStream.h"
+
+namespace quavel::detail {
+
+/// Reads a metadata box of the given type: its `readExif` on the payload, with the payload's own
+/// base and byte order, which are put back on success only.
+template <class MetadataBox>
+bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
+                     std::shared_ptr<QVStream>& stream) {
+  long const start = stream->getOffset();
+  if (!metadataBox.QVCR3Box::read(stream)) {
+    return false;
+  }
+  QVCR3BoxHeader const& header = *metadataBox.boxHeader;
+  if (header.type() != type) {
+    return false;
+  }
+
+  std::int64_t const outerBase = stream->baseOffset;
+  ByteOrder const outerOrder = stream->byteOrder;
+  stream->baseOffset = outerBase + start + box::kHeaderSize;
+  stream->setOffset(0);
+  if (!metadataBox.readExif(stream)) {
+    return false;
+  }
+
+  stream->baseOffset = outerBase;
+  stream->setOffset(start + long{header.size()});
+  stream->byteOrder = outerOrder;
+  return true;
+}
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_FORMATS_METADATABOX_H

@@ -1,0 +1,29 @@
+#include "quavel/QVCR3CMT1Box.h"
+
+#include "formats/MetadataBox.h"
+#include "quavel/QVTiffImageFileDirectory.h"
+#include "tiff/Directories.h"
+#include "tiff/Tags.h"
+
+namespace quavel {
+
+using namespace detail;
+
+bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
+  return readMetadataBox(*this, box::CMT1, stream);
+}
+
+bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
+  auto const mainIFD = readFirstDirectory(
+      stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
+               tag::SubIFDs, tag::NewSubfileType, tag::DateTime, tag::Model});
+  return mainIFD && storeInfoFromMainIFD(mainIFD);
+}
+
+bool QVCR3CMT1Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  return storeNumber(ifd, tag::Orientation, orientation) &&
+         storeText(ifd, tag::DateTime, dateTime) && storeNumber(ifd, tag::ImageWidth, width) &&
+         storeNumber(ifd, tag::ImageLength, height) && storeText(ifd, tag::Model, model);
+}
+
+}  // namespace quavel

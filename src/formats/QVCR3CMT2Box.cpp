@@ -1,0 +1,97 @@
+#include "quavel/QVCR3CMT2Box.h"
+
+#include "formats/MetadataBox.h"
+#include "quavel/QVTiffImageFileDirectory.h"
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+#include "tiff/Directories.h"
+#include "tiff/Tags.h"
+
+namespace quavel {
+
+using namespace detail;
+
+namespace {
+
+/// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
+/// untouched. Not a single value: false.
+bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
+  auto const entry = directory->entryForTag(tag);
+  if (!entry) {
+    return true;
+  }
+  auto const value = singleValue(entry);
+  if (!value) {
+    return false;
+  }
+  field = value->shortValue();
+  return true;
+}
+
+/// Stores the tag's fraction. Absent: true, the field untouched. Not a single value, or of
+/// another type: false.
+bool storeFraction(Directory const& directory, unsigned short tag, EntryValueType type,
+                   float& field) {
+  auto const entry = directory->entryForTag(tag);
+  if (!entry) {
+    return true;
+  }
+  auto const value = singleValue(entry);
+  if (!value || value->type != type) {
+    return false;
+  }
+  field = value->floatValue();
+  return true;
+}
+
+}  // namespace
+
+bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
+  return readMetadataBox(*this, box::CMT2, stream);
+}
+
+bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
+  auto const exifIFD = readFirstDirectory(
+      stream, {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
+               tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,
+               tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber});
+  return exifIFD && storeInfoFromMainIFD(exifIFD);
+}
+
+bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  return storeText(ifd, tag::LensModel, lensModel) && storeShort(ifd, tag::ISOSpeedRatings, iso) &&
+         storeAperture(ifd) && storeShutterSpeed(ifd) &&
+         storeFraction(ifd, tag::FocalLength, EntryValueType::RATIONAL, focalLength) &&
+         storeShort(ifd, tag::WhiteBalance, whiteBalance) &&
+         storeShort(ifd, tag::MeteringMode, meteringMode) &&
+         storeFraction(ifd, tag::ExposureBiasValue, EntryValueType::SRATIONAL, exposureBiasValue) &&
+         storeShort(ifd, tag::FocalLengthIn35mmFilm, focalLengthIn35mmFilm) &&
+         storeFraction(ifd, tag::ExposureTime, EntryValueType::RATIONAL, exposureTime) &&
+         storeFraction(ifd, tag::FNumber, EntryValueType::RATIONAL, fNumber);
+}
+
+// APEX counts in powers of two (Exif, annex C): the f-number is 2^(Av/2), the exposure time 2^-Tv
+// seconds.
+
+bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  if (!ifd->entryForTag(tag::ApertureValue)) {
+    return true;
+  }
+  if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {
+    return false;
+  }
+  apexFNumber = ::exp2f(apertureValue * 0.5F);
+  return true;
+}
+
+bool QVCR3CMT2Box::storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  if (!ifd->entryForTag(tag::ShutterSpeedValue)) {
+    return true;
+  }
+  if (!storeFraction(ifd, tag::ShutterSpeedValue, EntryValueType::SRATIONAL, shutterSpeedValue)) {
+    return false;
+  }
+  apexExposureTime = 1.0F / ::exp2f(shutterSpeedValue);
+  return true;
+}
+
+}  // namespace quavel

@@ -1,0 +1,45 @@
+#include "quavel/QVCR3MoovBox.h"
+
+#include "formats/BoxTypes.h"
+#include "quavel/QVCR3BoxHeader.h"
+#include "quavel/QVCR3UUIDBox.h"
+#include "quavel/QVStream.h"
+
+namespace quavel {
+
+bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
+  long const start = stream->getOffset();
+  if (!QVCR3Box::read(stream)) {
+    return false;
+  }
+  stream->setOffset(start + long{box::kHeaderSize});
+  if (boxHeader->type() != box::Moov) {
+    return false;
+  }
+  long const end = start + long{boxHeader->size()};
+
+  bool const isRead = readChildren(stream, end);
+  stream->setOffset(end);
+  return isRead;
+}
+
+bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+  while (stream->getOffset() < end) {
+    long const childStart = stream->getOffset();
+    QVCR3Box child;
+    if (!child.read(stream)) {
+      return false;
+    }
+    if (child.boxHeader->type() != box::Uuid) {
+      continue;
+    }
+    stream->setOffset(childStart);
+    uuidBox = std::make_shared<QVCR3UUIDBox>();
+    if (!uuidBox->read(stream)) {
+      return false;
+    }
+  }
+  return true;
+}
+
+}  // namespace quavel
