@@ -1,0 +1,327 @@
+#include <gtest/gtest.h>
+
+#include <functional>
+
+#include "support/Fixtures.h"
+
+namespace quavel::test {
+namespace {
+
+/// A well-made file with one edit, and what the reader makes of it.
+struct Row {
+  char const* name;
+  std::function<void(Directory&)> edit;
+  bool isRead;
+  std::string fields;
+};
+
+/// Reads each row in both byte orders with a reader of its own, and looks at the reader itself: a
+/// failed read keeps what it had stored.
+template <class Format>
+void check(Directory (*wellMade)(), std::vector<Row> const& rows,
+           std::function<Bytes(ByteOrder, Directory const&)> const& layOut = tiff) {
+  for (ByteOrder const order : kOrders) {
+    for (Row const& row : rows) {
+      SCOPED_TRACE(row.name);
+      Directory directory = wellMade();
+      row.edit(directory);
+      Bytes bytes = layOut(order, directory);
+      std::shared_ptr<QVStream> stream =
+          std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
+      Format format;
+      EXPECT_EQ(format.read(stream), row.isRead);
+      EXPECT_EQ(describe(format), row.fields);
+    }
+  }
+}
+
+void noEdit(Directory& /*file*/) {}
+
+std::string const kDates =
+    "dateTimeOriginal=2021:05:01 10:00:00 dateTimeDigitized=2021:05:01 10:00:01 "
+    "dateTime=2022:06:02 11:00:00";
+std::string const kFileDate = "dateTime=2022:06:02 11:00:00";
+std::string const kOriginal = "dateTimeOriginal=2021:05:01 10:00:00";
+
+TEST(Tiff, TakesTheSizeFromTheFirstDirectoryUnlessThatIsReduced) {
+  std::string const whole = "width=6000 height=4000 orientation=6 " + kDates;
+  std::string const small = "width=256 height=171 orientation=6 " + kDates;
+  check<QVTiffImage>(
+      reducedTiff,
+      {{"second SubIFD", noEdit, true, whole},
+       {"first SubIFD", [](auto& f) { f.sub(kSubIFDs, 0).set(longs(kNewSubfileType, {2})); }, true,
+        "width=1024 height=683 orientation=6 " + kDates},
+       {"first directory, bit 0 clear", [](auto& f) { f.set(longs(kNewSubfileType, {4})); }, true,
+        small},
+       {"first directory, type absent", [](auto& f) { f.remove(kNewSubfileType); }, true, small},
+       {"SubIFD without a type", [](auto& f) { f.sub(kSubIFDs, 0).remove(kNewSubfileType); }, true,
+        whole}});
+}
+
+TEST(Tiff, LeavesOutWhatIsAbsent) {
+  check<QVTiffImage>(
+      plainTiff,
+      {{"no pointer", [](auto& f) { f.remove(kExif); }, true,
+        "width=6000 height=4000 orientation=6 " + kFileDate},
+       {"no dates", [](auto& f) { f.sub(kExif) = {}; }, true,
+        "width=6000 height=4000 orientation=6 " + kFileDate},
+       {"no original date", [](auto& f) { f.sub(kExif).remove(kDateTimeOriginal); }, true,
+        "width=6000 height=4000 orientation=6 dateTimeDigitized=2021:05:01 10:00:01 " + kFileDate},
+       {"undefined date",
+        [](auto& f) { f.sub(kExif).set(characters(kDateTimeOriginal, "2021:05", kUndefined)); },
+        true,
+        "width=6000 height=4000 orientation=6 dateTimeDigitized=2021:05:01 10:00:01 " + kFileDate},
+       {"nothing", [](auto& f) { f.fields.clear(); }, true, ""},
+       {"odd orientation", [](auto& f) { f.set(shorts(kOrientation, {9})); }, true,
+        "width=6000 height=4000 orientation=9 " + kDates}});
+}
+
+TEST(Tiff, Refuses) {
+  std::string const main = "orientation=6 " + kFileDate;
+  std::string const size = "width=6000 height=4000 orientation=6 " + kFileDate;
+  check<QVTiffImage>(
+      reducedTiff,
+      {{"orientation of 2",
+        [](auto& f) {
+          f.set(shorts(kOrientation, {6, 6}));
+        },
+        false, ""},
+       {"orientation of 0", [](auto& f) { f.set(shorts(kOrientation, {})); }, false, ""},
+       {"undefined orientation", [](auto& f) { f.set(characters(kOrientation, "6", kUndefined)); },
+        false, ""},
+       {"date in numbers", [](auto& f) { f.set(shorts(kDateTime, {2022})); }, false,
+        "orientation=6"},
+       {"type of 2",
+        [](auto& f) {
+          f.set(longs(kNewSubfileType, {0, 0}));
+        },
+        false, main},
+       {"no SubIFDs", [](auto& f) { f.remove(kSubIFDs); }, false, main},
+       {"empty SubIFDs", [](auto& f) { f.set(longs(kSubIFDs, {})); }, false, main},
+       {"undefined SubIFDs", [](auto& f) { f.set(claim(kSubIFDs, kUndefined, 8, 8)); }, false,
+        main},
+       {"SubIFD beyond the end", [](auto& f) { f.set(longs(kSubIFDs, {100000})); }, false, main},
+       {"SubIFD's type of 2",
+        [](auto& f) {
+          f.sub(kSubIFDs, 1).set(longs(kNewSubfileType, {0, 0}));
+        },
+        false, main},
+       {"only reduced SubIFDs",
+        [](auto& f) { f.sub(kSubIFDs, 1).set(longs(kNewSubfileType, {1})); }, false, main},
+       {"only SubIFDs without a type",
+        [](auto& f) { f.set(pointer(kSubIFDs, {Directory{{longs(kWidth, {6000})}}})); }, false,
+        main},
+       {"width of 2",
+        [](auto& f) {
+          f.sub(kSubIFDs, 1).set(longs(kWidth, {1, 2}));
+        },
+        false, main},
+       {"height of 0", [](auto& f) { f.sub(kSubIFDs, 1).set(longs(kLength, {})); }, false,
+        "width=6000 " + main},
+       {"pointer of 2",
+        [](auto& f) {
+          f.set(longs(kExif, {8, 8}));
+        },
+        false, size},
+       {"Exif beyond the end", [](auto& f) { f.set(longs(kExif, {100000})); }, false, size},
+       {"original date in numbers",
+        [](auto& f) { f.sub(kExif).set(shorts(kDateTimeOriginal, {2021})); }, false, size},
+       {"digitized date in numbers",
+        [](auto& f) { f.sub(kExif).set(shorts(kDateTimeDigitized, {2021})); }, false,
+        "width=6000 height=4000 orientation=6 " + kOriginal + " " + kFileDate}});
+}
+
+TEST(Tiff, IsRawByExtensionAlone) {
+  EXPECT_TRUE(QVDNGImage().isRaw && QVCR2Image().isRaw && QVNRWImage().isRaw && QV3FRImage().isRaw);
+  EXPECT_EQ(describe(QVTiffImage()), "");
+  EXPECT_EQ(describe(QVNefImage()) + describe(QVARWImage()) + describe(QVRafImage()) +
+                describe(QVCR3Image()) + describe(QVJPEGImage()),
+            "");
+}
+
+TEST(Nef, TakesTheSizeFromTheSecondSubIFD) {
+  std::string const whole = "width=6032 height=4032 orientation=8 isRaw " + kOriginal;
+  check<QVNefImage>(
+      nef, {{"well made", noEdit, true, whole},
+            {"one SubIFD", [](auto& f) { f.set(pointer(kSubIFDs, {f.sub(kSubIFDs, 1)})); }, true,
+             "orientation=8 isRaw " + kOriginal},
+            {"no SubIFDs", [](auto& f) { f.remove(kSubIFDs); }, true,
+             "orientation=8 isRaw " + kOriginal},
+            {"no Exif", [](auto& f) { f.remove(kExif); }, true,
+             "width=6032 height=4032 orientation=8 isRaw"},
+            {"no orientation", [](auto& f) { f.remove(kOrientation); }, true,
+             "width=6032 height=4032 isRaw " + kOriginal},
+            {"other bits of the type",
+             [](auto& f) { f.sub(kSubIFDs, 1).set(longs(kNewSubfileType, {6})); }, true, whole}});
+}
+
+TEST(Nef, Refuses) {
+  std::string const exif = "orientation=8 isRaw " + kOriginal;
+  check<QVNefImage>(
+      nef, {{"161 wide", [](auto& f) { f.set(longs(kWidth, {161})); }, false, "isRaw"},
+            {"121 high", [](auto& f) { f.set(longs(kLength, {121})); }, false, "isRaw"},
+            {"no width", [](auto& f) { f.remove(kWidth); }, false, "isRaw"},
+            {"no height", [](auto& f) { f.remove(kLength); }, false, "isRaw"},
+            {"width of 2",
+             [](auto& f) {
+               f.set(longs(kWidth, {160, 160}));
+             },
+             false, "isRaw"},
+            {"orientation of 2",
+             [](auto& f) {
+               f.set(shorts(kOrientation, {1, 1}));
+             },
+             false, "isRaw"},
+            {"pointer of 2",
+             [](auto& f) {
+               f.set(longs(kExif, {8, 8}));
+             },
+             false, "orientation=8 isRaw"},
+            {"Exif beyond the end", [](auto& f) { f.set(longs(kExif, {100000})); }, false,
+             "orientation=8 isRaw"},
+            {"date in numbers", [](auto& f) { f.sub(kExif).set(shorts(kDateTimeOriginal, {1})); },
+             false, "orientation=8 isRaw"},
+            {"SubIFD beyond the end",
+             [](auto& f) {
+               f.set(longs(kSubIFDs, {8, 100000}));
+             },
+             false, exif},
+            {"reduced", [](auto& f) { f.sub(kSubIFDs, 1).set(longs(kNewSubfileType, {3})); }, false,
+             exif},
+            {"no type", [](auto& f) { f.sub(kSubIFDs, 1).remove(kNewSubfileType); }, false, exif},
+            {"type of 2",
+             [](auto& f) {
+               f.sub(kSubIFDs, 1).set(longs(kNewSubfileType, {0, 0}));
+             },
+             false, exif},
+            {"no raw width", [](auto& f) { f.sub(kSubIFDs, 1).remove(kWidth); }, false, exif},
+            {"no raw height", [](auto& f) { f.sub(kSubIFDs, 1).remove(kLength); }, false,
+             "width=6032 " + exif}});
+}
+
+TEST(Arw, TakesTheSizeFromTheFirstSubIFD) {
+  std::string const exif = "orientation=8 isRaw " + kOriginal;
+  check<QVARWImage>(
+      arw,
+      {{"well made", noEdit, true, "width=6032 height=4032 " + exif},
+       {"two SubIFDs",
+        [](auto& f) {
+          f.set(pointer(kSubIFDs, {f.sub(kSubIFDs), Directory{{longs(kWidth, {1, 2})}}}));
+        },
+        true, "width=6032 height=4032 " + exif},
+       {"no Exif, so no SubIFD", [](auto& f) { f.remove(kExif); }, true, "orientation=8 isRaw"},
+       {"no SubIFDs", [](auto& f) { f.remove(kSubIFDs); }, true, exif},
+       {"empty SubIFDs", [](auto& f) { f.set(longs(kSubIFDs, {})); }, true, exif},
+       {"no size of its own", [](auto& f) { f.remove(kWidth); }, true,
+        "width=6032 height=4032 " + exif}});
+}
+
+TEST(Arw, Refuses) {
+  std::string const exif = "orientation=8 isRaw " + kOriginal;
+  check<QVARWImage>(
+      arw,
+      {{"orientation of 2",
+        [](auto& f) {
+          f.set(shorts(kOrientation, {1, 1}));
+        },
+        false, "isRaw"},
+       {"pointer of 2",
+        [](auto& f) {
+          f.set(longs(kExif, {8, 8}));
+        },
+        false, "orientation=8 isRaw"},
+       {"date in numbers", [](auto& f) { f.sub(kExif).set(shorts(kDateTimeOriginal, {1})); }, false,
+        "orientation=8 isRaw"},
+       {"SubIFD beyond the end", [](auto& f) { f.set(longs(kSubIFDs, {100000})); }, false, exif},
+       {"reduced", [](auto& f) { f.sub(kSubIFDs).set(longs(kNewSubfileType, {1})); }, false, exif},
+       {"no height", [](auto& f) { f.sub(kSubIFDs).remove(kLength); }, false,
+        "width=6032 " + exif}});
+}
+
+Bytes rafAroundImage(ByteOrder order, Directory const& image) {
+  return rafFile(jpegFile(tiff(order, image)), tiff(order, rafRawSection()));
+}
+
+Bytes rafAroundRawSection(ByteOrder order, Directory const& rawSection) {
+  ByteOrder const other = order == kII ? kMM : kII;
+  return rafFile(jpegFile(tiff(other, jpegExif())), tiff(order, rawSection));
+}
+
+TEST(Raf, ReadsTheImagesDirectories) {
+  std::string const size = "width=6160 height=4032 ";
+  check<QVRafImage>(
+      jpegExif,
+      {{"well made", noEdit, true, size + "orientation=6 isRaw " + kOriginal},
+       {"no Exif", [](auto& f) { f.remove(kExif); }, true, size + "orientation=6 isRaw"},
+       {"a size of its own",
+        [](auto& f) {
+          f.set(longs(kWidth, {1, 2}));
+        },
+        true, size + "orientation=6 isRaw " + kOriginal},
+       {"orientation of 2",
+        [](auto& f) {
+          f.set(shorts(kOrientation, {1, 1}));
+        },
+        false, "isRaw"},
+       {"pointer of 0", [](auto& f) { f.set(longs(kExif, {})); }, false, "orientation=6 isRaw"},
+       {"Exif beyond the end", [](auto& f) { f.set(longs(kExif, {100000})); }, false,
+        "orientation=6 isRaw"},
+       {"date in numbers", [](auto& f) { f.sub(kExif).set(shorts(kDateTimeOriginal, {1})); }, false,
+        "orientation=6 isRaw"}},
+      rafAroundImage);
+}
+
+TEST(Raf, ReadsTheRawSection) {
+  std::string const image = "orientation=6 isRaw " + kOriginal;
+  check<QVRafImage>(rafRawSection,
+                    {{"well made", noEdit, true, "width=6160 height=4032 " + image},
+                     {"width only", [](auto& f) { f.sub(kRafPointer).remove(kRafLength); }, true,
+                      "width=6160 " + image},
+                     {"no pointer", [](auto& f) { f.remove(kRafPointer); }, false, image},
+                     {"pointer of 2",
+                      [](auto& f) {
+                        f.set(longs(kRafPointer, {8, 8}));
+                      },
+                      false, image},
+                     {"vendor directory beyond the end",
+                      [](auto& f) { f.set(longs(kRafPointer, {100000})); }, false, image},
+                     {"width of 2",
+                      [](auto& f) {
+                        f.sub(kRafPointer).set(longs(kRafWidth, {1, 2}));
+                      },
+                      false, image},
+                     {"height of 2",
+                      [](auto& f) {
+                        f.sub(kRafPointer).set(longs(kRafLength, {1, 2}));
+                      },
+                      false, "width=6160 " + image}},
+                    rafAroundRawSection);
+}
+
+TEST(Raf, RefusesAnotherMagicAndAnImageThatDoesNotBeginWithExif) {
+  Bytes const rawSection = tiff(kII, rafRawSection());
+  Bytes lowerCase = rafFile(jpegFile(tiff(kII, jpegExif())), rawSection);
+  lowerCase[7] = 'm';
+  EXPECT_FALSE(readBuffer(lowerCase, "raf"));
+  Bytes jfif = jpegFile(tiff(kII, jpegExif()));
+  jfif.insert(2, segment(0xffe0, "JFIF"));
+  EXPECT_FALSE(readBuffer(rafFile(jfif, rawSection), "raf"));
+  Bytes wrapped = rafFile(jpegFile(tiff(kII, jpegExif())), rawSection);
+  wrapped.replace(84, 4, u32(kMM, 0xfffffffc));  // 12 more is offset 8, where no header is
+  EXPECT_FALSE(readBuffer(wrapped, "raf"));
+}
+
+TEST(Raf, StoresTheSizeOfADirectoryThatHasOne) {
+  QVRafImage raf;
+  auto directory = std::make_shared<QVTiffImageFileDirectory>();
+  Bytes bytes = tiff(kMM, plainTiff());
+  std::shared_ptr<QVStream> stream =
+      std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
+  stream->setOffset(8);
+  ASSERT_TRUE(directory->read(stream, {}));
+  EXPECT_TRUE(raf.storeInfoFromMainIFD(directory));
+  EXPECT_EQ(describe(raf), "width=6000 height=4000 orientation=6");
+}
+
+}  // namespace
+}  // namespace quavel::test

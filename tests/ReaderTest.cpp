@@ -1,0 +1,95 @@
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+
+#include "support/Fixtures.h"
+
+namespace quavel::test {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::size_t openDescriptors() {
+  return static_cast<std::size_t>(
+      std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator()));
+}
+
+TEST(Reader, ReadsEveryFormatFromPathAndBuffer) {
+  for (Fixture const& fixture : fixtures()) {
+    for (ByteOrder const order : kOrders) {
+      SCOPED_TRACE(fixture.extension);
+      Bytes const bytes = fixture.bytes(order);
+      EXPECT_EQ(describe(readBuffer(bytes, fixture.extension)), fixture.expected);
+      TemporaryFile const file(bytes, fixture.extension);
+      EXPECT_EQ(describe(QVReader(file.path).metadata), fixture.expected);
+    }
+  }
+}
+
+TEST(Reader, ReadsTheBundledPhotos) {
+  for (Fixture const& fixture : fixtures()) {
+    auto const path = fs::path(QUAVEL_EXAMPLE_PHOTOS) / (fixture.name + "." + fixture.extension);
+    EXPECT_EQ(describe(QVReader(path.string()).metadata), fixture.expected) << path;
+  }
+}
+
+TEST(Reader, KeepsTheExtensionsCase) {
+  QVReader const reader("");
+  EXPECT_EQ(reader.getPathExtension("a.tar.NEF"), "NEF");
+  EXPECT_EQ(reader.getPathExtension("a."), "");
+  EXPECT_EQ(reader.getPathExtension("a"), "");
+  EXPECT_EQ(reader.getPathExtension("folder.jpg/a"), "jpg/a");
+  EXPECT_EQ(reader.getPathExtension(".cr3"), "cr3");
+}
+
+TEST(Reader, KnowsTwelveExtensionsInLowerCase) {
+  QVReader const reader("");
+  EXPECT_TRUE(dynamic_cast<QVNRWImage*>(reader.createMetadata("nrw").get()));
+  EXPECT_TRUE(dynamic_cast<QVCR3Image*>(reader.createMetadata("cr3").get()));
+  for (char const* const unknown : {"", "JPG", ".jpg", "jpg ", "photo.jpg", "png"}) {
+    EXPECT_FALSE(reader.createMetadata(unknown)) << unknown;
+  }
+}
+
+TEST(Reader, IgnoresTheCaseOfAPathsExtensionOnly) {
+  Bytes const jpeg = jpegFile(tiff(kII, jpegExif()));
+  TemporaryFile const upperCase(jpeg, "JPG");
+  TemporaryFile const unsupported(jpeg, "png");
+  EXPECT_TRUE(QVReader(upperCase.path).metadata);
+  EXPECT_FALSE(QVReader(unsupported.path).metadata);
+  EXPECT_FALSE(readBuffer(jpeg, "JPG"));
+  EXPECT_FALSE(QVReader("/nonexistent/photo.jpg").metadata);
+}
+
+TEST(Reader, LeavesNoDescriptorOpen) {
+  std::size_t const before = openDescriptors();
+  Bytes const bytes = tiff(kII, plainTiff());
+  TemporaryFile const good(bytes, "tif");
+  TemporaryFile const bad(bytes.substr(0, 40), "tif");
+  TemporaryFile const unsupported(bytes, "txt");
+  auto const folder = good.path + ".folder.tif";
+  fs::create_directory(folder);
+  EXPECT_TRUE(QVReader(good.path).metadata);
+  for (std::string const& path : {bad.path, unsupported.path, folder, std::string("missing.tif")}) {
+    EXPECT_FALSE(QVReader(path).metadata);
+  }
+  fs::remove(folder);
+  EXPECT_EQ(openDescriptors(), before);
+}
+
+TEST(Metadata, PrefersTheOriginalDate) {
+  QVTiffImage record;
+  EXPECT_EQ(record.captureDate(), "");
+  record.dateTime = "file";
+  EXPECT_EQ(record.captureDate(), "file");
+  record.dateTimeDigitized = "digitized";
+  EXPECT_EQ(record.captureDate(), "digitized");
+  record.dateTimeOriginal = " ";
+  EXPECT_EQ(record.captureDate(), " ");
+}
+
+}  // namespace
+}  // namespace quavel::test

@@ -1,0 +1,157 @@
+#ifndef QUAVEL_TESTS_BYTEBUILDER_H
+#define QUAVEL_TESTS_BYTEBUILDER_H
+
+#include <algorithm>
+#include <cstdint>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "quavel/QVStream.h"
+
+// Lays files out as the formats do. A file is written as it is nested: a directory holds its
+// fields, a pointer field its sub-directories, a box its children.
+namespace quavel::test {
+
+using Bytes = std::string;
+
+/// The number's low `size` bytes.
+inline Bytes number(ByteOrder order, std::uint64_t value, int size) {
+  Bytes bytes;
+  for (int i = 0; i < size; ++i) {
+    bytes.push_back(static_cast<char>(value >> (8 * i) & 0xffU));
+  }
+  if (order == ByteOrder::BigEndian) {
+    std::reverse(bytes.begin(), bytes.end());
+  }
+  return bytes;
+}
+
+inline Bytes u16(ByteOrder order, std::uint64_t value) { return number(order, value, 2); }
+inline Bytes u32(ByteOrder order, std::uint64_t value) { return number(order, value, 4); }
+
+enum Type : std::uint16_t { kByte = 1, kAscii, kShort, kLong, kRational, kSByte, kUndefined };
+enum MoreTypes : std::uint16_t { kSShort = 8, kSLong, kSRational, kFloat, kDouble, kIfd };
+
+struct Directory;
+
+/// A directory entry. What is written is `count` and then `numbers`, each `numberSize` bytes wide
+/// (a rational is two of them), out of line when they exceed 4 bytes; or one pointer for each of
+/// `subdirectories`; or `rawField` as it stands, where an entry is to lie about its values.
+struct Field {
+  std::uint16_t tag;
+  std::uint16_t type;
+  std::uint32_t count;
+  int numberSize = 1;
+  std::vector<std::int64_t> numbers = {};
+  std::vector<Directory> subdirectories = {};
+  std::int64_t rawField = -1;
+};
+
+struct Directory {
+  std::vector<Field> fields;
+  std::uint32_t next = 0;
+
+  Field* find(std::uint16_t tag) {
+    auto const found = std::find_if(fields.begin(), fields.end(),
+                                    [&](Field const& field) { return field.tag == tag; });
+    return found == fields.end() ? nullptr : &*found;
+  }
+  Directory& sub(std::uint16_t tag, std::size_t index = 0) {
+    return find(tag)->subdirectories.at(index);
+  }
+  void remove(std::uint16_t tag) {
+    fields.erase(std::remove_if(fields.begin(), fields.end(),
+                                [&](Field const& field) { return field.tag == tag; }),
+                 fields.end());
+  }
+  /// Replaces the field of the same tag, or adds the field.
+  void set(Field field) {
+    Field* const old = find(field.tag);
+    if (old == nullptr) {
+      fields.push_back(std::move(field));
+    } else {
+      *old = std::move(field);
+    }
+  }
+};
+
+inline Field values(std::uint16_t tag, std::uint16_t type, int size,
+                    std::vector<std::int64_t> numbers) {
+  auto const count = static_cast<std::uint32_t>(numbers.size());
+  return {tag, type, count, size, std::move(numbers)};
+}
+inline Field shorts(std::uint16_t tag, std::vector<std::int64_t> numbers) {
+  return values(tag, kShort, 2, std::move(numbers));
+}
+inline Field longs(std::uint16_t tag, std::vector<std::int64_t> numbers) {
+  return values(tag, kLong, 4, std::move(numbers));
+}
+inline Field ratio(std::uint16_t tag, std::int64_t numerator, std::int64_t denominator,
+                   std::uint16_t type = kRational) {
+  return {tag, type, 1, 4, {numerator, denominator}};
+}
+/// Characters as they stand, or with the NUL that ends a well-made text.
+inline Field characters(std::uint16_t tag, Bytes const& text, std::uint16_t type = kAscii) {
+  return values(tag, type, 1, std::vector<std::int64_t>(text.begin(), text.end()));
+}
+inline Field ascii(std::uint16_t tag, Bytes const& text) { return characters(tag, text + '\0'); }
+inline Field pointer(std::uint16_t tag, std::vector<Directory> subdirectories) {
+  auto const count = static_cast<std::uint32_t>(subdirectories.size());
+  return {tag, kLong, count, 4, {}, std::move(subdirectories)};
+}
+/// An entry that says what it likes of its values.
+inline Field claim(std::uint16_t tag, std::uint16_t type, std::uint32_t count,
+                   std::uint32_t valueField) {
+  return {tag, type, count, 4, {}, {}, valueField};
+}
+
+/// The directory as it stands `start` bytes behind the TIFF header's first byte, with its values
+/// and sub-directories behind it.
+inline Bytes directoryAt(ByteOrder order, std::size_t start, Directory const& directory) {
+  std::size_t const end = start + 2 + 12 * directory.fields.size() + 4;
+  Bytes entries = u16(order, directory.fields.size());
+  Bytes behind;
+  for (Field const& field : directory.fields) {
+    Bytes data;
+    for (std::int64_t const value : field.numbers) {
+      data += number(order, static_cast<std::uint64_t>(value), field.numberSize);
+    }
+    for (Directory const& subdirectory : field.subdirectories) {
+      data += u32(order, end + behind.size());
+      behind += directoryAt(order, end + behind.size(), subdirectory);
+    }
+    if (field.rawField >= 0) {
+      data = u32(order, static_cast<std::uint64_t>(field.rawField));
+    }
+    entries += u16(order, field.tag) + u16(order, field.type) + u32(order, field.count);
+    if (data.size() <= 4) {
+      entries += data + Bytes(4 - data.size(), '\0');
+    } else {
+      entries += u32(order, end + behind.size());
+      behind += data;
+    }
+  }
+  return entries + u32(order, directory.next) + behind;
+}
+
+/// A whole TIFF structure.
+inline Bytes tiff(ByteOrder order, Directory const& first) {
+  Bytes const mark = order == ByteOrder::LittleEndian ? "II" : "MM";
+  return mark + u16(order, 42) + u32(order, 8) + directoryAt(order, 8, first);
+}
+
+/// A JPEG segment: marker, length, payload.
+inline Bytes segment(std::uint16_t marker, Bytes const& payload) {
+  return u16(ByteOrder::BigEndian, marker) + u16(ByteOrder::BigEndian, payload.size() + 2) +
+         payload;
+}
+
+/// An ISO base media box: size, type, payload.
+inline Bytes box(Bytes const& type, Bytes const& payload) {
+  return u32(ByteOrder::BigEndian, payload.size() + 8) + type + payload;
+}
+
+}  // namespace quavel::test
+
+#endif  // QUAVEL_TESTS_BYTEBUILDER_H

@@ -1,0 +1,241 @@
+#include "support/Fixtures.h"
+
+#include <unistd.h>
+
+#include <atomic>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+
+namespace quavel::test {
+
+Directory plainTiff() {
+  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
+                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
+                           characters(kMakerNote, "not a directory", kUndefined)}};
+  return {{longs(kWidth, {6000}), longs(kLength, {4000}), ascii(kModel, "Camera"),
+           shorts(kOrientation, {6}), ascii(kDateTime, "2022:06:02 11:00:00"),
+           pointer(kExif, {exif})}};
+}
+
+Directory reducedTiff() {
+  Directory const preview = {
+      {longs(kNewSubfileType, {1}), longs(kWidth, {1024}), longs(kLength, {683})}};
+  Directory const full = {{longs(kNewSubfileType, {0}), longs(kWidth, {6000}),
+                           longs(kLength, {4000}), shorts(kOrientation, {3})}};
+  Directory file = plainTiff();
+  file.set(longs(kNewSubfileType, {1}));
+  file.set(longs(kWidth, {256}));
+  file.set(longs(kLength, {171}));
+  file.set(pointer(kSubIFDs, {preview, full, preview}));
+  return file;
+}
+
+Directory nef() {
+  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
+                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
+                           ascii(kOffsetTimeOriginal, "+02:00")}};
+  Directory const preview = {{longs(kNewSubfileType, {1}), longs(kWidth, {570})}};
+  Directory const raw = {
+      {longs(kNewSubfileType, {0}), longs(kWidth, {6032}), longs(kLength, {4032})}};
+  return {{longs(kNewSubfileType, {1}), longs(kWidth, {160}), longs(kLength, {120}),
+           shorts(kOrientation, {8}), ascii(kDateTime, "2022:06:02 11:00:00"),
+           pointer(kSubIFDs, {preview, raw, preview}), pointer(kExif, {exif})}};
+}
+
+Directory arw() {
+  Directory file = nef();
+  file.set(longs(kWidth, {1616}));
+  file.set(pointer(kSubIFDs, {file.sub(kSubIFDs, 1)}));
+  return file;
+}
+
+Directory jpegExif() {
+  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
+                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
+                           shorts(kPixelX, {3000}), shorts(kPixelY, {4000})}};
+  return {
+      {shorts(kOrientation, {6}), ascii(kDateTime, "2022:06:02 11:00:00"), pointer(kExif, {exif})}};
+}
+
+Directory rafRawSection() {
+  Directory const vendor = {{longs(kRafWidth, {6160}), longs(kRafLength, {4032})}};
+  return {{pointer(kRafPointer, {vendor})}};
+}
+
+Directory cmt1() {
+  return {{shorts(kWidth, {6000}), shorts(kLength, {4000}), ascii(kModel, "Camera R"),
+           shorts(kOrientation, {6}), ascii(kDateTime, "2021:05:01 10:00:00")}};
+}
+
+Directory cmt2() {
+  return {{ratio(kExposureTime, 1, 200), ratio(kFNumber, 56, 10), shorts(kIso, {400}),
+           ratio(kShutterSpeed, 7, 1, kSRational), ratio(kAperture, 4, 1),
+           ratio(kExposureBias, -1, 2, kSRational), shorts(kMeteringMode, {5}),
+           ratio(kFocalLength, 35, 1), shorts(kWhiteBalance, {0}), shorts(kFocal35, {56}),
+           ascii(kLensModel, "Lens 35mm F1.8")}};
+}
+
+Bytes sof0(unsigned width, unsigned height) {
+  return segment(0xffc0, '\x08' + u16(kMM, height) + u16(kMM, width) +
+                             Bytes("\x03\x01\x22\x00\x02\x11\x01\x03\x11\x01", 10));
+}
+
+Bytes exifSegment(Bytes const& tiffStructure) {
+  return segment(0xffe1, Bytes("Exif\0\0", 6) + tiffStructure);
+}
+
+Bytes jpegFile(Bytes const& tiffStructure) {
+  return "\xff\xd8" + exifSegment(tiffStructure) + segment(0xffdb, Bytes(65, '\x10')) + sof0() +
+         segment(0xffda, Bytes(10, '\x01')) + "scan\xff\xd9";
+}
+
+Bytes rafFile(Bytes const& image, Bytes const& rawSection) {
+  constexpr std::size_t kHeaderSize = 148;
+  Bytes header = "FUJIFILMCCD-RAW 0201";
+  header.resize(84);
+  header += u32(kMM, kHeaderSize);
+  header.resize(100);
+  header += u32(kMM, kHeaderSize + image.size());
+  header.resize(kHeaderSize);
+  return header + image + rawSection;
+}
+
+Bytes uuidBox(Bytes const& children, Bytes const& identifier) {
+  Bytes const metadata = "\x85\xc0\xb6\x87\x82\x0f\x11\xe0\x81\x11\xf4\xce\x46\x2b\x6a\x48";
+  return box("uuid", (identifier.empty() ? metadata : identifier) + children);
+}
+
+Bytes cr3File(Bytes const& moovChildren) {
+  return box("ftyp", "crx isom") + box("moov", moovChildren) + box("mdat", Bytes(64, '\x7f'));
+}
+
+namespace {
+
+Bytes plainTiffBytes(ByteOrder order) { return tiff(order, plainTiff()); }
+Bytes reducedTiffBytes(ByteOrder order) { return tiff(order, reducedTiff()); }
+Bytes nefBytes(ByteOrder order) { return tiff(order, nef()); }
+Bytes arwBytes(ByteOrder order) { return tiff(order, arw()); }
+Bytes jpegBytes(ByteOrder order) { return jpegFile(tiff(order, jpegExif())); }
+Bytes rafBytes(ByteOrder order) {
+  return rafFile(jpegFile(tiff(order, jpegExif())), tiff(order, rafRawSection()));
+}
+Bytes cr3Bytes(ByteOrder order) {
+  return cr3File(box("mvhd", Bytes(100, '\0')) +
+                 uuidBox(box("free", "filler") + box("CMT1", tiff(order, cmt1())) +
+                         box("CMT2", tiff(order, cmt2())) + box("CMT3", tiff(order, cmt1()))) +
+                 box("trak", Bytes(40, '\0')));
+}
+
+std::string const kPlainTiff =
+    "width=6000 height=4000 orientation=6 dateTimeOriginal=2021:05:01 10:00:00 "
+    "dateTimeDigitized=2021:05:01 10:00:01 dateTime=2022:06:02 11:00:00";
+std::string const kRawTiff =
+    "width=6000 height=4000 orientation=6 isRaw dateTimeOriginal=2021:05:01 10:00:00 "
+    "dateTimeDigitized=2021:05:01 10:00:01 dateTime=2022:06:02 11:00:00";
+std::string const kNef =
+    "width=6032 height=4032 orientation=8 isRaw dateTimeOriginal=2021:05:01 10:00:00";
+std::string const kJpeg =
+    "width=3000 height=4000 orientation=6 dateTimeOriginal=2021:05:01 10:00:00";
+std::string const kRaf =
+    "width=6160 height=4032 orientation=6 isRaw dateTimeOriginal=2021:05:01 10:00:00";
+std::string const kCr3 =
+    "width=6000 height=4000 orientation=6 isRaw dateTime=2021:05:01 10:00:00 hasShootingInfo "
+    "model=Camera R lensModel=Lens 35mm F1.8 iso=400 apexFNumber=4 apexExposureTime=0.0078125 "
+    "apertureValue=4 shutterSpeedValue=7 focalLength=35 whiteBalance=0 meteringMode=5 "
+    "exposureBiasValue=-0.5 focalLengthIn35mmFilm=56 exposureTime=0.00499999989 "
+    "fNumber=5.5999999";
+
+template <class T>
+void show(std::ostream& out, char const* name, T const& value, bool isAbsent) {
+  if (!isAbsent) {
+    out << name << '=' << value << ' ';
+  }
+}
+void show(std::ostream& out, char const* name, std::int32_t value) {
+  show(out, name, value, value == -1);
+}
+void show(std::ostream& out, char const* name, float value) {
+  show(out, name, value, std::isnan(value));
+}
+void show(std::ostream& out, char const* name, std::string const& value) {
+  show(out, name, value, value.empty());
+}
+void show(std::ostream& out, char const* name, bool value) {
+  out << (value ? name + std::string(" ") : "");
+}
+
+}  // namespace
+
+std::vector<Fixture> const& fixtures() {
+  static std::vector<Fixture> const all = {
+      {"plain", "tif", plainTiffBytes, kPlainTiff},
+      {"scan", "tiff", reducedTiffBytes, kPlainTiff},
+      {"negative", "dng", reducedTiffBytes, kRawTiff},
+      {"canyon", "cr2", plainTiffBytes, kRawTiff},
+      {"pocket", "nrw", reducedTiffBytes, kRawTiff},
+      {"studio", "3fr", reducedTiffBytes, kRawTiff},
+      {"night", "nef", nefBytes, kNef},
+      {"alley", "arw", arwBytes, kNef},
+      {"field", "raf", rafBytes, kRaf},
+      {"portrait", "jpg", jpegBytes, kJpeg},
+      {"postcard", "jpeg", jpegBytes, kJpeg},
+      {"river", "cr3", cr3Bytes, kCr3},
+  };
+  return all;
+}
+
+std::string describe(QVMetadata const& record) {
+  std::ostringstream out;
+  out.precision(9);
+  show(out, "width", record.width);
+  show(out, "height", record.height);
+  show(out, "orientation", record.orientation);
+  show(out, "isRaw", record.isRaw);
+  show(out, "dateTimeOriginal", record.dateTimeOriginal);
+  show(out, "dateTimeDigitized", record.dateTimeDigitized);
+  show(out, "dateTime", record.dateTime);
+  show(out, "hasShootingInfo", record.hasShootingInfo);
+  show(out, "model", record.model);
+  show(out, "lensModel", record.lensModel);
+  show(out, "iso", record.iso);
+  show(out, "apexFNumber", record.apexFNumber);
+  show(out, "apexExposureTime", record.apexExposureTime);
+  show(out, "apertureValue", record.apertureValue);
+  show(out, "shutterSpeedValue", record.shutterSpeedValue);
+  show(out, "focalLength", record.focalLength);
+  show(out, "whiteBalance", record.whiteBalance);
+  show(out, "meteringMode", record.meteringMode);
+  show(out, "exposureBiasValue", record.exposureBiasValue);
+  show(out, "focalLengthIn35mmFilm", record.focalLengthIn35mmFilm);
+  show(out, "exposureTime", record.exposureTime);
+  show(out, "fNumber", record.fNumber);
+  std::string text = out.str();
+  if (!text.empty()) {
+    text.pop_back();
+  }
+  return text;
+}
+
+std::string describe(std::shared_ptr<QVMetadata> const& record) {
+  return record ? describe(*record) : "none";
+}
+
+std::shared_ptr<QVMetadata> readBuffer(Bytes bytes, std::string const& extension) {
+  auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+  return QVReader(data, bytes.size(), extension).metadata;
+}
+
+TemporaryFile::TemporaryFile(Bytes const& bytes, std::string const& extension) {
+  static std::atomic<int> count{0};
+  auto const name = "quavel-" + std::to_string(::getpid()) + "-" + std::to_string(++count);
+  path = (std::filesystem::temp_directory_path() / (name + "." + extension)).string();
+  std::ofstream(path, std::ios::binary) << bytes;
+}
+
+TemporaryFile::~TemporaryFile() {
+  std::error_code ignored;
+  std::filesystem::remove(path, ignored);
+}
+
+}  // namespace quavel::test
