@@ -53,6 +53,9 @@ TEST(Cr3Box, RefusesASizeThatDoesNotCoverTheHeader) {
     EXPECT_EQ(read(cr3File(small + uuidBox(cmt1Box()))), "none");
     EXPECT_EQ(read(cr3File(uuidBox(small + cmt1Box()))), "none");
   }
+  Source cut("\1\1\1\1moo");
+  EXPECT_FALSE(QVCR3Box().read(cut.stream) || QVCR3MoovBox().read(cut.stream) ||
+               QVCR3UUIDBox().read(cut.stream) || QVCR3CMT1Box().read(cut.stream));
   Source smallest(box("free", ""));
   EXPECT_TRUE(QVCR3Box().read(smallest.stream));
 }

@@ -306,9 +306,17 @@ TEST(Raf, RefusesAnotherMagicAndAnImageThatDoesNotBeginWithExif) {
   Bytes jfif = jpegFile(tiff(kII, jpegExif()));
   jfif.insert(2, segment(0xffe0, "JFIF"));
   EXPECT_FALSE(readBuffer(rafFile(jfif, rawSection), "raf"));
-  Bytes wrapped = rafFile(jpegFile(tiff(kII, jpegExif())), rawSection);
-  wrapped.replace(84, 4, u32(kMM, 0xfffffffc));  // 12 more is offset 8, where no header is
-  EXPECT_FALSE(readBuffer(wrapped, "raf"));
+}
+
+TEST(Raf, AddsToTheImagesOffsetIn32Bits) {
+  Bytes file = "FUJIFILM" + tiff(kMM, {{shorts(kOrientation, {3})}});
+  file.resize(84);
+  file += u32(kMM, 0xfffffffc);  // the TIFF header 12 bytes on is at offset 8
+  EXPECT_FALSE(readBuffer(file, "raf"));
+  file.resize(100);
+  EXPECT_FALSE(readBuffer(file, "raf"));
+  file += u32(kMM, 104) + tiff(kII, rafRawSection());
+  EXPECT_EQ(describe(readBuffer(file, "raf")), "width=6160 height=4032 orientation=3 isRaw");
 }
 
 TEST(Raf, StoresTheSizeOfADirectoryThatHasOne) {
