@@ -1,0 +1,23 @@
+# Run by cpack on the trees it is about to pack: gives each Debian package the documents that the
+# Debian policy asks of it, in the form it asks for.
+if(NOT CPACK_GENERATOR STREQUAL "DEB")
+  return()
+endif()
+
+string(TIMESTAMP date "%a, %d %b %Y %H:%M:%S +0000" UTC)
+foreach(component IN LISTS CPACK_COMPONENTS_ALL)
+  set(tree ${CPACK_TEMPORARY_DIRECTORY}/${component}/usr)
+  string(TOUPPER ${component} upper)
+  set(docs ${tree}/share/doc/${CPACK_DEBIAN_${upper}_PACKAGE_NAME})
+
+  configure_file(${CPACK_RESOURCE_FILE_LICENSE} ${docs}/copyright COPYONLY)
+  file(WRITE ${docs}/changelog.Debian
+"quavel (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
+
+  * The changes are listed in the project's CHANGELOG.md.
+
+ -- ${CPACK_DEBIAN_PACKAGE_MAINTAINER}  ${date}
+")
+  file(GLOB pages ${tree}/share/man/*/*)
+  execute_process(COMMAND gzip -9nf ${docs}/changelog.Debian ${pages} COMMAND_ERROR_IS_FATAL ANY)
+endforeach()
