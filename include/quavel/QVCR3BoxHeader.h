@@ -16,8 +16,8 @@ class QUAVEL_EXPORT QVCR3BoxHeader {
   /// Reads the 8 bytes at the stream's position. False: the data ended inside.
   bool read(std::shared_ptr<QVStream>& stream);
 
-  unsigned int size() const;
-  unsigned int type() const;
+  unsigned int size() const;  ///< `boxSize`
+  unsigned int type() const;  ///< `boxType`
 
   std::uint32_t boxSize = 0;  ///< Bytes, this header included.
   std::uint32_t boxType = 0;  ///< The four characters as one big-endian number.

@@ -27,8 +27,8 @@ class QUAVEL_EXPORT QVCR3CMT1Box : public QVCR3Box {
   std::int32_t orientation = 1;   ///< Upright when the file does not say.
   std::string dateTimeOriginal;   ///< Always empty: the main directory has none.
   std::string dateTimeDigitized;  ///< Always empty: the main directory has none.
-  std::string dateTime;
-  std::string model;
+  std::string dateTime;           ///< When the file was changed last.
+  std::string model;              ///< Of the camera.
 };
 
 }  // namespace quavel

@@ -24,6 +24,10 @@ class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
   /// Fills the fields below from the lens to the f-number, up to the first malformed one.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
+  /// @name The record's fields of the same names
+  /// @{
+
+  /// Unit and absence as in QVMetadata.
   std::int32_t iso = -1;
   std::string lensModel;
   float apexFNumber = std::nanf("");
@@ -37,6 +41,7 @@ class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
   std::int32_t focalLengthIn35mmFilm = -1;
   float exposureTime = std::nanf("");
   float fNumber = std::nanf("");
+  /// @}
 
  private:
   bool storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);

@@ -22,10 +22,14 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
   bool readExifSegment(std::shared_ptr<QVStream>& stream);
   /// Orientation of the first directory. False: it is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+  /// @name Size by the Exif directory
+  /// @{
+
   /// The side in pixels by its TIFF tag, else by its Exif tag; unchanged when both are absent.
   /// False: the tag that counts is malformed.
   bool readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side);
   bool readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side);
+  /// @}
 
   /// Markers without a length field: bytes from the marker's end to where the walk goes on.
   static std::map<std::uint16_t, std::uint16_t> const markerSkipLengths;

@@ -10,6 +10,7 @@ namespace quavel {
 /// reads deliver nothing.
 class QUAVEL_EXPORT QVMStream : public QVStream {
  public:
+  /// Reads `count` bytes at `bytes`, which it borrows.
   QVMStream(unsigned char* bytes, unsigned long const& count);
 
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;

@@ -37,12 +37,12 @@ class QUAVEL_EXPORT QVMetadata {
   std::int32_t orientation = -1;  ///< TIFF Orientation, unchecked; CR3 gives 1 when it is absent.
   bool isRaw = false;             ///< The format is a camera's raw format.
   std::string dateTimeOriginal;   ///< "YYYY:MM:DD HH:MM:SS" in well-made files, like all dates.
-  std::string dateTimeDigitized;
-  std::string dateTime;
-  bool hasShootingInfo = false;  ///< A shooting record was read into the fields below.
-  std::string model;             ///< Of the camera.
-  std::string lensModel;
-  std::int32_t iso = -1;                    ///< ISOSpeedRatings
+  std::string dateTimeDigitized;  ///< When the image was stored.
+  std::string dateTime;           ///< When the file was changed last.
+  bool hasShootingInfo = false;   ///< A shooting record was read into the fields below.
+  std::string model;              ///< Of the camera.
+  std::string lensModel;          ///< Exif LensModel.
+  std::int32_t iso = -1;          ///< ISOSpeedRatings
   float apexFNumber = std::nanf("");        ///< F-number that ApertureValue amounts to.
   float apexExposureTime = std::nanf("");   ///< Seconds that ShutterSpeedValue amounts to.
   float apertureValue = std::nanf("");      ///< APEX units.
@@ -53,7 +53,7 @@ class QUAVEL_EXPORT QVMetadata {
   float exposureBiasValue = std::nanf("");  ///< APEX units.
   std::int32_t focalLengthIn35mmFilm = -1;  ///< Millimetres.
   float exposureTime = std::nanf("");       ///< Seconds.
-  float fNumber = std::nanf("");
+  float fNumber = std::nanf("");            ///< Exif FNumber.
 };
 
 }  // namespace quavel

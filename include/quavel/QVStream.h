@@ -30,12 +30,13 @@ class QUAVEL_EXPORT QVStream {
   /// Moves to `baseOffset` plus `offset`. Reports nothing: the next read tells.
   virtual void setOffset(long const& offset) = 0;
 
-  ByteOrder hostBytesOrder() const;
+  ByteOrder hostBytesOrder() const;  ///< Worked out afresh.
 
   /// @name Typed reads
+  /// @{
+
   /// One `readBuffer` each, at the current position; numbers come in `byteOrder` and arrive in the
   /// host's. True: all bytes were delivered. False: the destination is to be taken as unset.
-  /// @{
   bool readChar(char* destination);
   bool readByte(unsigned char* destination);
   bool readSByte(signed char* destination);
@@ -48,8 +49,9 @@ class QUAVEL_EXPORT QVStream {
   /// @}
 
   /// @name Byte reversal in place
-  /// Always, or only on a host of the other byte order.
   /// @{
+
+  /// Always, or only on a host of the other byte order.
   void swapS(unsigned short* value) const;
   void swapL(unsigned int* value) const;
   void swapLL(unsigned long long* value) const;

@@ -39,14 +39,14 @@ inline constexpr std::array<EntryValueType, 14> fieldTypeToValueType = {
 
 /// An unsigned fraction as stored; the denominator may be 0.
 struct Rational {
-  std::uint32_t numerator;
-  std::uint32_t denominator;
+  std::uint32_t numerator;    ///< As stored.
+  std::uint32_t denominator;  ///< As stored.
 };
 
 /// A signed fraction as stored; the denominator may be 0.
 struct SRational {
-  std::int32_t numerator;
-  std::int32_t denominator;
+  std::int32_t numerator;    ///< As stored.
+  std::int32_t denominator;  ///< As stored.
 };
 
 /// One value of a directory entry. Every accessor answers for every type; a type that it cannot
@@ -63,10 +63,11 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   static unsigned int sizeOfValueOfType(EntryValueType const& type);
 
   /// @name As an integer
+  /// @{
+
   /// The stored integer widened to 32 bits by its own sign, then cut to the result's width.
   /// Fractions and floats are truncated toward zero first; a fraction over 0 and a NaN give 0.
   /// Floats saturate at the limits of int32, those of uint32 for `longValue`.
-  /// @{
   char charValue() const;
   std::uint8_t byteValue() const;
   std::int8_t sbyteValue() const;
@@ -77,20 +78,22 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @}
 
   /// @name As a floating-point number
-  /// Fractions are divided in the result's precision; one over 0 gives an infinity or NaN.
   /// @{
+
+  /// Fractions are divided in the result's precision; one over 0 gives an infinity or NaN.
   float floatValue() const;
   double doubleValue() const;
   /// @}
 
   /// @name As stored
-  /// The pair of a RATIONAL, respectively SRATIONAL; any other type gives 0/0.
   /// @{
+
+  /// The pair of a RATIONAL, respectively SRATIONAL; any other type gives 0/0.
   Rational rationalValue() const;
   SRational sRationalValue() const;
   /// @}
 
-  EntryValueType type = EntryValueType::UNDEFINED;
+  EntryValueType type = EntryValueType::UNDEFINED;  ///< Of the value held or to be read.
   std::uint8_t value[8] =
       {};  ///< In host byte order, left-justified; a fraction's numerator first.
 };

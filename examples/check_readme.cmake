@@ -1,0 +1,6 @@
+file(READ ${readme} readme_text)
+file(READ ${example} program)
+string(FIND "${readme_text}" "```cpp\n${program}```\n" position)
+if(position EQUAL -1)
+  message(FATAL_ERROR "README.md does not show ${example} as it is")
+endif()
