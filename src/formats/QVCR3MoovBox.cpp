@@ -24,9 +24,9 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+  QVCR3Box child;
   while (stream->getOffset() < end) {
     long const childStart = stream->getOffset();
-    QVCR3Box child;
     if (!child.read(stream)) {
       return false;
     }
