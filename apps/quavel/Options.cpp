@@ -85,22 +85,26 @@ void addForms(CLI::App& command, FormKind& form) {
                          Row{"--json", FormKind::Json, "One JSON array, exact values"},
                          Row{"--jsonl", FormKind::Jsonl, "One JSON object a line, as they come"},
                          Row{"--csv", FormKind::Csv, "CSV (RFC 4180) with a header row"}}) {
-    group->add_flag_callback(
+    auto* const flag = command.add_flag_callback(
         row.name, [&form, kind = row.kind] { form = kind; }, row.text);
+    flag->group("Forms (otherwise a table, or a card when there is one photo)");
+    for (auto* const other : forms) {
+      flag->excludes(other);
+    }
+    forms.push_back(flag);
   }
-  group->require_option(0, 1);
 }
 
 void addChoices(CLI::App& command, Options& options, Texts& texts) {
   command.add_option("--fields", texts.fields, "Show these fields, in this order")
       ->delimiter(',')
-      ->expected(1)
+      ->expected(1, CLI::detail::expected_max_vector_size)
+      ->allow_extra_args(false)
       ->type_name("A,B,..");
   command.add_option("--sort", texts.sort, "Sort by a field; all records are kept until the end")
       ->type_name("FIELD");
   command.add_option("--absent", texts.absent, "Absent values: skip or show (CSV always shows)")
-      ->type_name("skip|show")
-      ->check(CLI::IsMember({"skip", "show"}));
+      ->type_name("skip|show");
   command.add_option("--jobs", options.jobs, "Files read at a time [the processors]")
       ->type_name("N")
       ->check(CLI::Range(1U, kMostJobs));
@@ -113,6 +117,9 @@ void check(Options& options, Texts const& texts) {
   }
   if (!texts.sort.empty()) {
     options.sort = wantedField("--sort", texts.sort);
+  }
+  if (!texts.absent.empty() && texts.absent != "skip" && texts.absent != "show") {
+    throw CLI::ValidationError("--absent: give skip or show");
   }
   if (!texts.absent.empty()) {
     options.showAbsent = texts.absent == "show";
