@@ -51,7 +51,12 @@ std::string unsupported() {
   return "has no photo's extension; give one of: " + std::string(kExtensions);
 }
 
-/// Why a regular file with a photo's extension, once read, gave no record.
+std::string incomplete(std::string const& path) {
+  return "is no whole ." + extensionOf(path) +
+         " file: empty, damaged, cut short or of another kind; compare it with its source";
+}
+
+/// Why a regular file with a photo's extension, read with a failing system call, gave no record.
 std::string whyNoRecord(std::string const& path) {
   int const fd = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
   if (fd == -1) {
@@ -64,11 +69,7 @@ std::string whyNoRecord(std::string const& path) {
   if (count == -1) {
     return "cannot be read: " + systemText(error) + advice(error);
   }
-  if (count == 0) {
-    return "is empty; copy it anew from its source";
-  }
-  return "is no whole ." + extensionOf(path) +
-         " file: damaged, cut short or of another kind; compare it with its source";
+  return incomplete(path);
 }
 
 /// Why the path cannot be read as a photo, or nothing.
@@ -142,9 +143,10 @@ Outcome readPhoto(Input const& input) {
     return outcome;
   }
   try {
+    errno = 0;
     outcome.record = quavel::QVReader(input.path).metadata;
     if (!outcome.record) {
-      outcome.error = whyNoRecord(input.path);
+      outcome.error = errno == 0 ? incomplete(input.path) : whyNoRecord(input.path);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
