@@ -53,7 +53,7 @@ std::string unsupported() {
 
 std::string incomplete(std::string const& path) {
   return "is no whole ." + extensionOf(path) +
-         " file: empty, damaged, cut short or of another kind; compare it with its source";
+         " file (empty, cut short, damaged or of another kind); check its source";
 }
 
 /// Why a regular file with a photo's extension, read with a failing system call, gave no record.
@@ -165,10 +165,7 @@ Outcome readStandardInput(std::string const& extension) {
     auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
     outcome.record = quavel::QVReader(buffer, bytes.size(), extension).metadata;
     if (!outcome.record) {
-      outcome.error = bytes.empty() ? "is empty; send an image's bytes"
-                                    : "is no whole ." + extension +
-                                          " file: damaged, cut short or of another kind; check "
-                                          "what is sent";
+      outcome.error = incomplete("." + extension);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
