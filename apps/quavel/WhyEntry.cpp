@@ -19,6 +19,7 @@ constexpr long kEntrySize = 12;
 constexpr long kTagSize = 2;
 constexpr std::int64_t kValueFieldSize = 4;
 constexpr unsigned short kUndefinedCode = 7;
+constexpr unsigned short kLastCode = 13;
 constexpr std::uint32_t kMostValues = 65536;  // the library's limit
 
 /// An entry's fields as stored; what lies beyond the end of the data is 0.
@@ -69,21 +70,20 @@ std::string whyValuesUnread(Walk const& walk, RawEntry const& entry) {
   std::string const pronoun =
       entry.count == 1 ? "its " : "its " + std::to_string(entry.count) + ' ';
   return pronoun + fieldTypeText(entry.code) + (entry.count == 1 ? " value" : " values") +
-         " would begin at " + offsetText(begin) + " and end at " + offsetText(begin + size) + ", " +
-         walk.fileEnd();
+         " would begin at " + offsetText(begin) + " and end at " + offsetText(begin + size) +
+         ", but " + walk.fileEnd();
 }
 
 std::string whyEntryUnread(Walk& walk, WalkedDirectory const& directory, RawEntry& entry) {
   bool const isWhole = readFields(walk, entry.position, entry);
   std::string const place = placeOf(directory, entry);
-  if (entry.code == 0 || entry.code > 13) {
-    return place + (isWhole ? ": field " + fieldTypeText(entry.code) +
-                                  " is not one of TIFF's 12, nor IFD (13)"
-                            : std::string(": ") + walk.cut("the entry"));
+  if (isWhole && (entry.code == 0 || entry.code > kLastCode)) {
+    return place + ": field " + fieldTypeText(entry.code) +
+           " is neither one of TIFF's 12 nor 13 (IFD)";
   }
   bool const isInline = entry.code == kUndefinedCode;
   if (!isWhole || isInline) {
-    return place + ": " + walk.cut("the entry");
+    return walk.cut(place);
   }
   return place + ": " + whyValuesUnread(walk, entry);
 }
@@ -129,7 +129,7 @@ std::string whyUnread(Walk& walk, WalkedDirectory const& directory, Tags const& 
   std::uint32_t next = 0;
   if (!walk.stream->readLong(&next)) {
     return walk.cut("the offset of the next directory, behind the " + std::to_string(count) +
-                    " entries of " + directory.text() + ',');
+                    " entries of " + directory.text());
   }
   return directory.text() + " cannot be read";
 }

@@ -71,14 +71,11 @@ std::vector<std::uint8_t> Walk::peek(std::int64_t at, std::size_t count) const {
 std::string Walk::cut(std::string const& what) const {
   ShortRead const& missing = trace->shortRead;
   auto const wanted = static_cast<std::int64_t>(missing.wanted);
-  std::string const place = std::to_string(wanted) + (wanted == 1 ? " byte" : " bytes") +
-                            " wanted at " + offsetText(missing.position);
-  if (missing.position + wanted <= fileSize) {
-    return what + " cannot be read: " + place + " were not delivered";
-  }
-  bool const isBeyond = missing.position >= fileSize;
-  return what + (isBeyond ? " lies beyond the end of the file: " : " is cut off: ") + place + ", " +
-         fileEnd();
+  std::string const place = what + ": " + std::to_string(wanted) +
+                            (wanted == 1 ? " byte" : " bytes") + " wanted at " +
+                            offsetText(missing.position);
+  bool const isInFile = missing.position + wanted <= fileSize;
+  return place + (isInFile ? ", but reading there fails" : ", but " + fileEnd());
 }
 
 std::string Walk::fileEnd() const { return "the file ends at " + offsetText(fileSize); }
