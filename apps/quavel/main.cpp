@@ -1,28 +1,65 @@
-#include <quavel/quavel.h>
+#include <fcntl.h>
+#include <signal.h>
+#include <unistd.h>
 
-#include <CLI/CLI.hpp>
-#include <iostream>
-#include <string>
-#include <vector>
+#include <exception>
+#include <new>
+#include <system_error>
 
-#include "Escape.h"
+#include "Console.h"
+#include "Interrupt.h"
+#include "Options.h"
+#include "Output.h"
+#include "Run.h"
+
+namespace {
+
+/// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
+/// under their numbers.
+void holdStandardStreams() {
+  int fd = 0;
+  do {
+    fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
+  } while (0 <= fd && fd <= STDERR_FILENO);
+  if (fd > STDERR_FILENO) {
+    ::close(fd);
+  }
+}
+
+int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
+  if (!parsed.status) {
+    return app::run(parsed.options, output, console);
+  }
+  output.add(parsed.output);
+  output.flush();
+  if (!parsed.error.empty()) {
+    console.say(parsed.error);
+  }
+  return *parsed.status;
+}
+
+}  // namespace
 
 int main(int argc, char** argv) {
-  CLI::App command("Shooting metadata from camera files", "quavel");
-  std::vector<std::string> paths;
-  command.add_option("PATH", paths, "Photos")->required();
-  CLI11_PARSE(command, argc, argv);
-  int status = 0;
-  for (auto const& path : paths) {
-    quavel::QVReader const reader(path);
-    if (!reader.metadata) {
-      std::cerr << "quavel: " << app::escaped(path) << ": no record\n";
-      status = 1;
-      continue;
-    }
-    std::cout << app::escaped(path) << "\n  size " << reader.metadata->width << " x "
-              << reader.metadata->height << "\n  date "
-              << app::escaped(reader.metadata->captureDate()) << '\n';
+  holdStandardStreams();
+  ::signal(SIGPIPE, SIG_IGN);  // a write then tells
+  app::Console console;
+  app::Output output(console);
+  app::Interrupt const interrupt([&] {
+    console.hideProgress();
+    output.interrupt();
+  });
+  try {
+    return runOptions(app::parseOptions(argc, argv), output, console);
+  } catch (app::OutputClosed const&) {
+    return app::kSuccess;  // whoever read the output has seen enough
+  } catch (std::system_error const& error) {
+    console.say("the output cannot be written: " + error.code().message() +
+                "; it ends early. Check the disk or where the output goes");
+  } catch (std::bad_alloc const&) {
+    console.say("not enough memory; leave out --sort, or name fewer files at a time");
+  } catch (std::exception const& error) {
+    console.say(std::string("unexpected: ") + error.what());
   }
-  return status;
+  return app::kSomeFailed;
 }
