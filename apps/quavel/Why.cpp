@@ -1,13 +1,11 @@
 #include "Why.h"
 
-#include <quavel/QVMetadata.h>
-#include <quavel/QVReader.h>
-
-#include <cerrno>
 #include <filesystem>
+#include <string_view>
 #include <system_error>
 
 #include "Escape.h"
+#include "Photo.h"
 #include "WhyContent.h"
 #include "WhyFields.h"
 #include "WhyFormats.h"
@@ -17,14 +15,10 @@ namespace app {
 
 namespace why {
 
-namespace fs = std::filesystem;
-
-using quavel::QVReader;
-
 namespace {
 
 struct Format {
-  char const* extension;
+  std::string_view extension;
   char const* kind;
   Reader reader;
   void (*walk)(Walk&);
@@ -39,22 +33,7 @@ constexpr Format kFormats[] = {
     {"3fr", "3FR", kTiffReader, walkTiff},   {"cr3", "CR3", kCr3Reader, walkCr3},
 };
 
-/// The extension as the library takes it from a path: any "." counts, and case does not.
-std::string extensionOf(std::string const& path) {
-  auto const dot = path.rfind('.');
-  std::string extension = dot == std::string::npos ? "" : path.substr(dot + 1);
-  if (extension.find('/') != std::string::npos) {
-    return "";  // the "." was a folder's
-  }
-  for (char& letter : extension) {
-    if (letter >= 'A' && letter <= 'Z') {
-      letter = static_cast<char>(letter - 'A' + 'a');
-    }
-  }
-  return extension;
-}
-
-Format const* formatOf(std::string const& extension) {
+Format const* formatOf(std::string_view extension) {
   for (auto const& format : kFormats) {
     if (extension == format.extension) {
       return &format;
@@ -63,46 +42,15 @@ Format const* formatOf(std::string const& extension) {
   return nullptr;
 }
 
-std::string supportedExtensions() {
-  std::string list;
-  for (auto const& format : kFormats) {
-    list += list.empty() ? "" : ", ";
-    list += format.extension;
-  }
-  return list;
-}
-
-std::string cannotOpen(std::error_code const& error) {
-  return "the file cannot be opened: " + error.message();
-}
-
-/// Why the path is nothing to be read; empty for a file with content. Nothing is opened: opening
-/// a pipe would wait for its other end.
-std::string whyNoFile(std::string const& path) {
+/// The size of a regular file; 0 for anything else. Nothing is opened: opening a FIFO would wait
+/// for its other end.
+std::int64_t sizeOfFile(std::string const& path) {
   std::error_code error;
-  auto const status = fs::status(path, error);
-  if (!fs::exists(status)) {
-    return cannotOpen(error);
+  if (!std::filesystem::is_regular_file(path, error)) {
+    return 0;
   }
-  if (fs::is_directory(status)) {
-    return "it is a folder, not a file";
-  }
-  if (!fs::is_regular_file(status)) {
-    return "it is not a regular file (a device, a pipe or a socket)";
-  }
-  return "";
-}
-
-std::string whyNoFormat(std::string const& extension) {
-  std::string const subject = extension.empty()
-                                  ? "the name has no extension"
-                                  : "the extension \"" + escaped(extension) + "\" is not supported";
-  return subject + "; it alone names the format, and must be one of " + supportedExtensions();
-}
-
-bool refuse(std::string const& path, std::string const& reason, std::ostream& out) {
-  out << escaped(path) << ": no record: " << reason << ".\n";
-  return false;
+  auto const size = std::filesystem::file_size(path, error);
+  return error ? 0 : static_cast<std::int64_t>(size);
 }
 
 void writeSteps(Walk const& walk, std::ostream& out) {
@@ -117,76 +65,67 @@ void writeSteps(Walk const& walk, std::ostream& out) {
   }
 }
 
-void explainRefusal(Walk const& walk, std::string const& path, std::ostream& out) {
-  std::string reason = walk.reason;
-  if (walk.isGivenUp()) {
-    reason =
-        "it asks for far more reads than a photo does: this walk over it was given up, and the "
-        "library may have met a limit of its own";
-  } else if (reason.empty()) {
-    reason =
-        "the library refuses it, but this walk over it found nothing wrong; a limit on the work "
-        "for one file may have been exceeded";
+void explainRefusal(Walk const& walk, std::ostream& out) {
+  if (!walk.limit().empty()) {
+    out << "no record: " << walk.limit() << ", more than is read of one file.\n";
+  } else if (!walk.reason.empty()) {
+    out << "no record: " << walk.reason << ".\n";
+  } else {
+    out << "no record: the library refuses it, but this walk over it found nothing wrong; a limit "
+           "on the work for one file may have been exceeded.\n";
   }
-  refuse(path, reason, out);
   writeSteps(walk, out);
 }
 
-void explainRecord(Walk const& walk, quavel::QVMetadata const& record, std::string const& path,
-                   Format const& format, std::ostream& out) {
-  out << escaped(path) << ": a record, read as " << format.kind << ".\n";
-  if (walk.isGivenUp()) {
-    out << "  note: This walk over the file was given up for its length.\n";
+void explainRecord(Walk const& walk, Outcome const& outcome, Format const& format,
+                   std::ostream& out) {
+  out << "a record, read as " << format.kind << ".\n";
+  if (!walk.limit().empty()) {
+    out << "  note: This walk was given up: " << walk.limit() << ".\n";
   } else if (!walk.reason.empty()) {
     out << "  note: This walk would have refused the file: " << walk.reason
         << ". The record is what counts; please report the difference.\n";
   }
   writeSteps(walk, out);
-  explainAbsences(walk, record, format.reader, format.kind, out);
+  explainAbsences(walk, outcome, format.reader, format.kind, out);
 }
 
-bool explain(std::string const& path, std::ostream& out) {
-  std::string const noFile = whyNoFile(path);
-  if (!noFile.empty()) {
-    return refuse(path, noFile, out);
-  }
-  std::string const extension = extensionOf(path);
-  Format const* const format = formatOf(extension);
-  if (format == nullptr) {
-    return refuse(path, whyNoFormat(extension), out);
-  }
-  std::error_code error;
-  auto const size = fs::file_size(path, error);
-  Walk walk(path, static_cast<std::int64_t>(size));
-  if (!error && !walk.isOpen()) {
-    error.assign(errno, std::generic_category());
-  }
-  if (error) {
-    return refuse(path, cannotOpen(error), out);
-  }
-  if (size == 0) {
-    return refuse(path, "the file is empty", out);
-  }
-
-  QVReader const reader(path);  // it decides; the walk only explains
-  format->walk(walk);
+void explainContent(Outcome const& outcome, Format const& format, Walk& walk, std::ostream& out) {
+  format.walk(walk);
   walk.stream->baseOffset = 0;
-  std::string const content = foreignContent(walk, extension);
+  std::string const content = foreignContent(walk, std::string(format.extension));
   if (!content.empty()) {
     walk.notes.push_back("The file looks like " + content + "; its extension has it read as " +
-                         format->kind);
+                         format.kind);
   }
-  if (!reader.metadata) {
-    explainRefusal(walk, path, out);
-    return false;
+  if (outcome.record) {
+    explainRecord(walk, outcome, format, out);
+  } else {
+    explainRefusal(walk, out);
   }
-  explainRecord(walk, *reader.metadata, path, *format, out);
-  return true;
 }
 
 }  // namespace
 }  // namespace why
 
-bool explainFile(std::string const& path, std::ostream& out) { return why::explain(path, out); }
+bool explainFile(std::string const& path, std::ostream& out) {
+  out << escaped(path) << ": ";
+  Outcome const outcome = readPhoto({path, false, ""});  // decides; the walk only explains
+  auto const* const format = why::formatOf(extensionOf(path));
+  std::int64_t const size = format == nullptr ? 0 : why::sizeOfFile(path);
+  if (size > 0) {
+    why::Walk walk(path, size);
+    if (walk.isOpen()) {
+      why::explainContent(outcome, *format, walk, out);
+      return outcome.record != nullptr;
+    }
+  }
+  if (!outcome.record) {
+    out << "no record: it " << escaped(outcome.error) << ".\n";
+    return false;
+  }
+  out << "a record, but the file has gone since it was read.\n";
+  return true;
+}
 
 }  // namespace app

@@ -82,8 +82,9 @@ bool walkCmt(Walk& walk, WalkedBox const& box) {
 
 bool walkMetadataChildren(Walk& walk, WalkedBox const& uuid, KeptBoxes& kept) {
   long const end = uuid.start + long{uuid.size};
+  std::string const place = "in the metadata " + uuid.text();
   while (walk.stream->getOffset() < end && !(kept.hasCmt1 && kept.hasCmt2)) {
-    auto const child = readBox(walk, "in the metadata " + uuid.text());
+    auto const child = readBox(walk, place);
     if (!child.isRead) {
       return false;
     }
@@ -119,9 +120,10 @@ bool walkUuid(Walk& walk, WalkedBox const& uuid, KeptBoxes& kept) {
 
 bool walkMoovChildren(Walk& walk, WalkedBox const& moov, KeptBoxes& kept) {
   long const end = moov.start + long{moov.size};
+  std::string const place = "in the " + moov.text();
   walk.stream->setOffset(moov.start + kHeaderSize);
   while (walk.stream->getOffset() < end) {
-    auto const child = readBox(walk, "in the " + moov.text());
+    auto const child = readBox(walk, place);
     if (!child.isRead || (child.type == kUuid && !walkUuid(walk, child, kept))) {
       return false;
     }
@@ -148,8 +150,9 @@ void judge(Walk& walk, WalkedBox const& moov, KeptBoxes const& kept) {
 }  // namespace
 
 void walkCr3(Walk& walk) {
+  std::string const place = "before a moov box was met";
   while (true) {
-    auto const box = readBox(walk, "before a moov box was met");
+    auto const box = readBox(walk, place);
     if (!box.isRead) {
       return;
     }

@@ -1,10 +1,10 @@
 #ifndef QUAVEL_APPS_WHYFIELDS_H
 #define QUAVEL_APPS_WHYFIELDS_H
 
-#include <quavel/QVMetadata.h>
-
 #include <ostream>
+#include <string>
 
+#include "Outcome.h"
 #include "WhyWalk.h"
 
 namespace app::why {
@@ -20,8 +20,8 @@ enum Reader : unsigned {
 };
 
 /// Writes a line for each reason for which fields of the record are absent. `kind`: what the
-/// reader calls its files.
-void explainAbsences(Walk const& walk, quavel::QVMetadata const& record, Reader reader,
+/// reader's files are called.
+void explainAbsences(Walk const& walk, Outcome const& outcome, Reader reader,
                      std::string const& kind, std::ostream& out);
 
 }  // namespace app::why

@@ -107,8 +107,7 @@ bool walkAPP1(Walk& walk, std::int64_t start, Segments& seen) {
     return true;
   }
   if (++seen.exifCount > kMostExifSegments) {
-    return walk.stop(place + " is Exif segment number " + std::to_string(seen.exifCount) +
-                     "; at most " + std::to_string(kMostExifSegments) + " are read");
+    return walk.exceed("it has more than " + std::to_string(kMostExifSegments) + " Exif segments");
   }
   walk.passed(place + ": Exif");
   unsigned short padding = 0;

@@ -67,10 +67,13 @@ Directory chooseSubIFD(Walk& walk, WalkedDirectory const& mainIFD) {
       notes.push_back(why);
     }
   }
-  std::string const examined =
-      count > kMostSubIFDs ? "the first " + std::to_string(kMostSubIFDs) + " of its " : "its ";
+  if (count > kMostSubIFDs) {
+    walk.exceed("none of the first " + std::to_string(kMostSubIFDs) + " of its " +
+                std::to_string(count) + " SubIFDs says that it is the full image");
+    return std::nullopt;
+  }
   return stopWithoutFullImage(walk,
-                              subject + " and none of " + examined + std::to_string(count) +
+                              subject + " and none of its " + std::to_string(count) +
                                   " SubIFDs says that it is the full image",
                               notes);
 }

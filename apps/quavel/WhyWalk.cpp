@@ -45,6 +45,15 @@ bool Walk::stop(std::string const& why) {
   return false;
 }
 
+bool Walk::exceed(std::string const& what) {
+  exceeded = what;
+  return false;
+}
+
+std::string Walk::limit() const {
+  return trace->isSpent() ? "it asks for millions of reads" : exceeded;
+}
+
 void Walk::passed(std::string const& step) {
   if (steps.size() < kMostSteps) {
     steps.push_back(step);

@@ -26,6 +26,8 @@ class Walk {
 
   /// Ends the walk; the first reason given stays. False, for the step to return on the spot.
   bool stop(std::string const& why);
+  /// Gives the walk up at a limit of the library's.
+  bool exceed(std::string const& what);
   /// Tells of a step that went well. Beyond a screenful they are only counted.
   void passed(std::string const& step);
   /// Tells why a field of the record stays absent, if it does; the last reason given stays.
@@ -43,11 +45,13 @@ class Walk {
   std::string fileEnd() const;
 
   bool isOpen() const { return trace->isOpen(); }
-  /// Whether the walk was given up for its length, in which case it has proved nothing.
-  bool isGivenUp() const { return trace->isSpent(); }
+  /// The limit on the work for one file for which the walk was given up, which then has proved
+  /// nothing: "it has more than 64 Exif segments"; else empty.
+  std::string limit() const;
 
   std::int64_t fileSize;
-  std::string reason;  ///< Why the walk stopped; empty: it went through.
+  std::string exceeded;  ///< See `limit`.
+  std::string reason;    ///< Why the walk stopped; empty: it went through.
   std::vector<std::string> steps;
   std::uint64_t furtherSteps = 0;  ///< Those that `steps` leaves out.
   std::vector<std::string> notes;  ///< What else may help.
