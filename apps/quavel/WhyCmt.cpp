@@ -14,24 +14,24 @@ namespace {
 
 /// A field of the record that is a number, and the entry that gives it.
 struct NumberRow {
-  unsigned short tag;
   char const* field;
-  EntryValueType wanted;     ///< UNDEFINED: any type.
-  char const* derived = "";  ///< A field computed from it.
+  char const* derived;  ///< A field computed from it; empty: none.
+  unsigned short tag;
+  EntryValueType wanted;  ///< UNDEFINED: any type.
 };
 
 // In the order in which they are examined.
 constexpr NumberRow kNumberRows[] = {
-    {tag::ISOSpeedRatings, "iso", EntryValueType::UNDEFINED},
-    {tag::ApertureValue, "apertureValue", EntryValueType::RATIONAL, "apexFNumber"},
-    {tag::ShutterSpeedValue, "shutterSpeedValue", EntryValueType::SRATIONAL, "apexExposureTime"},
-    {tag::FocalLength, "focalLength", EntryValueType::RATIONAL},
-    {tag::WhiteBalance, "whiteBalance", EntryValueType::UNDEFINED},
-    {tag::MeteringMode, "meteringMode", EntryValueType::UNDEFINED},
-    {tag::ExposureBiasValue, "exposureBiasValue", EntryValueType::SRATIONAL},
-    {tag::FocalLengthIn35mmFilm, "focalLengthIn35mmFilm", EntryValueType::UNDEFINED},
-    {tag::ExposureTime, "exposureTime", EntryValueType::RATIONAL},
-    {tag::FNumber, "fNumber", EntryValueType::RATIONAL},
+    {"iso", "", tag::ISOSpeedRatings, EntryValueType::UNDEFINED},
+    {"apertureValue", "apexFNumber", tag::ApertureValue, EntryValueType::RATIONAL},
+    {"shutterSpeedValue", "apexExposureTime", tag::ShutterSpeedValue, EntryValueType::SRATIONAL},
+    {"focalLength", "", tag::FocalLength, EntryValueType::RATIONAL},
+    {"whiteBalance", "", tag::WhiteBalance, EntryValueType::UNDEFINED},
+    {"meteringMode", "", tag::MeteringMode, EntryValueType::UNDEFINED},
+    {"exposureBiasValue", "", tag::ExposureBiasValue, EntryValueType::SRATIONAL},
+    {"focalLengthIn35mmFilm", "", tag::FocalLengthIn35mmFilm, EntryValueType::UNDEFINED},
+    {"exposureTime", "", tag::ExposureTime, EntryValueType::RATIONAL},
+    {"fNumber", "", tag::FNumber, EntryValueType::RATIONAL},
 };
 
 void absentRow(Walk& walk, NumberRow const& row, std::string const& why) {
