@@ -56,7 +56,8 @@ WalkedBox readBox(Walk& walk, std::string const& place) {
   if (box.isRead) {
     return box;
   }
-  if (walk.position() < box.start + kHeaderSize) {
+  walk.stream->setOffset(box.start);
+  if (!walk.stream->readLong(&box.size) || !walk.stream->readLong(&box.type)) {
     walk.stop(walk.cut("the header of the next box " + place));
     return box;
   }

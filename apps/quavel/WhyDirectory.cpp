@@ -35,7 +35,8 @@ bool stopAtHeader(Walk& walk, std::string const& header, std::int64_t position) 
   }
   walk.stream->setOffset(static_cast<long>(position + 2 - walk.stream->baseOffset));
   unsigned short magic = 0;
-  if (!walk.stream->readShort(&magic) || magic == kTiffMagic) {
+  std::uint32_t offset = 0;
+  if (!walk.stream->readShort(&magic) || (magic == kTiffMagic && !walk.stream->readLong(&offset))) {
     return walk.stop(walk.cut(subject));
   }
   return walk.stop(subject + " has magic " + std::to_string(magic) + ", not 42" +
@@ -73,7 +74,7 @@ Directory walkDirectory(Walk& walk, std::string const& name, std::uint32_t offse
     walk.stop(whyUnread(walk, directory, tags));
     return std::nullopt;
   }
-  walk.passed(directory.text() + ": " + std::to_string(directory.ifd->entries->size()) +
+  walk.passed(directory.text() + ": has " + std::to_string(directory.ifd->entries->size()) +
               " of the " + std::to_string(tags.size()) + " wanted entries");
   return directory;
 }

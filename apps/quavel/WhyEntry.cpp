@@ -16,9 +16,7 @@ namespace {
 
 constexpr long kCountSize = 2;
 constexpr long kEntrySize = 12;
-constexpr long kTagSize = 2;
 constexpr std::int64_t kValueFieldSize = 4;
-constexpr unsigned short kUndefinedCode = 7;
 constexpr unsigned short kLastCode = 13;
 constexpr std::uint32_t kMostValues = 65536;  // the library's limit
 
@@ -56,7 +54,8 @@ std::string contentOf(RawEntry const& entry) {
          (entry.count == 1 ? " value" : " values");
 }
 
-/// Why an entry of a known type that lies in the file as a whole was refused nevertheless.
+/// Why an entry of a known type was refused though its own 12 bytes are there, which is never so
+/// with UNDEFINED ones: their bytes are not looked at elsewhere.
 std::string whyValuesUnread(Walk const& walk, RawEntry const& entry) {
   if (entry.count > kMostValues) {
     return "it declares " + contentOf(entry) + "; more than " + std::to_string(kMostValues) +
@@ -81,11 +80,7 @@ std::string whyEntryUnread(Walk& walk, WalkedDirectory const& directory, RawEntr
     return place + ": field " + fieldTypeText(entry.code) +
            " is neither one of TIFF's 12 nor 13 (IFD)";
   }
-  bool const isInline = entry.code == kUndefinedCode;
-  if (!isWhole || isInline) {
-    return walk.cut(place);
-  }
-  return place + ": " + whyValuesUnread(walk, entry);
+  return isWhole ? place + ": " + whyValuesUnread(walk, entry) : walk.cut(place);
 }
 
 /// The first entry with the tag, which the directory has.

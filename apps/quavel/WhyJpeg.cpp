@@ -26,7 +26,7 @@ constexpr std::size_t kExifIdentifierSize = 4;
 // The library's limit.
 constexpr unsigned kMostExifSegments = 64;
 
-// Below it, the Exif size is taken for that of a thumbnail.
+// Up to it, the Exif size is taken for that of a thumbnail.
 constexpr std::int32_t kLargestThumbnailSide = 500;
 
 /// What the segments have shown so far.

@@ -1,4 +1,5 @@
 #include <string>
+#include <vector>
 
 #include "WhyDirectory.h"
 #include "WhyFormats.h"
@@ -14,6 +15,13 @@ constexpr long kRawSectionOffsetPosition = 100;
 
 // SOI, the APP1 marker and its length (2 bytes each), "Exif" and two zeros.
 constexpr std::uint32_t kTiffHeaderInImage = 12;
+
+/// Whether an image opens as the reader takes for granted. The segment's length may be anything.
+bool opensWithExif(std::vector<std::uint8_t> const& opening) {
+  std::string const text(opening.begin(), opening.end());
+  return text.size() == kTiffHeaderInImage && text.compare(0, 4, "\xff\xd8\xff\xe1") == 0 &&
+         text.compare(6, 6, std::string("Exif\0\0", 6)) == 0;
+}
 
 /// Reads a section's offset from the file's header, which is big-endian.
 bool readSectionOffset(Walk& walk, std::string const& section, long position,
@@ -59,10 +67,12 @@ bool walkImage(Walk& walk) {
     return true;
   }
   auto const opening = walk.peek(image, kTiffHeaderInImage);
-  walk.notes.push_back("The embedded JPEG at " + offsetText(image) + " begins with " +
-                       (opening.empty() ? "nothing" : hexText(opening)) +
-                       "; ff d8, then at once an Exif segment (ff e1, 2 bytes, 45 78 69 66 00 00) "
-                       "are taken for granted");
+  if (!opening.empty() && !opensWithExif(opening)) {
+    walk.notes.push_back("The embedded JPEG at " + offsetText(image) + " begins with " +
+                         hexText(opening) +
+                         "; wanted: ff d8, then at once an Exif segment (ff e1, its length, "
+                         "45 78 69 66 00 00)");
+  }
   return false;
 }
 
