@@ -73,6 +73,8 @@ void addInputs(CLI::App& command, Options& options) {
       command.add_option("--extension", options.extension, "The kind of that image, such as nef");
   extension->type_name("EXT")->needs(standardInput);
   standardInput->needs(extension)->excludes(list);
+  command.add_option("--why", options.why, "Tell why a file gives no record, or lacks fields")
+      ->type_name("FILE");
 }
 
 void addForms(CLI::App& command, FormKind& form) {
@@ -136,6 +138,12 @@ void check(Options& options, Texts const& texts) {
     }
   }
   bool const hasPaths = !options.paths.empty() || !options.filesFrom.empty();
+  if (!options.why.empty()) {
+    if (hasPaths || options.fromStdin || options.form != FormKind::Automatic) {
+      throw CLI::ValidationError("--why explains one file in words: give no other and no form");
+    }
+    return;
+  }
   if (hasPaths == options.fromStdin) {
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
                                         : "no photos given: name files or folders");

@@ -20,6 +20,7 @@ struct Options {
   std::string filesFrom;  ///< Empty: no list.
   bool isNulSeparated = false;
   bool fromStdin = false;
+  std::string why;        ///< The one file to explain; empty: none.
   std::string extension;  ///< Of what standard input holds, in lower case.
   FormKind form = FormKind::Automatic;
   Fields fields;                   ///< Empty: those of the form.

@@ -51,25 +51,26 @@ std::string unsupported() {
   return "has no photo's extension; give one of: " + std::string(kExtensions);
 }
 
-std::string incomplete(std::string const& path) {
-  return "is no whole ." + extensionOf(path) +
-         " file (empty, cut short, damaged or of another kind); check its source";
+std::string incomplete(std::string const& extension) {
+  return "is no whole ." + extension + " file: empty, cut short or of another kind";
 }
 
-/// Why a regular file with a photo's extension, read with a failing system call, gave no record.
-std::string whyNoRecord(std::string const& path) {
+/// Why a regular file with a photo's extension gave no record. `error`: what system calls left in
+/// errno while it was read; without any, the file is not worth another look.
+std::string whyNoRecord(std::string const& path, int error) {
+  std::string const result = incomplete(extensionOf(path)) + "; see --why";
+  if (error == 0) {
+    return result;
+  }
   int const fd = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
   if (fd == -1) {
     return unopened(errno);
   }
   char byte = 0;
   ssize_t const count = ::read(fd, &byte, 1);
-  int const error = errno;
+  int const readError = errno;
   ::close(fd);
-  if (count == -1) {
-    return "cannot be read: " + systemText(error) + advice(error);
-  }
-  return incomplete(path);
+  return count == -1 ? "cannot be read: " + systemText(readError) + advice(readError) : result;
 }
 
 /// Why the path cannot be read as a photo, or nothing.
@@ -146,7 +147,7 @@ Outcome readPhoto(Input const& input) {
     errno = 0;
     outcome.record = quavel::QVReader(input.path).metadata;
     if (!outcome.record) {
-      outcome.error = errno == 0 ? incomplete(input.path) : whyNoRecord(input.path);
+      outcome.error = whyNoRecord(input.path, errno);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
@@ -165,7 +166,7 @@ Outcome readStandardInput(std::string const& extension) {
     auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
     outcome.record = quavel::QVReader(buffer, bytes.size(), extension).metadata;
     if (!outcome.record) {
-      outcome.error = incomplete("." + extension);
+      outcome.error = incomplete(extension);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;

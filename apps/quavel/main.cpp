@@ -4,6 +4,7 @@
 
 #include <exception>
 #include <new>
+#include <sstream>
 #include <string>
 #include <system_error>
 
@@ -12,6 +13,7 @@
 #include "Options.h"
 #include "Output.h"
 #include "Run.h"
+#include "Why.h"
 
 namespace {
 
@@ -27,7 +29,18 @@ void holdStandardStreams() {
   }
 }
 
+int explain(std::string const& path, app::Output& output) {
+  std::ostringstream text;
+  bool const hasRecord = app::explainFile(path, text);
+  output.add(text.str());
+  output.flush();
+  return hasRecord ? app::kSuccess : app::kSomeFailed;
+}
+
 int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
+  if (!parsed.status && !parsed.options.why.empty()) {
+    return explain(parsed.options.why, output);
+  }
   if (!parsed.status) {
     return app::run(parsed.options, output, console);
   }
