@@ -15,7 +15,8 @@ namespace app {
 namespace {
 
 constexpr std::size_t kLargestInput = std::size_t{1} << 30;
-constexpr std::string_view kOutOfMemory = "not enough memory to read it";
+constexpr char kEmpty[] = "is empty; copy it anew from its source";
+constexpr char kOutOfMemory[] = "not enough memory to read it";
 
 std::string systemText(int error) { return std::generic_category().message(error); }
 
@@ -52,13 +53,17 @@ std::string unsupported() {
 }
 
 std::string incomplete(std::string const& extension) {
-  return "is no whole ." + extension + " file: empty, cut short or of another kind";
+  return "is no whole ." + extension + " file: cut short, damaged or of another kind";
 }
 
 /// Why a regular file with a photo's extension gave no record. `error`: what system calls left in
-/// errno while it was read; without any, the file is not worth another look.
+/// errno while it was read; without any, the file is not worth opening again.
 std::string whyNoRecord(std::string const& path, int error) {
   std::string const result = incomplete(extensionOf(path)) + "; see --why";
+  struct stat status = {};
+  if (::stat(path.c_str(), &status) == 0 && status.st_size == 0) {
+    return kEmpty;
+  }
   if (error == 0) {
     return result;
   }
@@ -166,7 +171,7 @@ Outcome readStandardInput(std::string const& extension) {
     auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
     outcome.record = quavel::QVReader(buffer, bytes.size(), extension).metadata;
     if (!outcome.record) {
-      outcome.error = incomplete(extension);
+      outcome.error = bytes.empty() ? kEmpty : incomplete(extension);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
