@@ -59,7 +59,7 @@ std::string incomplete(std::string const& extension) {
 /// Why a regular file with a photo's extension gave no record. `error`: what system calls left in
 /// errno while it was read; without any, the file is not worth opening again.
 std::string whyNoRecord(std::string const& path, int error) {
-  std::string const result = incomplete(extensionOf(path)) + "; see --why";
+  std::string result = incomplete(extensionOf(path)) + "; see --why";
   struct stat status = {};
   if (::stat(path.c_str(), &status) == 0 && status.st_size == 0) {
     return kEmpty;
