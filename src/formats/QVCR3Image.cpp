@@ -13,7 +13,7 @@ namespace quavel {
 bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
-  while (true) {
+  for (int i = 0; i < box::kMostSiblings; ++i) {
     long const boxStart = stream->getOffset();
     QVCR3Box topLevelBox;
     if (!topLevelBox.read(stream)) {
@@ -25,6 +25,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
       return moov.read(stream) && storeInfoFromMoov(moov);
     }
   }
+  return false;
 }
 
 bool QVCR3Image::storeInfoFromMoov(QVCR3MoovBox const& moov) {
