@@ -1,31 +1,36 @@
 #include <gtest/gtest.h>
 
-#include <functional>
-
+#include "stream/ReadAheadStream.h"
 #include "support/Fixtures.h"
 
 namespace quavel::test {
 namespace {
 
-/// The same bytes as a file and as memory.
-class StreamTest : public testing::TestWithParam<bool> {
+enum class Kind { kFile, kReadAhead, kMemory };
+
+/// The same bytes as a file, as a file read ahead, and as memory.
+class StreamTest : public testing::TestWithParam<Kind> {
  protected:
   std::shared_ptr<QVStream> open(Bytes const& bytes) {
     data = bytes;
-    if (GetParam()) {
-      file = std::make_unique<TemporaryFile>(bytes, "bin");
-      return std::make_shared<QVFStream>(file->path);
+    if (GetParam() == Kind::kMemory) {
+      auto* const memory = reinterpret_cast<unsigned char*>(data.data());
+      return std::make_shared<QVMStream>(memory, data.size());
     }
-    auto* const memory = reinterpret_cast<unsigned char*>(data.data());
-    return std::make_shared<QVMStream>(memory, data.size());
+    file = std::make_unique<TemporaryFile>(bytes, "bin");
+    std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file->path);
+    if (GetParam() == Kind::kReadAhead) {
+      stream = std::make_shared<detail::ReadAheadStream>(stream);
+    }
+    return stream;
   }
 
   Bytes data;
   std::unique_ptr<TemporaryFile> file;
 };
 
-INSTANTIATE_TEST_SUITE_P(Streams, StreamTest, testing::Bool(),
-                         [](auto const& kind) { return kind.param ? "File" : "Memory"; });
+INSTANTIATE_TEST_SUITE_P(Streams, StreamTest,
+                         testing::Values(Kind::kFile, Kind::kReadAhead, Kind::kMemory));
 
 TEST_P(StreamTest, StartsAtTheBeginningInBigEndianOrder) {
   auto const stream = open("\x12\x34");
@@ -130,13 +135,76 @@ TEST(MemoryStream, EndsEverySeekOutsideAtTheEnd) {
 
 TEST(FileStream, SeeksPastTheEndAndRefusesToSeekBeforeTheStart) {
   TemporaryFile const file("abc", "bin");
-  QVFStream stream(file.path);
-  stream.setOffset(100);
-  EXPECT_EQ(stream.getOffset(), 100);
-  stream.setOffset(-1);
-  EXPECT_EQ(stream.getOffset(), 100);
-  unsigned char byte = 0;
-  EXPECT_FALSE(stream.readByte(&byte));
+  QVFStream plain(file.path);
+  detail::ReadAheadStream ahead(std::make_shared<QVFStream>(file.path));
+  for (QVStream* const stream : {static_cast<QVStream*>(&plain), static_cast<QVStream*>(&ahead)}) {
+    stream->setOffset(100);
+    EXPECT_EQ(stream->getOffset(), 100);
+    stream->setOffset(-1);
+    EXPECT_EQ(stream->getOffset(), 100);
+    unsigned char byte = 0;
+    EXPECT_FALSE(stream->readByte(&byte));
+    stream->setOffset(2);
+    EXPECT_TRUE(stream->readByte(&byte));
+    EXPECT_EQ(byte, 'c');
+  }
+}
+
+/// Counts what is asked of a file, and fails the reads from a given one on.
+struct CountingStream : QVFStream {
+  using QVFStream::QVFStream;
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    return ++reads >= firstFailure ? -1 : QVFStream::readBuffer(destination, count);
+  }
+  void setOffset(long const& offset) override {
+    ++seeks;
+    QVFStream::setOffset(offset);
+  }
+  int reads = 0;
+  int seeks = 0;
+  int firstFailure = 100;
+};
+
+TEST(ReadAheadStream, AnswersFromItsWindowAndMovesByOneSeekAndOneRead) {
+  Bytes bytes(100000, '\0');
+  for (std::size_t i = 0; i < bytes.size(); ++i) {
+    bytes[i] = static_cast<char>(i % 251);
+  }
+  TemporaryFile const file(bytes, "bin");
+  auto const source = std::make_shared<CountingStream>(file.path);
+  detail::ReadAheadStream stream(source);
+  auto const expectAt = [&](long offset, int reads, int seeks) {
+    unsigned char byte = 0;
+    stream.setOffset(offset);
+    EXPECT_TRUE(stream.readByte(&byte));
+    EXPECT_EQ(byte, offset % 251);
+    EXPECT_EQ(source->reads, reads) << offset;
+    EXPECT_EQ(source->seeks, seeks) << offset;
+  };
+  expectAt(0, 1, 0);
+  expectAt(16383, 1, 0);
+  expectAt(16384, 2, 0);  // the source stands there already
+  expectAt(50000, 3, 1);
+  expectAt(54095, 3, 1);
+  expectAt(10, 4, 2);
+
+  Bytes whole(bytes.size(), '\1');
+  stream.setOffset(0);
+  EXPECT_EQ(stream.readBuffer(reinterpret_cast<std::uint8_t*>(whole.data()), whole.size()),
+            static_cast<std::int64_t>(bytes.size()));
+  EXPECT_EQ(whole, bytes);
+}
+
+TEST(ReadAheadStream, TakesAReadErrorForTheEnd) {
+  TemporaryFile const file(Bytes(20000, 'x'), "bin");
+  auto const source = std::make_shared<CountingStream>(file.path);
+  source->firstFailure = 2;
+  detail::ReadAheadStream stream(source);
+  unsigned int number = 0;
+  EXPECT_TRUE(stream.readLong(&number));
+  stream.setOffset(16382);
+  EXPECT_FALSE(stream.readLong(&number));
+  EXPECT_EQ(stream.getOffset(), 16384);
 }
 
 TEST(FileStream, IsEmptyWhenTheFileCannotBeOpened) {

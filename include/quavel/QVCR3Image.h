@@ -19,8 +19,8 @@ class QUAVEL_EXPORT QVCR3Image : public QVMetadata {
 
  private:
   bool storeInfoFromMoov(QVCR3MoovBox const& moov);
-  void storeInfoFromCMT1(QVCR3CMT1Box const& cmt1);
-  void storeInfoFromCMT2(QVCR3CMT2Box const& cmt2);
+  void storeInfoFromCMT1(QVCR3CMT1Box& cmt1);
+  void storeInfoFromCMT2(QVCR3CMT2Box& cmt2);
 };
 
 }  // namespace quavel

@@ -30,6 +30,12 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
   std::uint32_t nextIFDOffset = 0;  ///< From the TIFF header; 0: this is the last directory.
   /// Null until a `read` has walked the entries; replaced by each that does.
   std::shared_ptr<std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>> entries;
+
+ private:
+  using EntryMap = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
+
+  static bool readEntries(std::shared_ptr<QVStream>& stream, unsigned short count,
+                          std::vector<unsigned short> const& tags, EntryMap& kept);
 };
 
 }  // namespace quavel

@@ -11,7 +11,13 @@
 namespace quavel {
 
 class QVStream;
+class QVTiffImageFileDirectory;
 class QVTiffImageFileDirectoryEntryValue;
+
+namespace detail {
+struct EntryPools;
+struct RawEntry;
+}  // namespace detail
 
 /// One entry of a TIFF image file directory, without its tag, which the directory keeps.
 class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
@@ -34,7 +40,13 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
   std::uint32_t dataCount = 0;   ///< UNDEFINED of more: how many bytes; else 0.
 
  private:
-  bool readUndefined(std::shared_ptr<QVStream>& stream, std::uint32_t count);
+  friend class QVTiffImageFileDirectory;
+  using ValueList = decltype(values)::element_type;
+
+  bool read(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools);
+  void storeUndefined(detail::RawEntry const& entry, bool isReversed);
+  static bool readValues(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools,
+                         ValueList& list);
 };
 
 }  // namespace quavel

@@ -9,7 +9,12 @@ namespace quavel {
 QVCR3Box::~QVCR3Box() = default;
 
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
-  boxHeader = std::make_shared<QVCR3BoxHeader>();
+  // A walk reads all its boxes with one object: the header is taken anew unless somebody kept it.
+  if (boxHeader.use_count() == 1) {
+    *boxHeader = QVCR3BoxHeader();
+  } else {
+    boxHeader = std::make_shared<QVCR3BoxHeader>();
+  }
   long const start = stream->getOffset();
   if (!boxHeader->read(stream)) {
     return false;

@@ -1,5 +1,7 @@
 #include "quavel/QVCR3Image.h"
 
+#include <utility>
+
 #include "formats/BoxTypes.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVCR3CMT1Box.h"
@@ -13,9 +15,9 @@ namespace quavel {
 bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
+  QVCR3Box topLevelBox;
   for (int i = 0; i < box::kMostSiblings; ++i) {
     long const boxStart = stream->getOffset();
-    QVCR3Box topLevelBox;
     if (!topLevelBox.read(stream)) {
       return false;
     }
@@ -41,18 +43,18 @@ bool QVCR3Image::storeInfoFromMoov(QVCR3MoovBox const& moov) {
   return true;
 }
 
-void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box const& cmt1) {
+void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  dateTimeOriginal = cmt1.dateTimeOriginal;
-  dateTimeDigitized = cmt1.dateTimeDigitized;
-  dateTime = cmt1.dateTime;
-  model = cmt1.model;
+  dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
+  dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
+  dateTime = std::move(cmt1.dateTime);
+  model = std::move(cmt1.model);
 }
 
-void QVCR3Image::storeInfoFromCMT2(QVCR3CMT2Box const& cmt2) {
-  lensModel = cmt2.lensModel;
+void QVCR3Image::storeInfoFromCMT2(QVCR3CMT2Box& cmt2) {
+  lensModel = std::move(cmt2.lensModel);
   iso = cmt2.iso;
   apexFNumber = cmt2.apexFNumber;
   apexExposureTime = cmt2.apexExposureTime;

@@ -31,6 +31,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+  QVCR3Box child;
   int siblings = 0;
   int metadataBoxes = 0;
   while (stream->getOffset() < end) {
@@ -38,7 +39,6 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
       return false;
     }
     long const childStart = stream->getOffset();
-    QVCR3Box child;
     if (!child.read(stream)) {
       return false;
     }

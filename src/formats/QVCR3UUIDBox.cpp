@@ -46,6 +46,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+  QVCR3Box child;
   int siblings = 0;
   int directoryBoxes = 0;
   while (stream->getOffset() < end) {
@@ -53,7 +54,6 @@ bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
       return false;
     }
     long const childStart = stream->getOffset();
-    QVCR3Box child;
     if (!child.read(stream)) {
       return false;
     }

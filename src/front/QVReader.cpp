@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <cctype>
+#include <string_view>
+#include <utility>
 
 #include "quavel/QV3FRImage.h"
 #include "quavel/QVARWImage.h"
@@ -15,6 +17,7 @@
 #include "quavel/QVNefImage.h"
 #include "quavel/QVRafImage.h"
 #include "quavel/QVTiffImage.h"
+#include "stream/ReadAheadStream.h"
 
 namespace quavel {
 
@@ -26,7 +29,7 @@ std::shared_ptr<QVMetadata> make() {
 }
 
 struct ExtensionRow {
-  char const* extension;
+  std::string_view extension;
   std::shared_ptr<QVMetadata> (*makeRecord)();
 };
 
@@ -50,7 +53,9 @@ QVReader::QVReader(std::string const& path) {
   std::string extension = getPathExtension(path);
   std::transform(extension.begin(), extension.end(), extension.begin(),
                  [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
-  metadata = readRecord(*this, extension, std::make_shared<QVFStream>(path));
+  auto file = std::make_shared<QVFStream>(path);
+  metadata =
+      readRecord(*this, extension, std::make_shared<detail::ReadAheadStream>(std::move(file)));
 }
 
 QVReader::QVReader(unsigned char* buffer, unsigned long const& length,

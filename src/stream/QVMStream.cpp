@@ -10,10 +10,18 @@ QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
 
 std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   std::size_t const delivered = std::min<std::size_t>(count, length - offset);
-  if (delivered > 0) {
-    std::memcpy(destination, buffer + offset, delivered);
-    offset += delivered;
+  if (delivered == 0) {
+    return 0;
   }
+  // Most reads are of a number: copied by its known size, it takes no call.
+  if (delivered == sizeof(std::uint32_t)) {
+    std::memcpy(destination, buffer + offset, sizeof(std::uint32_t));
+  } else if (delivered == sizeof(std::uint16_t)) {
+    std::memcpy(destination, buffer + offset, sizeof(std::uint16_t));
+  } else {
+    std::memcpy(destination, buffer + offset, delivered);
+  }
+  offset += delivered;
   return static_cast<std::int64_t>(delivered);
 }
 

@@ -1,28 +1,19 @@
 #include "quavel/QVStream.h"
 
-#include <algorithm>
+#include "stream/Bytes.h"
 
 namespace quavel {
 
-namespace {
+using detail::isReversed;
+using detail::reverseBytes;
 
-template <class Number>
-void reverseBytes(Number* number) {
-  auto* const bytes = reinterpret_cast<unsigned char*>(number);
-  std::reverse(bytes, bytes + sizeof(Number));
-}
+namespace {
 
 template <class Number>
 void reverseUnlessHostIs(ByteOrder order, QVStream const& stream, Number* number) {
   if (stream.hostOrder != order) {
     reverseBytes(number);
   }
-}
-
-bool isReversed(QVStream const& stream) {
-  bool const isKnown =
-      stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
-  return isKnown && stream.byteOrder != stream.hostOrder;
 }
 
 template <class Number>

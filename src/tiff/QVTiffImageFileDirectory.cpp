@@ -1,51 +1,105 @@
 #include "quavel/QVTiffImageFileDirectory.h"
 
 #include <algorithm>
-#include <set>
+#include <array>
 
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
+#include "stream/Bytes.h"
+#include "tiff/EntryPools.h"
+#include "tiff/RawEntry.h"
 
 namespace quavel {
 
 namespace {
 
-using Entry = QVTiffImageFileDirectoryEntry;
-using EntryMap = std::map<std::uint16_t, std::shared_ptr<Entry>>;
-
-constexpr long kEntrySize = 12;
-
-/// Null when a tag or a wanted entry cannot be read.
-std::shared_ptr<EntryMap> readEntries(std::shared_ptr<QVStream>& stream, unsigned short count,
-                                      std::vector<unsigned short> const& tags) {
-  std::set<unsigned short> wanted(tags.begin(), tags.end());
-  auto entries = std::make_shared<EntryMap>();
-  long const firstEntry = stream->getOffset();
-
-  for (unsigned short i = 0; i < count; ++i) {
-    stream->setOffset(firstEntry + kEntrySize * i);
-    unsigned short tag = 0;
-    if (!stream->readShort(&tag)) {
-      return nullptr;
-    }
-    if (!tags.empty() && wanted.count(tag) == 0) {
-      continue;
-    }
-    auto entry = std::make_shared<Entry>();
-    if (!entry->read(stream)) {
-      return nullptr;
-    }
-    entries->emplace(tag, std::move(entry));  // the first with a tag stays
-    wanted.erase(tag);
-    if (!tags.empty() && wanted.empty()) {
-      break;
+/// The tags that a directory's reader wants; none listed means all.
+class WantedTags {
+ public:
+  explicit WantedTags(std::vector<unsigned short> const& tags) : tags_(tags) {
+    for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
+      bool const isNew = (mask_ & bitOf(*tag)) == 0 || std::find(tags.begin(), tag, *tag) == tag;
+      distinctCount_ += isNew ? 1 : 0;
+      mask_ |= bitOf(*tag);
     }
   }
 
-  // The entries may have left the stream anywhere.
-  stream->setOffset(firstEntry + kEntrySize * count);
-  return entries;
-}
+  bool areAll() const { return tags_.empty(); }
+  bool contain(unsigned short tag) const {
+    return (mask_ & bitOf(tag)) != 0 && std::find(tags_.begin(), tags_.end(), tag) != tags_.end();
+  }
+  /// One named twice counts once.
+  std::size_t distinctCount() const { return distinctCount_; }
+
+ private:
+  static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
+
+  std::vector<unsigned short> const& tags_;
+  std::uint64_t mask_ = 0;  // says of most unwanted tags that they are not listed
+  std::size_t distinctCount_ = 0;
+};
+
+/// Gives a directory's entries one after the other, taking from the stream as many at a time as
+/// its buffer holds.
+class EntryReader {
+ public:
+  EntryReader(QVStream& stream, long firstEntry, unsigned short count)
+      : stream_(stream),
+        firstEntry_(firstEntry),
+        count_(count),
+        isReversed_(detail::isReversed(stream)) {}
+
+  /// Goes on to entry `i`. False: its tag is not in the data. Moves the stream.
+  bool moveTo(unsigned short i) {
+    current_ = detail::kEntrySize * static_cast<std::size_t>(i - firstBuffered_);
+    if (current_ + detail::kEntryTypePosition > buffered_) {
+      fill(i);
+    }
+    return current_ + detail::kEntryTypePosition <= buffered_;
+  }
+
+  unsigned short tag() const { return number<std::uint16_t>(0); }
+
+  /// The rest of the current entry. False: its type or count is not in the data.
+  bool readRest(detail::RawEntry* entry) const {
+    if (current_ + detail::kEntryFieldPosition > buffered_) {
+      return false;
+    }
+    entry->typeCode = number<std::uint16_t>(detail::kEntryTypePosition);
+    entry->count = number<std::uint32_t>(detail::kEntryCountPosition);
+    entry->field = buffer_.data() + current_ + detail::kEntryFieldPosition;
+    entry->fieldSize =
+        std::min(buffered_ - current_ - detail::kEntryFieldPosition, detail::kEntryFieldSize);
+    return true;
+  }
+
+ private:
+  template <class Number>
+  Number number(std::size_t position) const {
+    return detail::numberAt<Number>(buffer_.data() + current_ + position, isReversed_);
+  }
+
+  void fill(unsigned short i) {
+    std::size_t const left = detail::kEntrySize * static_cast<std::size_t>(count_ - i);
+    stream_.setOffset(offsetOf(i));
+    buffered_ = detail::readUpTo(stream_, buffer_.data(), std::min(left, buffer_.size()));
+    firstBuffered_ = i;
+    current_ = 0;
+  }
+
+  long offsetOf(unsigned short i) const {
+    return firstEntry_ + static_cast<long>(detail::kEntrySize) * i;
+  }
+
+  QVStream& stream_;
+  long const firstEntry_;
+  unsigned short const count_;
+  bool const isReversed_;
+  unsigned short firstBuffered_ = 0;
+  std::size_t current_ = 0;   // where the current entry begins in the buffer
+  std::size_t buffered_ = 0;  // bytes
+  std::array<std::uint8_t, 64 * detail::kEntrySize> buffer_;
+};
 
 }  // namespace
 
@@ -57,8 +111,8 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
   if (!stream->readShort(&entryCount)) {
     return false;
   }
-  auto newEntries = readEntries(stream, entryCount, tags);
-  if (!newEntries) {
+  auto newEntries = std::make_shared<EntryMap>();
+  if (!readEntries(stream, entryCount, tags, *newEntries)) {
     return false;
   }
   entries = std::move(newEntries);
@@ -68,6 +122,44 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
     return false;
   }
   nextIFDOffset = newNextIFDOffset;
+  return true;
+}
+
+bool QVTiffImageFileDirectory::readEntries(std::shared_ptr<QVStream>& stream, unsigned short count,
+                                           std::vector<unsigned short> const& tags,
+                                           EntryMap& kept) {
+  detail::EntryPools pools;
+  WantedTags const wanted(tags);
+  long const firstEntry = stream->getOffset();
+
+  EntryReader entryReader(*stream, firstEntry, count);
+  for (unsigned short i = 0; i < count; ++i) {
+    if (!entryReader.moveTo(i)) {
+      return false;
+    }
+    unsigned short const tag = entryReader.tag();
+    if (!wanted.areAll() && !wanted.contain(tag)) {
+      continue;
+    }
+    auto const place = kept.lower_bound(tag);
+    // A listed tag that has been met is wanted no longer.
+    bool const isMet = place != kept.end() && place->first == tag;
+    if (!wanted.areAll() && isMet) {
+      continue;
+    }
+    detail::RawEntry rawEntry;
+    auto entry = pools.entries.make();
+    if (!entryReader.readRest(&rawEntry) || !entry->read(*stream, rawEntry, pools)) {
+      return false;
+    }
+    kept.emplace_hint(place, tag, std::move(entry));  // of a repeated tag, the first stays
+    if (!wanted.areAll() && kept.size() == wanted.distinctCount()) {
+      break;
+    }
+  }
+
+  // The entries may have left the stream anywhere.
+  stream->setOffset(firstEntry + static_cast<long>(detail::kEntrySize) * count);
   return true;
 }
 

@@ -1,34 +1,65 @@
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 
+#include <algorithm>
+#include <array>
+
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+#include "stream/Bytes.h"
+#include "tiff/EntryPools.h"
+#include "tiff/RawEntry.h"
 
 namespace quavel {
+
+using detail::numberAt;
+using detail::RawEntry;
 
 namespace {
 
 using Value = QVTiffImageFileDirectoryEntryValue;
-using ValueList = std::vector<std::shared_ptr<Value>>;
 
 constexpr unsigned short kUndefinedCode = 7;
-constexpr std::uint32_t kValueFieldSize = 4;
 
 // The wanted entries of real files hold some hundred values at most, the longest being texts. The
 // bound keeps what a damaged count can make an entry allocate below 2 MB.
 constexpr std::uint32_t kMostValues = 65536;
 
-std::shared_ptr<ValueList> readValues(std::shared_ptr<QVStream>& stream, EntryValueType type,
-                                      std::uint32_t count) {
-  auto values = std::make_shared<ValueList>();
-  for (std::uint32_t i = 0; i < count; ++i) {
-    auto value = std::make_shared<Value>();
-    value->type = type;
-    if (!value->read(stream)) {
-      return nullptr;
-    }
-    values->push_back(std::move(value));
+// A list grows with what is really there, from a size that few real entries exceed.
+constexpr std::uint32_t kFirstListCapacity = 256;
+
+template <class Number>
+void storeNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* destination) {
+  Number const number = numberAt<Number>(bytes, isReversed);
+  std::memcpy(destination, &number, sizeof(Number));
+}
+
+/// Takes one value, whose type is set, from the bytes of a file.
+void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, Value& value) {
+  switch (size) {
+    case 1:
+      value.value[0] = bytes[0];
+      return;
+    case 2:
+      return storeNumber<std::uint16_t>(bytes, isReversed, value.value);
+    case 4:
+      return storeNumber<std::uint32_t>(bytes, isReversed, value.value);
+    default:
+      break;
   }
-  return values;
+  if (value.type == EntryValueType::DOUBLE) {
+    return storeNumber<std::uint64_t>(bytes, isReversed, value.value);
+  }
+  storeNumber<std::uint32_t>(bytes, isReversed, value.value);  // a fraction is two numbers
+  storeNumber<std::uint32_t>(bytes + 4, isReversed, value.value + 4);
+}
+
+/// How many bytes of the value field the entry makes use of.
+std::size_t usedFieldSize(RawEntry const& entry) {
+  bool const isKnown = entry.typeCode < fieldTypeToValueType.size();
+  std::uint64_t const size = entry.typeCode == kUndefinedCode || !isKnown
+                                 ? 1
+                                 : Value::sizeOfValueOfType(fieldTypeToValueType[entry.typeCode]);
+  return std::min<std::uint64_t>(entry.count * size, detail::kEntryFieldSize);
 }
 
 }  // namespace
@@ -36,52 +67,80 @@ std::shared_ptr<ValueList> readValues(std::shared_ptr<QVStream>& stream, EntryVa
 QVTiffImageFileDirectoryEntry::QVTiffImageFileDirectoryEntry() = default;
 
 bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
-  unsigned short code = 0;
-  if (!stream->readShort(&code)) {
+  RawEntry entry;
+  if (!stream->readShort(&entry.typeCode) || !stream->readLong(&entry.count)) {
     return false;
   }
-  if (code == 0 || code >= fieldTypeToValueType.size()) {
+  std::array<std::uint8_t, detail::kEntryFieldSize> field;
+  entry.field = field.data();
+  entry.fieldSize = detail::readUpTo(*stream, field.data(), usedFieldSize(entry));
+  detail::EntryPools pools;
+  return read(*stream, entry, pools);
+}
+
+bool QVTiffImageFileDirectoryEntry::read(QVStream& stream, RawEntry const& entry,
+                                         detail::EntryPools& pools) {
+  if (entry.typeCode == 0 || entry.typeCode >= fieldTypeToValueType.size()) {
     return false;
   }
-  std::uint32_t count = 0;
-  if (!stream->readLong(&count)) {
+  if (entry.fieldSize < usedFieldSize(entry)) {
     return false;
   }
-  if (code == kUndefinedCode) {
-    return readUndefined(stream, count);
+  if (entry.typeCode == kUndefinedCode) {
+    storeUndefined(entry, detail::isReversed(stream));
+    return true;
   }
-  if (count > kMostValues) {
+  if (entry.count > kMostValues) {
     return false;
   }
 
-  EntryValueType const type = fieldTypeToValueType[code];
-  if (std::uint64_t{count} * Value::sizeOfValueOfType(type) > kValueFieldSize) {
-    std::uint32_t valuesOffset = 0;
-    if (!stream->readLong(&valuesOffset)) {
-      return false;
-    }
-    stream->setOffset(valuesOffset);
-  }
-
-  auto newValues = readValues(stream, type, count);
-  if (!newValues) {
+  auto list = pools.lists.make();
+  if (!readValues(stream, entry, pools, *list)) {
     return false;
   }
-  values = std::move(newValues);
+  values = std::move(list);
   return true;
 }
 
-bool QVTiffImageFileDirectoryEntry::readUndefined(std::shared_ptr<QVStream>& stream,
-                                                  std::uint32_t count) {
-  if (count > kValueFieldSize) {
-    if (!stream->readLong(&dataOffset)) {
-      return false;
-    }
-    dataCount = count;
+void QVTiffImageFileDirectoryEntry::storeUndefined(RawEntry const& entry, bool isReversed) {
+  if (entry.count > detail::kEntryFieldSize) {
+    dataOffset = numberAt<std::uint32_t>(entry.field, isReversed);
+    dataCount = entry.count;
+    return;
+  }
+  bytes = std::make_shared<std::vector<std::uint8_t>>(entry.field, entry.field + entry.count);
+}
+
+bool QVTiffImageFileDirectoryEntry::readValues(QVStream& stream, RawEntry const& entry,
+                                               detail::EntryPools& pools, ValueList& list) {
+  EntryValueType const type = fieldTypeToValueType[entry.typeCode];
+  std::uint64_t const size = Value::sizeOfValueOfType(type);
+  bool const isReversed = detail::isReversed(stream);
+  auto const append = [&](std::uint8_t const* bytes, std::uint64_t length) {
+    pools.values.appendTo(list, length / size, [&](Value& value) {
+      value.type = type;
+      storeValue(bytes, size, isReversed, value);
+      bytes += size;
+    });
+  };
+
+  list.reserve(std::min(entry.count, kFirstListCapacity));
+  std::uint64_t left = entry.count * size;
+  if (left <= detail::kEntryFieldSize) {
+    append(entry.field, left);
     return true;
   }
-  bytes = std::make_shared<std::vector<std::uint8_t>>(count);
-  return stream->readBuffer(bytes->data(), count) == static_cast<std::int64_t>(count);
+  stream.setOffset(numberAt<std::uint32_t>(entry.field, isReversed));
+  std::array<std::uint8_t, 512> part;  // whole values of any size
+  while (left > 0) {
+    std::size_t const length = std::min<std::uint64_t>(left, part.size());
+    if (detail::readUpTo(stream, part.data(), length) < length) {
+      return false;
+    }
+    append(part.data(), length);
+    left -= length;
+  }
+  return true;
 }
 
 bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
@@ -89,11 +148,12 @@ bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
   if (!values) {
     return true;
   }
+  out.reserve(values->size());
   for (auto const& value : *values) {
     if (value->type != EntryValueType::ASCII) {
       return false;
     }
-    char const character = value->charValue();
+    char const character = static_cast<char>(value->value[0]);
     if (character == '\0') {
       return true;
     }

@@ -1,0 +1,58 @@
+#include "stream/ReadAheadStream.h"
+
+#include <algorithm>
+#include <cstring>
+#include <utility>
+
+namespace quavel::detail {
+
+ReadAheadStream::ReadAheadStream(std::shared_ptr<QVStream> source) : source_(std::move(source)) {}
+
+std::int64_t ReadAheadStream::readBuffer(std::uint8_t* destination, std::size_t count) {
+  std::size_t delivered = copyFromWindow(destination, count);
+  while (delivered < count) {
+    moveWindow();
+    std::size_t const copied = copyFromWindow(destination + delivered, count - delivered);
+    if (copied == 0) {
+      break;
+    }
+    delivered += copied;
+  }
+  return static_cast<std::int64_t>(delivered);
+}
+
+long ReadAheadStream::getOffset() { return static_cast<long>(position_ - baseOffset); }
+
+void ReadAheadStream::setOffset(long const& offset) {
+  // Unsigned, a sum out of range wraps around instead of being undefined.
+  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
+                                                static_cast<std::uint64_t>(offset));
+  if (target >= 0) {
+    position_ = target;
+  }
+}
+
+std::size_t ReadAheadStream::copyFromWindow(std::uint8_t* destination, std::size_t count) {
+  auto const skipped = static_cast<std::uint64_t>(position_ - windowStart_);
+  if (position_ < windowStart_ || skipped >= windowSize_) {
+    return 0;
+  }
+  std::size_t const copied = std::min(count, windowSize_ - skipped);
+  std::memcpy(destination, window_.data() + skipped, copied);
+  position_ += static_cast<std::int64_t>(copied);
+  return copied;
+}
+
+void ReadAheadStream::moveWindow() {
+  if (sourcePosition_ != position_) {
+    source_->setOffset(static_cast<long>(position_));
+  }
+  std::size_t const wanted = isFirstWindow_ ? kFirstWindowSize : kNextWindowSize;
+  isFirstWindow_ = false;
+  std::int64_t const delivered = source_->readBuffer(window_.data(), wanted);
+  windowStart_ = position_;
+  windowSize_ = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));
+  sourcePosition_ = position_ + static_cast<std::int64_t>(windowSize_);
+}
+
+}  // namespace quavel::detail
