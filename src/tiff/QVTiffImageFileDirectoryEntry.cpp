@@ -116,11 +116,11 @@ bool QVTiffImageFileDirectoryEntry::readValues(QVStream& stream, RawEntry const&
   EntryValueType const type = fieldTypeToValueType[entry.typeCode];
   std::uint64_t const size = Value::sizeOfValueOfType(type);
   bool const isReversed = detail::isReversed(stream);
-  auto const append = [&](std::uint8_t const* bytes, std::uint64_t length) {
+  auto const append = [&](std::uint8_t const* source, std::uint64_t length) {
     pools.values.appendTo(list, length / size, [&](Value& value) {
       value.type = type;
-      storeValue(bytes, size, isReversed, value);
-      bytes += size;
+      storeValue(source, size, isReversed, value);
+      source += size;
     });
   };
 
