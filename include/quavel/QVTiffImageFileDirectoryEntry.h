@@ -41,12 +41,9 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
 
  private:
   friend class QVTiffImageFileDirectory;
-  using ValueList = decltype(values)::element_type;
 
   bool read(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools);
   void storeUndefined(detail::RawEntry const& entry, bool isReversed);
-  static bool readValues(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools,
-                         ValueList& list);
 };
 
 }  // namespace quavel

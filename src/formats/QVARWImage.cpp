@@ -32,7 +32,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  auto const subIFDs = mainIFD->entryForTag(tag::SubIFDs);
+  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   if (!subIFDs || valueCount(subIFDs) == 0) {
     return true;
   }

@@ -15,11 +15,11 @@ namespace {
 /// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
 /// untouched. Not a single value: false.
 bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const entry = directory->entryForTag(tag);
+  auto const* const entry = findEntry(directory, tag);
   if (!entry) {
     return true;
   }
-  auto const value = singleValue(entry);
+  auto const* const value = singleValue(entry);
   if (!value) {
     return false;
   }
@@ -31,11 +31,11 @@ bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& fi
 /// another type: false.
 bool storeFraction(Directory const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
-  auto const entry = directory->entryForTag(tag);
+  auto const* const entry = findEntry(directory, tag);
   if (!entry) {
     return true;
   }
-  auto const value = singleValue(entry);
+  auto const* const value = singleValue(entry);
   if (!value || value->type != type) {
     return false;
   }
@@ -73,7 +73,7 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
 // seconds.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  if (!ifd->entryForTag(tag::ApertureValue)) {
+  if (!findEntry(ifd, tag::ApertureValue)) {
     return true;
   }
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {
@@ -84,7 +84,7 @@ bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const
 }
 
 bool QVCR3CMT2Box::storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  if (!ifd->entryForTag(tag::ShutterSpeedValue)) {
+  if (!findEntry(ifd, tag::ShutterSpeedValue)) {
     return true;
   }
   if (!storeFraction(ifd, tag::ShutterSpeedValue, EntryValueType::SRATIONAL, shutterSpeedValue)) {

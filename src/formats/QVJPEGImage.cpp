@@ -189,12 +189,12 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
 }
 
 bool QVJPEGImage::readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag = ifd->entryForTag(tag::ImageWidth) != nullptr;
+  bool const hasTiffTag = findEntry(ifd, tag::ImageWidth) != nullptr;
   return storeNumber(ifd, hasTiffTag ? tag::ImageWidth : tag::PixelXDimension, side);
 }
 
 bool QVJPEGImage::readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag = ifd->entryForTag(tag::ImageLength) != nullptr;
+  bool const hasTiffTag = findEntry(ifd, tag::ImageLength) != nullptr;
   return storeNumber(ifd, hasTiffTag ? tag::ImageLength : tag::PixelYDimension, side);
 }
 

@@ -38,7 +38,7 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  auto const subIFDs = mainIFD->entryForTag(tag::SubIFDs);
+  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   if (!subIFDs || valueCount(subIFDs) < 2) {
     return true;
   }

@@ -21,7 +21,7 @@ constexpr std::size_t kMostSubIFDs = 64;
 
 /// The first of the SubIFDs that says it is no reduced image; null when none of those examined
 /// does.
-Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& subIFDs) {
+Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry subIFDs) {
   if (!subIFDs->values) {
     return nullptr;
   }
@@ -33,11 +33,11 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& su
     if (!subIFD) {
       return nullptr;
     }
-    auto const type = subIFD->entryForTag(tag::NewSubfileType);
+    auto const* const type = findEntry(subIFD, tag::NewSubfileType);
     if (!type) {
       continue;  // one that does not say what it is, is never taken
     }
-    auto const typeValue = singleValue(type);
+    auto const* const typeValue = singleValue(type);
     if (!typeValue) {
       return nullptr;
     }
@@ -50,18 +50,18 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& su
 
 /// The directory of the full-size image; null on failure and when there is none.
 Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
-  auto const type = mainIFD->entryForTag(tag::NewSubfileType);
+  auto const* const type = findEntry(mainIFD, tag::NewSubfileType);
   if (!type) {
     return mainIFD;
   }
-  auto const typeValue = singleValue(type);
+  auto const* const typeValue = singleValue(type);
   if (!typeValue) {
     return nullptr;
   }
   if (!isReducedImage(typeValue)) {
     return mainIFD;
   }
-  auto const subIFDs = mainIFD->entryForTag(tag::SubIFDs);
+  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   return subIFDs ? readFullImageSubIFD(stream, subIFDs) : nullptr;
 }
 

@@ -44,7 +44,10 @@ constexpr ExtensionRow kExtensions[] = {
 std::shared_ptr<QVMetadata> readRecord(QVReader const& reader, std::string const& extension,
                                        std::shared_ptr<QVStream> stream) {
   auto record = reader.createMetadata(extension);
-  return record && record->read(stream) ? record : nullptr;
+  if (!record || !record->read(stream)) {
+    return nullptr;
+  }
+  return record;
 }
 
 }  // namespace

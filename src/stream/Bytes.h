@@ -1,7 +1,6 @@
 #ifndef QUAVEL_SRC_STREAM_BYTES_H
 #define QUAVEL_SRC_STREAM_BYTES_H
 
-#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
@@ -17,16 +16,33 @@ inline bool isReversed(QVStream const& stream) {
   return isKnown && stream.byteOrder != stream.hostOrder;
 }
 
+inline std::uint16_t reversed(std::uint16_t bits) { return __builtin_bswap16(bits); }
+inline std::uint32_t reversed(std::uint32_t bits) { return __builtin_bswap32(bits); }
+inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bits); }
+
+/// The unsigned integer as wide as a number, whose bytes are reversed without a look at what they
+/// mean.
+template <std::size_t kSize>
+struct BitsOf;
+template <>
+struct BitsOf<2> {
+  using Type = std::uint16_t;
+};
+template <>
+struct BitsOf<4> {
+  using Type = std::uint32_t;
+};
+template <>
+struct BitsOf<8> {
+  using Type = std::uint64_t;
+};
+
 template <class Number>
 void reverseBytes(Number* number) {
-  // By way of two arrays: compilers make one instruction of it.
-  std::array<unsigned char, sizeof(Number)> bytes;
-  std::memcpy(bytes.data(), number, sizeof(Number));
-  std::array<unsigned char, sizeof(Number)> reversed;
-  for (std::size_t i = 0; i < sizeof(Number); ++i) {
-    reversed[i] = bytes[sizeof(Number) - 1 - i];
-  }
-  std::memcpy(number, reversed.data(), sizeof(Number));
+  typename BitsOf<sizeof(Number)>::Type bits;
+  std::memcpy(&bits, number, sizeof(Number));
+  bits = reversed(bits);
+  std::memcpy(number, &bits, sizeof(Number));
 }
 
 template <class Number>

@@ -22,8 +22,10 @@ bool readNumber(QVStream& stream, Number* number) {
   if (stream.readBuffer(bytes, sizeof(Number)) != static_cast<std::int64_t>(sizeof(Number))) {
     return false;
   }
-  if (sizeof(Number) > 1 && isReversed(stream)) {
-    reverseBytes(number);
+  if constexpr (sizeof(Number) > 1) {
+    if (isReversed(stream)) {
+      reverseBytes(number);
+    }
   }
   return true;
 }

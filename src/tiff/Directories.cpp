@@ -13,8 +13,8 @@ namespace {
 
 constexpr unsigned short kTiffMagic = 42;
 
-bool storeNumberOf(Entry const& entry, std::int32_t& field) {
-  auto const value = singleValue(entry);
+bool storeNumberOf(Entry entry, std::int32_t& field) {
+  auto const* const value = singleValue(entry);
   if (!value) {
     return false;
   }
@@ -24,24 +24,32 @@ bool storeNumberOf(Entry const& entry, std::int32_t& field) {
 
 }  // namespace
 
-std::size_t valueCount(Entry const& entry) { return entry->values ? entry->values->size() : 0; }
+Entry findEntry(Directory const& directory, unsigned short tag) {
+  if (!directory->entries) {
+    return nullptr;
+  }
+  auto const found = directory->entries->find(tag);
+  return found == directory->entries->end() ? nullptr : found->second.get();
+}
 
-Value singleValue(Entry const& entry) {
-  return valueCount(entry) == 1 ? entry->values->front() : nullptr;
+std::size_t valueCount(Entry entry) { return entry->values ? entry->values->size() : 0; }
+
+Value singleValue(Entry entry) {
+  return valueCount(entry) == 1 ? entry->values->front().get() : nullptr;
 }
 
 bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const entry = directory->entryForTag(tag);
+  auto const* const entry = findEntry(directory, tag);
   return !entry || storeNumberOf(entry, field);
 }
 
 bool storeRequiredNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const entry = directory->entryForTag(tag);
+  auto const* const entry = findEntry(directory, tag);
   return entry && storeNumberOf(entry, field);
 }
 
 bool storeText(Directory const& directory, unsigned short tag, std::string& field) {
-  auto const entry = directory->entryForTag(tag);
+  auto const* const entry = findEntry(directory, tag);
   return !entry || entry->convertToString(field);
 }
 
@@ -49,7 +57,10 @@ Directory readDirectoryAt(std::shared_ptr<QVStream>& stream, std::uint32_t offse
                           std::vector<unsigned short> const& tags) {
   stream->setOffset(offset);
   auto directory = std::make_shared<QVTiffImageFileDirectory>();
-  return directory->read(stream, tags) ? directory : nullptr;
+  if (!directory->read(stream, tags)) {
+    return nullptr;
+  }
+  return directory;
 }
 
 Directory readFirstDirectory(std::shared_ptr<QVStream>& stream,
@@ -65,11 +76,11 @@ bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory
                    unsigned short pointer, std::vector<unsigned short> const& tags,
                    Directory& result) {
   result = nullptr;
-  auto const entry = directory->entryForTag(pointer);
+  auto const* const entry = findEntry(directory, pointer);
   if (!entry) {
     return true;
   }
-  auto const offset = singleValue(entry);
+  auto const* const offset = singleValue(entry);
   if (!offset) {
     return false;
   }
@@ -77,11 +88,11 @@ bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory
   return result != nullptr;
 }
 
-bool isReducedImage(Value const& newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
+bool isReducedImage(Value newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
 
 bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::int32_t& height) {
-  auto const entry = directory->entryForTag(tag::NewSubfileType);
-  auto const newSubfileType = entry ? singleValue(entry) : nullptr;
+  auto const* const entry = findEntry(directory, tag::NewSubfileType);
+  auto const* const newSubfileType = entry ? singleValue(entry) : nullptr;
   if (!newSubfileType || isReducedImage(newSubfileType)) {
     return false;
   }

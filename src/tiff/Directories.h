@@ -19,14 +19,18 @@ namespace detail {
 // The steps that all readers of directories share. What an absent entry means is the reader's.
 
 using Directory = std::shared_ptr<QVTiffImageFileDirectory>;
-using Entry = std::shared_ptr<QVTiffImageFileDirectoryEntry>;
-using Value = std::shared_ptr<QVTiffImageFileDirectoryEntryValue>;
+// Borrowed from a directory: looking at them costs no reference count.
+using Entry = QVTiffImageFileDirectoryEntry const*;
+using Value = QVTiffImageFileDirectoryEntryValue const*;
+
+/// The entry kept for the tag, or null.
+Entry findEntry(Directory const& directory, unsigned short tag);
 
 /// How many values the entry holds; an UNDEFINED entry holds none.
-std::size_t valueCount(Entry const& entry);
+std::size_t valueCount(Entry entry);
 
 /// The entry's only value; null when it holds none or several.
-Value singleValue(Entry const& entry);
+Value singleValue(Entry entry);
 
 /// Stores the tag's number. Absent: true, the field untouched. Not a single value: false.
 bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field);
@@ -52,7 +56,7 @@ bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory
                    Directory& result);
 
 /// Whether NewSubfileType's bit 0 marks a reduced-resolution version of another image.
-bool isReducedImage(Value const& newSubfileType);
+bool isReducedImage(Value newSubfileType);
 
 /// Stores the size of a directory that must describe a full-size image. False: a side or
 /// NewSubfileType is absent or not a single value, or the image is a reduced one.

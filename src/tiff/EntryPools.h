@@ -34,6 +34,8 @@ class BlockPool {
       for (std::size_t i = 0; i < run; ++i) {
         fill(*::new (first + i) T());
         ++block_->used;
+      }
+      for (std::size_t i = 0; i < run; ++i) {
         list.emplace_back(block_, first + i);
       }
       count -= run;
@@ -68,8 +70,8 @@ class BlockPool {
 struct EntryPools {
   using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
-  BlockPool<QVTiffImageFileDirectoryEntry, 8> entries;
-  BlockPool<ValueList, 8> lists;
+  BlockPool<QVTiffImageFileDirectoryEntry, 12> entries;
+  BlockPool<ValueList, 12> lists;
   BlockPool<QVTiffImageFileDirectoryEntryValue, 64> values;  // a date takes 20, a model up to 32
 };
 

@@ -26,7 +26,15 @@ class WantedTags {
 
   bool areAll() const { return tags_.empty(); }
   bool contain(unsigned short tag) const {
-    return (mask_ & bitOf(tag)) != 0 && std::find(tags_.begin(), tags_.end(), tag) != tags_.end();
+    if ((mask_ & bitOf(tag)) == 0) {
+      return false;
+    }
+    for (unsigned short const wanted : tags_) {
+      if (wanted == tag) {
+        return true;
+      }
+    }
+    return false;
   }
   /// One named twice counts once.
   std::size_t distinctCount() const { return distinctCount_; }

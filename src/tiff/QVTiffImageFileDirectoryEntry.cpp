@@ -53,74 +53,27 @@ void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, Va
   storeNumber<std::uint32_t>(bytes + 4, isReversed, value.value + 4);
 }
 
-/// How many bytes of the value field the entry makes use of.
-std::size_t usedFieldSize(RawEntry const& entry) {
-  bool const isKnown = entry.typeCode < fieldTypeToValueType.size();
-  std::uint64_t const size = entry.typeCode == kUndefinedCode || !isKnown
-                                 ? 1
-                                 : Value::sizeOfValueOfType(fieldTypeToValueType[entry.typeCode]);
-  return std::min<std::uint64_t>(entry.count * size, detail::kEntryFieldSize);
+/// How many bytes of the value field an entry makes use of.
+std::size_t usedFieldSize(std::uint64_t valueSize, std::uint32_t count) {
+  return std::min<std::uint64_t>(count * valueSize, detail::kEntryFieldSize);
 }
 
-}  // namespace
-
-QVTiffImageFileDirectoryEntry::QVTiffImageFileDirectoryEntry() = default;
-
-bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
-  RawEntry entry;
-  if (!stream->readShort(&entry.typeCode) || !stream->readLong(&entry.count)) {
-    return false;
-  }
-  std::array<std::uint8_t, detail::kEntryFieldSize> field;
-  entry.field = field.data();
-  entry.fieldSize = detail::readUpTo(*stream, field.data(), usedFieldSize(entry));
-  detail::EntryPools pools;
-  return read(*stream, entry, pools);
+/// Bytes of one value of the type; 1 where no values are read.
+std::uint64_t sizeOfType(std::uint16_t typeCode) {
+  bool const hasValues = typeCode < fieldTypeToValueType.size() && typeCode != kUndefinedCode;
+  return hasValues ? Value::sizeOfValueOfType(fieldTypeToValueType[typeCode]) : 1;
 }
 
-bool QVTiffImageFileDirectoryEntry::read(QVStream& stream, RawEntry const& entry,
-                                         detail::EntryPools& pools) {
-  if (entry.typeCode == 0 || entry.typeCode >= fieldTypeToValueType.size()) {
-    return false;
-  }
-  if (entry.fieldSize < usedFieldSize(entry)) {
-    return false;
-  }
-  if (entry.typeCode == kUndefinedCode) {
-    storeUndefined(entry, detail::isReversed(stream));
-    return true;
-  }
-  if (entry.count > kMostValues) {
-    return false;
-  }
-
-  auto list = pools.lists.make();
-  if (!readValues(stream, entry, pools, *list)) {
-    return false;
-  }
-  values = std::move(list);
-  return true;
-}
-
-void QVTiffImageFileDirectoryEntry::storeUndefined(RawEntry const& entry, bool isReversed) {
-  if (entry.count > detail::kEntryFieldSize) {
-    dataOffset = numberAt<std::uint32_t>(entry.field, isReversed);
-    dataCount = entry.count;
-    return;
-  }
-  bytes = std::make_shared<std::vector<std::uint8_t>>(entry.field, entry.field + entry.count);
-}
-
-bool QVTiffImageFileDirectoryEntry::readValues(QVStream& stream, RawEntry const& entry,
-                                               detail::EntryPools& pools, ValueList& list) {
+/// Appends the entry's values, each `size` bytes wide. False: they are not all in the data.
+bool readValues(QVStream& stream, RawEntry const& entry, std::uint64_t size,
+                detail::EntryPools& pools, detail::EntryPools::ValueList& list) {
   EntryValueType const type = fieldTypeToValueType[entry.typeCode];
-  std::uint64_t const size = Value::sizeOfValueOfType(type);
   bool const isReversed = detail::isReversed(stream);
-  auto const append = [&](std::uint8_t const* source, std::uint64_t length) {
-    pools.values.appendTo(list, length / size, [&](Value& value) {
+  auto const append = [&](std::uint8_t const* bytes, std::uint64_t length) {
+    pools.values.appendTo(list, length / size, [=](Value& value) mutable {
       value.type = type;
-      storeValue(source, size, isReversed, value);
-      source += size;
+      storeValue(bytes, size, isReversed, value);
+      bytes += size;
     });
   };
 
@@ -141,6 +94,57 @@ bool QVTiffImageFileDirectoryEntry::readValues(QVStream& stream, RawEntry const&
     left -= length;
   }
   return true;
+}
+
+}  // namespace
+
+QVTiffImageFileDirectoryEntry::QVTiffImageFileDirectoryEntry() = default;
+
+bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
+  RawEntry entry;
+  if (!stream->readShort(&entry.typeCode) || !stream->readLong(&entry.count)) {
+    return false;
+  }
+  std::array<std::uint8_t, detail::kEntryFieldSize> field;
+  entry.field = field.data();
+  entry.fieldSize = detail::readUpTo(*stream, field.data(),
+                                     usedFieldSize(sizeOfType(entry.typeCode), entry.count));
+  detail::EntryPools pools;
+  return read(*stream, entry, pools);
+}
+
+bool QVTiffImageFileDirectoryEntry::read(QVStream& stream, RawEntry const& entry,
+                                         detail::EntryPools& pools) {
+  if (entry.typeCode == 0 || entry.typeCode >= fieldTypeToValueType.size()) {
+    return false;
+  }
+  std::uint64_t const valueSize = sizeOfType(entry.typeCode);
+  if (entry.fieldSize < usedFieldSize(valueSize, entry.count)) {
+    return false;
+  }
+  if (entry.typeCode == kUndefinedCode) {
+    storeUndefined(entry, detail::isReversed(stream));
+    return true;
+  }
+  if (entry.count > kMostValues) {
+    return false;
+  }
+
+  auto list = pools.lists.make();
+  if (!readValues(stream, entry, valueSize, pools, *list)) {
+    return false;
+  }
+  values = std::move(list);
+  return true;
+}
+
+void QVTiffImageFileDirectoryEntry::storeUndefined(RawEntry const& entry, bool isReversed) {
+  if (entry.count > detail::kEntryFieldSize) {
+    dataOffset = numberAt<std::uint32_t>(entry.field, isReversed);
+    dataCount = entry.count;
+    return;
+  }
+  bytes = std::make_shared<std::vector<std::uint8_t>>(entry.field, entry.field + entry.count);
 }
 
 bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
