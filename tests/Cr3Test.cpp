@@ -8,16 +8,6 @@
 namespace quavel::test {
 namespace {
 
-/// A stream that keeps its bytes.
-struct Source {
-  explicit Source(Bytes data)
-      : bytes(std::move(data)),
-        stream(std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()),
-                                           bytes.size())) {}
-  Bytes bytes;
-  std::shared_ptr<QVStream> stream;
-};
-
 Bytes cmt1Box(ByteOrder order = kII) { return box("CMT1", tiff(order, cmt1())); }
 Bytes cmt2Box(ByteOrder order = kII) { return box("CMT2", tiff(order, cmt2())); }
 

@@ -1,41 +1,7 @@
-#include <gtest/gtest.h>
-
-#include <functional>
-
-#include "support/Fixtures.h"
+#include "support/Edits.h"
 
 namespace quavel::test {
 namespace {
-
-/// A well-made file with one edit, and what the reader makes of it.
-struct Row {
-  char const* name;
-  std::function<void(Directory&)> edit;
-  bool isRead;
-  std::string fields;
-};
-
-/// Reads each row in both byte orders with a reader of its own, and looks at the reader itself: a
-/// failed read keeps what it had stored.
-template <class Format>
-void check(Directory (*wellMade)(), std::vector<Row> const& rows,
-           std::function<Bytes(ByteOrder, Directory const&)> const& layOut = tiff) {
-  for (ByteOrder const order : kOrders) {
-    for (Row const& row : rows) {
-      SCOPED_TRACE(row.name);
-      Directory directory = wellMade();
-      row.edit(directory);
-      Bytes bytes = layOut(order, directory);
-      std::shared_ptr<QVStream> stream =
-          std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
-      Format format;
-      EXPECT_EQ(format.read(stream), row.isRead);
-      EXPECT_EQ(describe(format), row.fields);
-    }
-  }
-}
-
-void noEdit(Directory& /*file*/) {}
 
 std::string const kDates =
     "dateTimeOriginal=2021:05:01 10:00:00 dateTimeDigitized=2021:05:01 10:00:01 "
@@ -236,99 +202,6 @@ TEST(Arw, Refuses) {
        {"reduced", [](auto& f) { f.sub(kSubIFDs).set(longs(kNewSubfileType, {1})); }, false, exif},
        {"no height", [](auto& f) { f.sub(kSubIFDs).remove(kLength); }, false,
         "width=6032 " + exif}});
-}
-
-Bytes rafAroundImage(ByteOrder order, Directory const& image) {
-  return rafFile(jpegFile(tiff(order, image)), tiff(order, rafRawSection()));
-}
-
-Bytes rafAroundRawSection(ByteOrder order, Directory const& rawSection) {
-  ByteOrder const other = order == kII ? kMM : kII;
-  return rafFile(jpegFile(tiff(other, jpegExif())), tiff(order, rawSection));
-}
-
-TEST(Raf, ReadsTheImagesDirectories) {
-  std::string const size = "width=6160 height=4032 ";
-  check<QVRafImage>(
-      jpegExif,
-      {{"well made", noEdit, true, size + "orientation=6 isRaw " + kOriginal},
-       {"no Exif", [](auto& f) { f.remove(kExif); }, true, size + "orientation=6 isRaw"},
-       {"a size of its own",
-        [](auto& f) {
-          f.set(longs(kWidth, {1, 2}));
-        },
-        true, size + "orientation=6 isRaw " + kOriginal},
-       {"orientation of 2",
-        [](auto& f) {
-          f.set(shorts(kOrientation, {1, 1}));
-        },
-        false, "isRaw"},
-       {"pointer of 0", [](auto& f) { f.set(longs(kExif, {})); }, false, "orientation=6 isRaw"},
-       {"Exif beyond the end", [](auto& f) { f.set(longs(kExif, {100000})); }, false,
-        "orientation=6 isRaw"},
-       {"date in numbers", [](auto& f) { f.sub(kExif).set(shorts(kDateTimeOriginal, {1})); }, false,
-        "orientation=6 isRaw"}},
-      rafAroundImage);
-}
-
-TEST(Raf, ReadsTheRawSection) {
-  std::string const image = "orientation=6 isRaw " + kOriginal;
-  check<QVRafImage>(rafRawSection,
-                    {{"well made", noEdit, true, "width=6160 height=4032 " + image},
-                     {"width only", [](auto& f) { f.sub(kRafPointer).remove(kRafLength); }, true,
-                      "width=6160 " + image},
-                     {"no pointer", [](auto& f) { f.remove(kRafPointer); }, false, image},
-                     {"pointer of 2",
-                      [](auto& f) {
-                        f.set(longs(kRafPointer, {8, 8}));
-                      },
-                      false, image},
-                     {"vendor directory beyond the end",
-                      [](auto& f) { f.set(longs(kRafPointer, {100000})); }, false, image},
-                     {"width of 2",
-                      [](auto& f) {
-                        f.sub(kRafPointer).set(longs(kRafWidth, {1, 2}));
-                      },
-                      false, image},
-                     {"height of 2",
-                      [](auto& f) {
-                        f.sub(kRafPointer).set(longs(kRafLength, {1, 2}));
-                      },
-                      false, "width=6160 " + image}},
-                    rafAroundRawSection);
-}
-
-TEST(Raf, RefusesAnotherMagicAndAnImageThatDoesNotBeginWithExif) {
-  Bytes const rawSection = tiff(kII, rafRawSection());
-  Bytes lowerCase = rafFile(jpegFile(tiff(kII, jpegExif())), rawSection);
-  lowerCase[7] = 'm';
-  EXPECT_FALSE(readBuffer(lowerCase, "raf"));
-  Bytes jfif = jpegFile(tiff(kII, jpegExif()));
-  jfif.insert(2, segment(0xffe0, "JFIF"));
-  EXPECT_FALSE(readBuffer(rafFile(jfif, rawSection), "raf"));
-}
-
-TEST(Raf, AddsToTheImagesOffsetIn32Bits) {
-  Bytes file = "FUJIFILM" + tiff(kMM, {{shorts(kOrientation, {3})}});
-  file.resize(84);
-  file += u32(kMM, 0xfffffffc);  // the TIFF header 12 bytes on is at offset 8
-  EXPECT_FALSE(readBuffer(file, "raf"));
-  file.resize(100);
-  EXPECT_FALSE(readBuffer(file, "raf"));
-  file += u32(kMM, 104) + tiff(kII, rafRawSection());
-  EXPECT_EQ(describe(readBuffer(file, "raf")), "width=6160 height=4032 orientation=3 isRaw");
-}
-
-TEST(Raf, StoresTheSizeOfADirectoryThatHasOne) {
-  QVRafImage raf;
-  auto directory = std::make_shared<QVTiffImageFileDirectory>();
-  Bytes bytes = tiff(kMM, plainTiff());
-  std::shared_ptr<QVStream> stream =
-      std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
-  stream->setOffset(8);
-  ASSERT_TRUE(directory->read(stream, {}));
-  EXPECT_TRUE(raf.storeInfoFromMainIFD(directory));
-  EXPECT_EQ(describe(raf), "width=6000 height=4000 orientation=6");
 }
 
 }  // namespace

@@ -30,8 +30,10 @@ inline Bytes number(ByteOrder order, std::uint64_t value, int size) {
 inline Bytes u16(ByteOrder order, std::uint64_t value) { return number(order, value, 2); }
 inline Bytes u32(ByteOrder order, std::uint64_t value) { return number(order, value, 4); }
 
-enum Type : std::uint16_t { kByte = 1, kAscii, kShort, kLong, kRational, kSByte, kUndefined };
-enum MoreTypes : std::uint16_t { kSShort = 8, kSLong, kSRational, kFloat, kDouble, kIfd };
+// clang-format off
+enum Type : std::uint16_t { kByte = 1, kAscii, kShort, kLong, kRational, kSByte, kUndefined,
+                            kSShort, kSLong, kSRational, kFloat, kDouble, kIfd };
+// clang-format on
 
 struct Directory;
 
@@ -39,9 +41,9 @@ struct Directory;
 /// (a rational is two of them), out of line when they exceed 4 bytes; or one pointer for each of
 /// `subdirectories`; or `rawField` as it stands, where an entry is to lie about its values.
 struct Field {
-  std::uint16_t tag;
-  std::uint16_t type;
-  std::uint32_t count;
+  std::uint16_t tag = 0;
+  std::uint16_t type = 0;
+  std::uint32_t count = 0;
   int numberSize = 1;
   std::vector<std::int64_t> numbers = {};
   std::vector<Directory> subdirectories = {};
@@ -53,9 +55,12 @@ struct Directory {
   std::uint32_t next = 0;
 
   Field* find(std::uint16_t tag) {
-    auto const found = std::find_if(fields.begin(), fields.end(),
-                                    [&](Field const& field) { return field.tag == tag; });
-    return found == fields.end() ? nullptr : &*found;
+    for (Field& field : fields) {
+      if (field.tag == tag) {
+        return &field;
+      }
+    }
+    return nullptr;
   }
   Directory& sub(std::uint16_t tag, std::size_t index = 0) {
     return find(tag)->subdirectories.at(index);
@@ -68,11 +73,7 @@ struct Directory {
   /// Replaces the field of the same tag, or adds the field.
   void set(Field field) {
     Field* const old = find(field.tag);
-    if (old == nullptr) {
-      fields.push_back(std::move(field));
-    } else {
-      *old = std::move(field);
-    }
+    (old == nullptr ? fields.emplace_back() : *old) = std::move(field);
   }
 };
 
@@ -139,17 +140,6 @@ inline Bytes directoryAt(ByteOrder order, std::size_t start, Directory const& di
 inline Bytes tiff(ByteOrder order, Directory const& first) {
   Bytes const mark = order == ByteOrder::LittleEndian ? "II" : "MM";
   return mark + u16(order, 42) + u32(order, 8) + directoryAt(order, 8, first);
-}
-
-/// A JPEG segment: marker, length, payload.
-inline Bytes segment(std::uint16_t marker, Bytes const& payload) {
-  return u16(ByteOrder::BigEndian, marker) + u16(ByteOrder::BigEndian, payload.size() + 2) +
-         payload;
-}
-
-/// An ISO base media box: size, type, payload.
-inline Bytes box(Bytes const& type, Bytes const& payload) {
-  return u32(ByteOrder::BigEndian, payload.size() + 8) + type + payload;
 }
 
 }  // namespace quavel::test

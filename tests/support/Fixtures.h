@@ -59,6 +59,17 @@ Directory cmt2();
 constexpr unsigned kFrameWidth = 4000;
 constexpr unsigned kFrameHeight = 3000;
 
+/// A JPEG segment: marker, length, payload.
+inline Bytes segment(std::uint16_t marker, Bytes const& payload) {
+  return u16(ByteOrder::BigEndian, marker) + u16(ByteOrder::BigEndian, payload.size() + 2) +
+         payload;
+}
+
+/// An ISO base media box: size, type, payload.
+inline Bytes box(Bytes const& type, Bytes const& payload) {
+  return u32(ByteOrder::BigEndian, payload.size() + 8) + type + payload;
+}
+
 Bytes sof0(unsigned width = kFrameWidth, unsigned height = kFrameHeight);
 Bytes exifSegment(Bytes const& tiffStructure);
 /// SOI, the Exif segment and the frame header, with the start of a scan behind.
@@ -86,6 +97,18 @@ std::string describe(std::shared_ptr<QVMetadata> const& record);
 
 /// The record that the buffer gives.
 std::shared_ptr<QVMetadata> readBuffer(Bytes bytes, std::string const& extension);
+
+/// A stream that keeps its bytes.
+struct Source {
+  explicit Source(Bytes data, ByteOrder order = ByteOrder::BigEndian)
+      : bytes(std::move(data)),
+        stream(std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()),
+                                           bytes.size())) {
+    stream->byteOrder = order;
+  }
+  Bytes bytes;
+  std::shared_ptr<QVStream> stream;
+};
 
 /// A file of its own in the temporary folder, removed at the end of its life.
 class TemporaryFile {
