@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <new>
 #include <system_error>
+#include <utility>
 
 namespace app {
 
@@ -141,18 +142,18 @@ bool isPhotoExtension(std::string_view extension) {
   return false;
 }
 
-Outcome readPhoto(Input const& input) {
+Outcome readPhoto(Input input) {
   Outcome outcome;
-  outcome.path = input.path;
   outcome.error = whyUnfit(input);
+  outcome.path = std::move(input.path);
   if (!outcome.error.empty()) {
     return outcome;
   }
   try {
     errno = 0;
-    outcome.record = quavel::QVReader(input.path).metadata;
+    outcome.record = std::move(quavel::QVReader(outcome.path).metadata);
     if (!outcome.record) {
-      outcome.error = whyNoRecord(input.path, errno);
+      outcome.error = whyNoRecord(outcome.path, errno);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
