@@ -8,7 +8,7 @@ namespace app::why {
 namespace {
 
 // Some seconds at worst. Real files take some thousand reads.
-constexpr std::uint64_t kMostReads = 40'000'000;
+constexpr std::uint64_t kMostReads = 10'000'000;
 
 }  // namespace
 
