@@ -7,6 +7,7 @@
 #include <string_view>
 
 #include "Escape.h"
+#include "Interrupt.h"
 #include "Text.h"
 
 namespace app {
@@ -44,12 +45,15 @@ void Console::showProgress(std::string const& line) {
   winsize size = {};
   bool const isKnown = ::ioctl(STDERR_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
   isProgressShown_ = true;
+  interrupt::setProgressShown(true);
   write(std::string(kEraseLine) + keepStart(line, isKnown ? size.ws_col - 1U : 79U));
 }
 
 void Console::hideProgress() {
-  if (isProgressShown_.exchange(false)) {
+  if (isProgressShown_) {
     write(kEraseLine);
+    isProgressShown_ = false;
+    interrupt::setProgressShown(false);
   }
 }
 

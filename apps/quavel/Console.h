@@ -1,7 +1,6 @@
 #ifndef QUAVEL_APPS_CONSOLE_H
 #define QUAVEL_APPS_CONSOLE_H
 
-#include <atomic>
 #include <string>
 
 namespace app {
@@ -18,12 +17,11 @@ class Console {
 
   bool isTerminal() const { return isTerminal_; }
   void showProgress(std::string const& line);
-  /// From any thread.
   void hideProgress();
 
  private:
   bool isTerminal_;
-  std::atomic<bool> isProgressShown_{false};
+  bool isProgressShown_ = false;
 };
 
 }  // namespace app

@@ -1,31 +1,43 @@
 #ifndef QUAVEL_APPS_INTERRUPT_H
 #define QUAVEL_APPS_INTERRUPT_H
 
-#include <signal.h>
-
-#include <functional>
-#include <thread>
-
-namespace app {
-
 /// Ends the process at once, with status 128 + the signal's number, when the user or the system
-/// asks for it. Signals that were ignored from the start stay ignored.
-class Interrupt {
+/// asks for it. No thread waits for that: a second thread makes each system call of a reader
+/// dearer.
+namespace app::interrupt {
+
+/// Must be called once, on the thread that writes, before any other is started. Signals that are
+/// ignored then stay ignored.
+void install();
+
+/// Keeps the signals from all threads that the calling one starts while this lives.
+class Shield {
  public:
-  /// `atEnd` runs first, on a thread of its own. Must be built before any other thread.
-  explicit Interrupt(std::function<void()> atEnd);
-  ~Interrupt();
-  Interrupt(Interrupt const&) = delete;
-  Interrupt& operator=(Interrupt const&) = delete;
-
- private:
-  void wait();
-
-  std::function<void()> atEnd_;
-  sigset_t signals_;
-  std::thread thread_;
+  Shield();
+  ~Shield();
+  Shield(Shield const&) = delete;
+  Shield& operator=(Shield const&) = delete;
 };
 
-}  // namespace app
+/// What closes the output when an interrupt ends it; null for nothing. Not copied.
+void setTail(char const* tail);
+
+/// A terminal line that is to be erased at the end.
+void setProgressShown(bool isShown);
+
+/// While one lives, an interrupt waits for it: what is being written is finished first. After a
+/// second, or at a second signal, it waits no more.
+class WriteScope {
+ public:
+  WriteScope();
+  ~WriteScope();
+  WriteScope(WriteScope const&) = delete;
+  WriteScope& operator=(WriteScope const&) = delete;
+};
+
+/// Ends the process if a signal is waiting for the scope.
+void leaveIfAsked();
+
+}  // namespace app::interrupt
 
 #endif  // QUAVEL_APPS_INTERRUPT_H

@@ -7,20 +7,20 @@ namespace app {
 
 namespace {
 
-// With float as its number type the library prints the shortest digits that give the float back.
-using Json = nlohmann::basic_json<nlohmann::ordered_map, std::vector, std::string, bool,
-                                  std::int64_t, std::uint64_t, float>;
-
 struct ToJson {
-  Json operator()(std::monostate) const { return nullptr; }
-  Json operator()(float value) const {
-    return std::isinf(value) ? Json(exact(value)) : Json(value);
+  std::string operator()(std::monostate) const { return "null"; }
+  std::string operator()(bool value) const { return value ? "true" : "false"; }
+  std::string operator()(std::int32_t value) const { return std::to_string(value); }
+  std::string operator()(float value) const {
+    return std::isinf(value) ? '"' + exact(value) + '"' : exact(value);
   }
-  template <class T>
-  Json operator()(T const& value) const {
-    return value;
-  }
+  std::string operator()(std::string const& value) const { return nlohmann::json(value).dump(); }
 };
+
+void appendMember(std::string& object, Field const& field, Value const& value) {
+  object.append(object.size() == 1 ? "\"" : ",\"").append(field.name).append("\":");
+  object += std::visit(ToJson(), value);
+}
 
 Fields const& errorFields() {
   static Fields const fields = {fieldNamed("path"), fieldNamed("error")};
@@ -40,22 +40,23 @@ JsonWriter::JsonWriter(Options const& options, Output& output)
 }
 
 void JsonWriter::prepare(Outcome& outcome) const {
-  Json json = Json::object();
-  auto& members = json.get_ref<Json::object_t&>();
+  static Field const& pathBytes = *fieldNamed("pathBytes");
+  std::string object = "{";
   bool hasPath = false;
+  bool hasBytes = false;
   for (auto const* field : outcome.record ? fields_ : errorFields()) {
     Value const value = field->value(outcome);
-    hasPath = hasPath || field->name == "path";
     if (showAbsent_ || !std::holds_alternative<std::monostate>(value)) {
-      members.emplace(std::string(field->name), std::visit(ToJson(), value));
+      appendMember(object, *field, value);
     }
+    hasPath = hasPath || field->name == "path";
+    hasBytes = hasBytes || field == &pathBytes;
   }
-  static Field const& pathBytes = *fieldNamed("pathBytes");
-  Value const bytes = pathBytes.value(outcome);
-  if (hasPath && !std::holds_alternative<std::monostate>(bytes)) {
-    members.emplace(std::string(pathBytes.name), std::visit(ToJson(), bytes));
+  Value const bytes = hasPath && !hasBytes ? pathBytes.value(outcome) : Value();
+  if (!std::holds_alternative<std::monostate>(bytes)) {
+    appendMember(object, pathBytes, bytes);
   }
-  outcome.text = json.dump();
+  outcome.text = object + '}';
   outcome.record.reset();
 }
 

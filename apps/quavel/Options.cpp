@@ -1,6 +1,7 @@
 #include "Options.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <thread>
 
 #include "Escape.h"
@@ -115,7 +116,11 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
 
 void check(Options& options, Texts const& texts) {
   for (auto const& name : texts.fields) {
-    options.fields.push_back(wantedField("--fields", name));
+    auto const* const field = wantedField("--fields", name);
+    if (std::count(options.fields.begin(), options.fields.end(), field) > 0) {
+      throw CLI::ValidationError("--fields: '" + name + "' is named twice");
+    }
+    options.fields.push_back(field);
   }
   if (!texts.sort.empty()) {
     options.sort = wantedField("--sort", texts.sort);

@@ -6,34 +6,46 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cerrno>
-#include <chrono>
 #include <system_error>
-#include <utility>
 
 #include "Console.h"
+#include "Interrupt.h"
 
 namespace app {
 
 namespace {
 
-constexpr auto kPatience = std::chrono::milliseconds(200);
-
-/// 0, or the system's error.
+/// Writes all of a piece, unless an interrupt comes before any of it is out. 0, or the system's
+/// error.
 int writeAll(std::string_view bytes) {
+  bool isBegun = false;
   while (!bytes.empty()) {
     ssize_t const count = ::write(STDOUT_FILENO, bytes.data(), bytes.size());
     if (count >= 0) {
       bytes.remove_prefix(static_cast<std::size_t>(count));
+      isBegun = true;
     } else if (errno == EAGAIN) {
       pollfd waiting = {STDOUT_FILENO, POLLOUT, 0};
       ::poll(&waiting, 1, -1);
     } else if (errno != EINTR) {
       return errno;
     }
+    if (!isBegun) {
+      interrupt::leaveIfAsked();
+    }
   }
   return 0;
+}
+
+void write(std::string_view bytes) {
+  int const error = writeAll(bytes);
+  if (error == EPIPE) {
+    throw OutputClosed();
+  }
+  if (error != 0) {
+    throw std::system_error(error, std::generic_category());
+  }
 }
 
 bool isRegularFile() {
@@ -63,8 +75,8 @@ void Output::flush() {
   for (std::size_t i = 0; i < ends_.size(); ++i) {
     bool const isLast = i + 1 == ends_.size();
     if (isLast || ends_[i + 1] - begin > most) {
-      std::lock_guard<std::timed_mutex> const lock(mutex_);
-      writeLocked(all.substr(begin, ends_[i] - begin));
+      interrupt::WriteScope const scope;
+      write(all.substr(begin, ends_[i] - begin));
       begin = ends_[i];
     }
   }
@@ -72,21 +84,19 @@ void Output::flush() {
   ends_.clear();
 }
 
-void Output::enclose(std::string_view head, std::string const& tail) {
-  std::lock_guard<std::timed_mutex> const lock(mutex_);
-  writeLocked(head);
+void Output::enclose(std::string_view head, char const* tail) {
+  interrupt::WriteScope const scope;
+  write(head);
   tail_ = tail;
+  interrupt::setTail(tail);
 }
 
 void Output::finish() {
   flush();
-  std::lock_guard<std::timed_mutex> const lock(mutex_);
-  writeLocked(std::exchange(tail_, {}));
-}
-
-void Output::interrupt() {
-  if (mutex_.try_lock_for(kPatience)) {
-    writeAll(tail_);  // the lock is kept: nothing may follow
+  interrupt::WriteScope const scope;
+  interrupt::setTail(nullptr);
+  if (tail_ != nullptr) {
+    write(tail_);
   }
 }
 
@@ -94,16 +104,6 @@ std::size_t Output::terminalWidth() {
   winsize size = {};
   bool const isKnown = ::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
   return isKnown ? size.ws_col : 80;
-}
-
-void Output::writeLocked(std::string_view bytes) {
-  int const error = writeAll(bytes);
-  if (error == EPIPE) {
-    throw OutputClosed();
-  }
-  if (error != 0) {
-    throw std::system_error(error, std::generic_category());
-  }
 }
 
 }  // namespace app

@@ -1,7 +1,6 @@
 #ifndef QUAVEL_APPS_OUTPUT_H
 #define QUAVEL_APPS_OUTPUT_H
 
-#include <mutex>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -22,29 +21,23 @@ class Output {
   void add(std::string_view piece);
   /// Throws OutputClosed, or std::system_error when the output cannot be written.
   void flush();
-  /// Writes the head now, and the tail once: at `finish` or when the command is interrupted.
-  void enclose(std::string_view head, std::string const& tail);
+  /// Writes the head now, and the tail once: at `finish` or when the command is interrupted. The
+  /// tail is not copied.
+  void enclose(std::string_view head, char const* tail);
   /// Flushes and writes the tail.
   void finish();
-
-  /// From any thread: writes the tail and keeps everybody else from writing ever after. Gives up
-  /// waiting for a reader that does not read.
-  void interrupt();
 
   bool isTerminal() const { return isTerminal_; }
   /// Cells in a line of the terminal.
   static std::size_t terminalWidth();
 
  private:
-  void writeLocked(std::string_view bytes);
-
   Console& console_;
   bool isTerminal_;
   bool isFile_;
   std::string pending_;
   std::vector<std::size_t> ends_;  // of the pieces in it
-  std::timed_mutex mutex_;         // of all below, and of writing
-  std::string tail_;
+  char const* tail_ = nullptr;
 };
 
 }  // namespace app

@@ -15,7 +15,8 @@ namespace app {
 namespace {
 
 constexpr std::size_t kLargestInput = std::size_t{1} << 30;
-constexpr std::string_view kOutOfMemory = "not enough memory to read it";
+constexpr char kEmpty[] = "is empty; copy it anew from its source";
+constexpr char kOutOfMemory[] = "not enough memory to read it";
 
 std::string systemText(int error) { return std::generic_category().message(error); }
 
@@ -51,24 +52,30 @@ std::string unsupported() {
   return "has no photo's extension; give one of: " + std::string(kExtensions);
 }
 
-/// Why a regular file with a photo's extension, once read, gave no record.
-std::string whyNoRecord(std::string const& path) {
+std::string incomplete(std::string const& extension) {
+  return "is no whole ." + extension + " file: cut short, damaged or of another kind";
+}
+
+/// Why a regular file with a photo's extension gave no record. `error`: what system calls left in
+/// errno while it was read; without any, the file is not worth opening again.
+std::string whyNoRecord(std::string const& path, int error) {
+  std::string const result = incomplete(extensionOf(path)) + "; see --why";
+  struct stat status = {};
+  if (::stat(path.c_str(), &status) == 0 && status.st_size == 0) {
+    return kEmpty;
+  }
+  if (error == 0) {
+    return result;
+  }
   int const fd = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
   if (fd == -1) {
     return unopened(errno);
   }
   char byte = 0;
   ssize_t const count = ::read(fd, &byte, 1);
-  int const error = errno;
+  int const readError = errno;
   ::close(fd);
-  if (count == -1) {
-    return "cannot be read: " + systemText(error) + advice(error);
-  }
-  if (count == 0) {
-    return "is empty; copy it anew from its source";
-  }
-  return "is no whole ." + extensionOf(path) +
-         " file: damaged, cut short or of another kind; compare it with its source";
+  return count == -1 ? "cannot be read: " + systemText(readError) + advice(readError) : result;
 }
 
 /// Why the path cannot be read as a photo, or nothing.
@@ -142,9 +149,10 @@ Outcome readPhoto(Input const& input) {
     return outcome;
   }
   try {
+    errno = 0;
     outcome.record = quavel::QVReader(input.path).metadata;
     if (!outcome.record) {
-      outcome.error = whyNoRecord(input.path);
+      outcome.error = whyNoRecord(input.path, errno);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
@@ -163,10 +171,7 @@ Outcome readStandardInput(std::string const& extension) {
     auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
     outcome.record = quavel::QVReader(buffer, bytes.size(), extension).metadata;
     if (!outcome.record) {
-      outcome.error = bytes.empty() ? "is empty; send an image's bytes"
-                                    : "is no whole ." + extension +
-                                          " file: damaged, cut short or of another kind; check "
-                                          "what is sent";
+      outcome.error = bytes.empty() ? kEmpty : incomplete(extension);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;

@@ -2,6 +2,8 @@
 
 #include <system_error>
 
+#include "Interrupt.h"
+
 namespace app {
 
 Pipeline::Pipeline(unsigned jobs, Work work) : jobs_(jobs), work_(std::move(work)) {}
@@ -60,6 +62,7 @@ bool Pipeline::isOldestDone() {
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * std::size_t{jobs_}); }
 
 void Pipeline::start() {
+  interrupt::Shield const shield;
   try {
     while (threads_.size() < jobs_) {
       threads_.emplace_back([this] { runThread(); });

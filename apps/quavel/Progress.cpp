@@ -9,6 +9,7 @@
 #include <system_error>
 
 #include "Console.h"
+#include "Interrupt.h"
 #include "Source.h"
 
 namespace app {
@@ -74,6 +75,7 @@ void Progress::startCounting() {
   if (!isRereadable(options_.filesFrom)) {
     return;
   }
+  interrupt::Shield const shield;
   try {
     counter_ = std::thread([this] {
       try {

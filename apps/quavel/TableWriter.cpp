@@ -16,8 +16,8 @@ constexpr auto kPatience = std::chrono::milliseconds(200);
 constexpr std::size_t kLeastChosen = 6;
 
 std::vector<Column> defaultColumns() {
-  return {{"File", 20, 0, true},         {"Captured", 16, 1, false}, {"Size", 9, 2, false},
-          {"Orientation", 11, 4, false}, {"Camera", 12, 5, false},   {"Lens", 12, 6, false},
+  return {{"File", 20, 0, true},     {"Captured", 16, 1, false}, {"Size", 9, 2, false},
+          {"Orient.", 7, 4, false},  {"Camera", 12, 5, false},   {"Lens", 12, 6, false},
           {"Exposure", 24, 3, false}};
 }
 
@@ -25,9 +25,21 @@ std::string word(std::string_view name, Outcome const& outcome) {
   return inWords(*fieldNamed(name), outcome);
 }
 
+/// Without the seconds, for which a table has no room.
+std::string minutes(std::string const& date) {
+  bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
+  return isWellMade ? date.substr(0, 16) : date;
+}
+
+std::string withoutVerb(std::string const& orientation) {
+  constexpr std::string_view kVerb = "turn ";
+  return orientation.compare(0, kVerb.size(), kVerb) == 0 ? orientation.substr(kVerb.size())
+                                                          : orientation;
+}
+
 std::vector<std::string> defaultCells(Outcome const& outcome) {
-  return {escaped(outcome.path),           word("captureDate", outcome),
-          words::size(*outcome.record),    word("orientation", outcome),
+  return {escaped(outcome.path),           minutes(word("captureDate", outcome)),
+          words::size(*outcome.record),    withoutVerb(word("orientation", outcome)),
           word("model", outcome),          word("lensModel", outcome),
           words::exposure(*outcome.record)};
 }

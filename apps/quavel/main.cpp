@@ -5,6 +5,7 @@
 #include <exception>
 #include <new>
 #include <sstream>
+#include <string>
 #include <system_error>
 
 #include "Console.h"
@@ -56,12 +57,9 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
 int main(int argc, char** argv) {
   holdStandardStreams();
   ::signal(SIGPIPE, SIG_IGN);  // a write then tells
+  app::interrupt::install();
   app::Console console;
   app::Output output(console);
-  app::Interrupt const interrupt([&] {
-    console.hideProgress();
-    output.interrupt();
-  });
   try {
     return runOptions(app::parseOptions(argc, argv), output, console);
   } catch (app::OutputClosed const&) {
