@@ -3,6 +3,7 @@
 #include <charconv>
 #include <cmath>
 #include <type_traits>
+#include <utility>
 
 #include "Escape.h"
 #include "Text.h"
@@ -17,9 +18,9 @@ using quavel::QVMetadata;
 constexpr std::size_t kLongestCell = 200;
 
 template <class T>
-Value present(T const& value) {
+Value present(T value) {
   if constexpr (std::is_same_v<T, std::string>) {
-    return value.empty() ? Value() : Value(textAsUtf8(value));
+    return value.empty() ? Value() : Value(textAsUtf8(std::move(value)));
   } else if constexpr (std::is_same_v<T, float>) {
     return std::isnan(value) ? Value() : Value(value);
   } else if constexpr (std::is_same_v<T, std::int32_t>) {
@@ -43,7 +44,7 @@ Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 Value error(Outcome const& outcome) { return present(outcome.error); }
 
 Value pathBytes(Outcome const& outcome) {
-  if (isUtf8(outcome.path)) {
+  if (isAscii(outcome.path) || isUtf8(outcome.path)) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";

@@ -1,5 +1,6 @@
 #include "JsonWriter.h"
 
+#include <algorithm>
 #include <cmath>
 #include <nlohmann/json.hpp>
 
@@ -7,65 +8,87 @@ namespace app {
 
 namespace {
 
-struct ToJson {
-  std::string operator()(std::monostate) const { return "null"; }
-  std::string operator()(bool value) const { return value ? "true" : "false"; }
-  std::string operator()(std::int32_t value) const { return std::to_string(value); }
-  std::string operator()(float value) const {
-    return std::isinf(value) ? '"' + exact(value) + '"' : exact(value);
+// Room for a usual record: growing the text step by step would cost more than filling it.
+constexpr std::size_t kUsualObject = 700;
+
+/// Appends a value. Nearly all texts can stand between quotes as they are; the others are left to
+/// the JSON library.
+struct AppendJson {
+  std::string& json;
+
+  void operator()(std::monostate) const { json += "null"; }
+  void operator()(bool value) const { json += value ? "true" : "false"; }
+  void operator()(std::int32_t value) const { json += std::to_string(value); }
+  void operator()(float value) const {
+    bool const isNumber = std::isfinite(value);
+    json.append(isNumber ? "" : "\"").append(exact(value)).append(isNumber ? "" : "\"");
   }
-  std::string operator()(std::string const& value) const { return nlohmann::json(value).dump(); }
+  void operator()(std::string const& value) const {
+    if (std::all_of(value.begin(), value.end(), isPlain)) {
+      json.append(1, '"').append(value).append(1, '"');
+    } else {
+      json += nlohmann::json(value).dump();
+    }
+  }
+  static bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }
 };
 
-void appendMember(std::string& object, Field const& field, Value const& value) {
-  object.append(object.size() == 1 ? "\"" : ",\"").append(field.name).append("\":");
-  object += std::visit(ToJson(), value);
-}
-
-Fields const& errorFields() {
-  static Fields const fields = {fieldNamed("path"), fieldNamed("error")};
-  return fields;
+bool holds(Fields const& fields, std::string_view name) {
+  return std::find(fields.begin(), fields.end(), fieldNamed(name)) != fields.end();
 }
 
 }  // namespace
 
 JsonWriter::JsonWriter(Options const& options, Output& output)
-    : fields_(options.fields.empty() ? recordFields() : options.fields),
+    : errorMembers_(membersOf({fieldNamed("path"), fieldNamed("error")})),
+      bytesOfErrors_(membersOf({fieldNamed("pathBytes")})),
       showAbsent_(options.showAbsent.value_or(true)),
       isArray_(options.form == FormKind::Json),
       output_(output) {
+  Fields const fields = options.fields.empty() ? recordFields() : options.fields;
+  members_ = membersOf(fields);
+  if (holds(fields, "path") && !holds(fields, "pathBytes")) {
+    pathBytes_ = bytesOfErrors_;
+  }
   if (isArray_) {
     output_.enclose("[", "\n]\n");
   }
 }
 
+JsonWriter::Members JsonWriter::membersOf(Fields const& fields) {
+  Members members;
+  for (auto const* field : fields) {
+    members.push_back({field, "\"" + std::string(field->name) + "\":"});
+  }
+  return members;
+}
+
 void JsonWriter::prepare(Outcome& outcome) const {
-  static Field const& pathBytes = *fieldNamed("pathBytes");
-  std::string object = "{";
-  bool hasPath = false;
-  bool hasBytes = false;
-  for (auto const* field : outcome.record ? fields_ : errorFields()) {
-    Value const value = field->value(outcome);
-    if (showAbsent_ || !std::holds_alternative<std::monostate>(value)) {
-      appendMember(object, *field, value);
+  std::string object;
+  object.reserve(kUsualObject);
+  auto const append = [&](Members const& members, bool showAbsent) {
+    for (auto const& member : members) {
+      Value const value = member.field->value(outcome);
+      if (showAbsent || !std::holds_alternative<std::monostate>(value)) {
+        object += object.empty() ? '{' : ',';
+        object += member.name;
+        std::visit(AppendJson{object}, value);
+      }
     }
-    hasPath = hasPath || field->name == "path";
-    hasBytes = hasBytes || field == &pathBytes;
-  }
-  Value const bytes = hasPath && !hasBytes ? pathBytes.value(outcome) : Value();
-  if (!std::holds_alternative<std::monostate>(bytes)) {
-    appendMember(object, pathBytes, bytes);
-  }
-  outcome.text = object + '}';
+  };
+  append(outcome.record ? members_ : errorMembers_, showAbsent_);
+  append(outcome.record ? pathBytes_ : bytesOfErrors_, false);
+  object += object.empty() ? "{}" : "}";
+  object += isArray_ ? "" : "\n";
+  outcome.text = std::move(object);
   outcome.record.reset();
 }
 
 void JsonWriter::add(Outcome&& outcome) {
   if (isArray_) {
-    output_.add((isFirst_ ? "\n" : ",\n") + outcome.text);
-  } else {
-    output_.add(outcome.text + '\n');
+    outcome.text.insert(0, isFirst_ ? "\n" : ",\n");
   }
+  output_.add(outcome.text);
   isFirst_ = false;
 }
 

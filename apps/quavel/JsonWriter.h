@@ -17,7 +17,18 @@ class JsonWriter : public Writer {
   void end() override;
 
  private:
-  Fields fields_;
+  struct Member {
+    Field const* field;
+    std::string name;  // as JSON, with the colon
+  };
+  using Members = std::vector<Member>;
+
+  static Members membersOf(Fields const& fields);
+
+  Members members_;
+  Members errorMembers_;
+  Members bytesOfErrors_;  // pathBytes, shown where it is needed
+  Members pathBytes_;      // the same, unless the fields name it or leave out the path
   bool showAbsent_;
   bool isArray_;
   bool isFirst_ = true;

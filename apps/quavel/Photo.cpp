@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <new>
 #include <system_error>
+#include <utility>
 
 namespace app {
 
@@ -59,7 +60,7 @@ std::string incomplete(std::string const& extension) {
 /// Why a regular file with a photo's extension gave no record. `error`: what system calls left in
 /// errno while it was read; without any, the file is not worth opening again.
 std::string whyNoRecord(std::string const& path, int error) {
-  std::string const result = incomplete(extensionOf(path)) + "; see --why";
+  std::string result = incomplete(extensionOf(path)) + "; see --why";
   struct stat status = {};
   if (::stat(path.c_str(), &status) == 0 && status.st_size == 0) {
     return kEmpty;
@@ -141,18 +142,18 @@ bool isPhotoExtension(std::string_view extension) {
   return false;
 }
 
-Outcome readPhoto(Input const& input) {
+Outcome readPhoto(Input input) {
   Outcome outcome;
-  outcome.path = input.path;
   outcome.error = whyUnfit(input);
+  outcome.path = std::move(input.path);
   if (!outcome.error.empty()) {
     return outcome;
   }
   try {
     errno = 0;
-    outcome.record = quavel::QVReader(input.path).metadata;
+    outcome.record = std::move(quavel::QVReader(outcome.path).metadata);
     if (!outcome.record) {
-      outcome.error = whyNoRecord(input.path, errno);
+      outcome.error = whyNoRecord(outcome.path, errno);
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;

@@ -16,7 +16,7 @@ std::string extensionOf(std::string_view path);
 bool isPhotoExtension(std::string_view extension);
 
 /// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
-Outcome readPhoto(Input const& input);
+Outcome readPhoto(Input input);
 
 /// Reads one image from standard input, under the path "-".
 Outcome readStandardInput(std::string const& extension);

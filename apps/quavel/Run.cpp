@@ -106,8 +106,9 @@ std::unique_ptr<Batch> Runner::nextBatch(Source& source) const {
 
 void Runner::work(Batch& batch) const {
   auto const start = std::chrono::steady_clock::now();
-  for (auto const& input : batch.inputs) {
-    Outcome outcome = readPhoto(input);
+  batch.outcomes.reserve(batch.inputs.size());
+  for (auto& input : batch.inputs) {
+    Outcome outcome = readPhoto(std::move(input));
     writer_->prepare(outcome);
     batch.bytes += outcome.text.size();
     batch.outcomes.push_back(std::move(outcome));

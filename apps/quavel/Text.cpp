@@ -82,7 +82,7 @@ bool isUtf8(std::string_view text) {
   return true;
 }
 
-std::string textAsUtf8(std::string const& text) {
+std::string textAsUtf8(std::string text) {
   if (isAscii(text) || isUtf8(text)) {
     return text;
   }
