@@ -7,8 +7,8 @@ namespace app::why {
 
 namespace {
 
-// Some seconds at worst. Real files take some thousand reads.
-constexpr std::uint64_t kMostReads = 40'000'000;
+// A second or two at worst. Real files take some thousand reads.
+constexpr std::uint64_t kMostReads = 10'000'000;
 
 }  // namespace
 
@@ -57,6 +57,8 @@ void Trace::setOffset(long const& offset) {
     position_ = baseOffset + offset;
   }
 }
+
+void Trace::charge(std::uint64_t reads) { readsLeft_ -= std::min(readsLeft_, reads); }
 
 bool Trace::isOpen() const { return file_.fd != -1; }
 

@@ -27,6 +27,9 @@ class Trace : public quavel::QVStream {
   long getOffset() override;
   void setOffset(long const& offset) override;
 
+  /// Counts work that is not reading as so many reads.
+  void charge(std::uint64_t reads);
+
   bool isOpen() const;
   bool isSpent() const;
 

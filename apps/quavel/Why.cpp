@@ -67,7 +67,8 @@ void writeSteps(Walk const& walk, std::ostream& out) {
 
 void explainRefusal(Walk const& walk, std::ostream& out) {
   if (!walk.limit().empty()) {
-    out << "no record: " << walk.limit() << " (a limit on the work for one file).\n";
+    out << "no record: " << walk.limit()
+        << "; this walk gives up there, as the library may have done.\n";
   } else if (!walk.reason.empty()) {
     out << "no record: " << walk.reason << ".\n";
   } else {

@@ -9,6 +9,9 @@ namespace {
 
 constexpr std::size_t kMostSteps = 8;
 
+// What a step costs in words, as reads.
+constexpr std::uint64_t kCostOfStep = 40;
+
 // Offsets below it read the same in both notations.
 constexpr std::int64_t kFirstHexadecimal = 10;
 
@@ -51,10 +54,11 @@ bool Walk::exceed(std::string const& what) {
 }
 
 std::string Walk::limit() const {
-  return trace->isSpent() ? "it asks for millions of reads" : exceeded;
+  return trace->isSpent() ? "it asks for far more work than a photo does" : exceeded;
 }
 
 void Walk::passed(std::string const& step) {
+  trace->charge(kCostOfStep);
   if (steps.size() < kMostSteps) {
     steps.push_back(step);
   } else {
@@ -62,7 +66,10 @@ void Walk::passed(std::string const& step) {
   }
 }
 
-void Walk::absent(std::string const& field, std::string const& why) { absences[field] = why; }
+void Walk::absent(std::string const& field, std::string const& why) {
+  trace->charge(kCostOfStep);
+  absences[field] = why;
+}
 
 std::int64_t Walk::position() const { return inFile(stream->getOffset()); }
 
