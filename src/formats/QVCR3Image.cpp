@@ -16,7 +16,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
   QVCR3Box topLevelBox;
-  while (true) {
+  for (int i = 0; i < box::kMostSiblings; ++i) {
     long const boxStart = stream->getOffset();
     if (!topLevelBox.read(stream)) {
       return false;
@@ -27,6 +27,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
       return moov.read(stream) && storeInfoFromMoov(moov);
     }
   }
+  return false;
 }
 
 bool QVCR3Image::storeInfoFromMoov(QVCR3MoovBox const& moov) {

@@ -7,6 +7,13 @@
 
 namespace quavel {
 
+namespace {
+
+// Cameras write one. Each can hold many directories, and all can share the same large one.
+constexpr int kMostMetadataBoxes = 8;
+
+}  // namespace
+
 bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   long const start = stream->getOffset();
   if (!QVCR3Box::read(stream)) {
@@ -25,7 +32,12 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
   QVCR3Box child;
+  int siblings = 0;
+  int metadataBoxes = 0;
   while (stream->getOffset() < end) {
+    if (++siblings > box::kMostSiblings) {
+      return false;
+    }
     long const childStart = stream->getOffset();
     if (!child.read(stream)) {
       return false;
@@ -36,6 +48,9 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
     stream->setOffset(childStart);
     uuidBox = std::make_shared<QVCR3UUIDBox>();
     if (!uuidBox->read(stream)) {
+      return false;
+    }
+    if (uuidBox->userType == metadataUUID && ++metadataBoxes > kMostMetadataBoxes) {
       return false;
     }
   }

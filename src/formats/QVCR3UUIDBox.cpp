@@ -10,6 +10,10 @@ namespace quavel {
 
 namespace {
 
+// Cameras write one of each kind. Of a kind whose other never comes all are read, and all can lead
+// to the same large directory.
+constexpr int kMostDirectoryBoxes = 8;
+
 template <class MetadataBox>
 bool readKeptChild(std::shared_ptr<QVStream>& stream, long start,
                    std::shared_ptr<MetadataBox>& kept) {
@@ -43,7 +47,12 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
   QVCR3Box child;
+  int siblings = 0;
+  int directoryBoxes = 0;
   while (stream->getOffset() < end) {
+    if (++siblings > box::kMostSiblings) {
+      return false;
+    }
     long const childStart = stream->getOffset();
     if (!child.read(stream)) {
       return false;
@@ -51,6 +60,9 @@ bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
     unsigned int const type = child.boxHeader->type();
     if (type != box::CMT1 && type != box::CMT2) {
       continue;
+    }
+    if (++directoryBoxes > kMostDirectoryBoxes) {
+      return false;
     }
     bool const isRead = type == box::CMT1 ? readKeptChild(stream, childStart, cmt1Box)
                                           : readKeptChild(stream, childStart, cmt2Box);

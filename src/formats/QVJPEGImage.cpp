@@ -27,12 +27,22 @@ constexpr int kLargestThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
+// Files hold one, those with embedded images one for each that the walk meets. All can share the
+// same large directory, and a file has room for tens of thousands.
+constexpr int kMostExifSegments = 64;
+
+// Zeros count as a segment for every 2 bytes: 32 MB of padding stay below. Ends the walk of a file
+// of any size, holes included.
+constexpr int kMostSegments = 1 << 24;
+
 }  // namespace
 
 /// What the segments have shown so far.
 struct QVJPEGImage::Walk {
   bool sawAPP1 = false;  ///< Of any content, Exif or not.
   bool sawSOF0 = false;
+  int segments = 0;
+  int exifSegments = 0;
   unsigned short frameWidth = 0;
   unsigned short frameHeight = 0;
 };
@@ -60,7 +70,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
     if (!stream->readShort(&marker)) {
       break;
     }
-    if (!readSegment(stream, marker, walk)) {
+    if (++walk.segments > kMostSegments || !readSegment(stream, marker, walk)) {
       return false;
     }
   }
@@ -101,7 +111,8 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
   }
   if (identifier == kExifIdentifier) {
     unsigned short padding = 0;
-    if (!stream->readShort(&padding) || !readExifSegment(stream)) {
+    if (++walk.exifSegments > kMostExifSegments || !stream->readShort(&padding) ||
+        !readExifSegment(stream)) {
       return false;
     }
   }

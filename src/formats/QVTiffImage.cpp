@@ -1,5 +1,7 @@
 #include "quavel/QVTiffImage.h"
 
+#include <algorithm>
+
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectory.h"
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
@@ -13,14 +15,20 @@ using namespace detail;
 
 namespace {
 
-/// The first of the SubIFDs that says it is no reduced image; null when there is none.
+// Files hold three SubIFDs or so, one for each preview; every one that is examined can lead to the
+// same large directory again.
+constexpr std::size_t kMostSubIFDs = 64;
+
+/// The first of the SubIFDs that says it is no reduced image; null when none of those examined
+/// does.
 Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry subIFDs) {
   if (!subIFDs->values) {
     return nullptr;
   }
-  for (auto const& offset : *subIFDs->values) {
+  std::size_t const examined = std::min(subIFDs->values->size(), kMostSubIFDs);
+  for (std::size_t i = 0; i < examined; ++i) {
     auto subIFD =
-        readDirectoryAt(stream, offset->longValue(),
+        readDirectoryAt(stream, (*subIFDs->values)[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     if (!subIFD) {
       return nullptr;

@@ -1,0 +1,82 @@
+#include "CardWriter.h"
+
+#include <algorithm>
+
+#include "Escape.h"
+
+namespace app {
+
+namespace {
+
+constexpr std::size_t kLabelWidth = 17;
+
+/// What a person looks for first comes first.
+Fields cardFields() {
+  Fields fields;
+  for (auto const* name : {"captureDate",
+                           "model",
+                           "lensModel",
+                           "exposureTime",
+                           "fNumber",
+                           "iso",
+                           "focalLength",
+                           "focalLengthIn35mmFilm",
+                           "exposureBiasValue",
+                           "meteringMode",
+                           "whiteBalance",
+                           "width",
+                           "height",
+                           "orientation",
+                           "isRaw",
+                           "dateTimeOriginal",
+                           "dateTimeDigitized",
+                           "dateTime",
+                           "hasShootingInfo",
+                           "apertureValue",
+                           "shutterSpeedValue",
+                           "apexFNumber",
+                           "apexExposureTime"}) {
+    fields.push_back(fieldNamed(name));
+  }
+  return fields;
+}
+
+}  // namespace
+
+std::string cardOf(Options const& options, Outcome const& outcome) {
+  if (!outcome.record) {
+    return {};
+  }
+  static Fields const all = cardFields();
+  std::string card;
+  if (options.fields.empty()) {
+    card = escaped(outcome.path) + "\n";
+  }
+  for (auto const* field : options.fields.empty() ? all : options.fields) {
+    std::string const text = inWords(*field, outcome);
+    if (text.empty() && !options.showAbsent.value_or(false)) {
+      continue;
+    }
+    std::string label = field->label;
+    label.resize(std::max(kLabelWidth, label.size() + 1), ' ');
+    card += "  " + label + (text.empty() ? "-" : text) + "\n";
+  }
+  return card;
+}
+
+CardWriter::CardWriter(Options const& options, Output& output)
+    : options_(options), output_(output) {}
+
+void CardWriter::prepare(Outcome& outcome) const {
+  outcome.text = cardOf(options_, outcome);
+  outcome.record.reset();
+}
+
+void CardWriter::add(Outcome&& outcome) {
+  if (!outcome.text.empty()) {
+    output_.add((isFirst_ ? "" : "\n") + outcome.text);
+    isFirst_ = false;
+  }
+}
+
+}  // namespace app

@@ -1,0 +1,45 @@
+#ifndef QUAVEL_APPS_OUTPUT_H
+#define QUAVEL_APPS_OUTPUT_H
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace app {
+
+class Console;
+
+/// Thrown when whoever read the output has gone.
+struct OutputClosed {};
+
+/// Standard output. What is added in one piece stays whole, even when the command is interrupted.
+class Output {
+ public:
+  explicit Output(Console& console);
+
+  /// Holds the piece until the next `flush`.
+  void add(std::string_view piece);
+  /// Throws OutputClosed, or std::system_error when the output cannot be written.
+  void flush();
+  /// Writes the head now, and the tail once: at `finish` or when the command is interrupted. The
+  /// tail is not copied.
+  void enclose(std::string_view head, char const* tail);
+  /// Flushes and writes the tail.
+  void finish();
+
+  bool isTerminal() const { return isTerminal_; }
+  /// Cells in a line of the terminal.
+  static std::size_t terminalWidth();
+
+ private:
+  Console& console_;
+  bool isTerminal_;
+  bool isFile_;
+  std::string pending_;
+  std::vector<std::size_t> ends_;  // of the pieces in it
+  char const* tail_ = nullptr;
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_OUTPUT_H

@@ -1,0 +1,26 @@
+#ifndef QUAVEL_APPS_PHOTO_H
+#define QUAVEL_APPS_PHOTO_H
+
+#include <string>
+#include <string_view>
+
+#include "Outcome.h"
+
+namespace app {
+
+/// The extensions that name a format, separated by spaces.
+inline constexpr std::string_view kExtensions = "tiff tif dng nef cr2 raf arw jpeg jpg nrw 3fr cr3";
+
+/// What follows the last ".", in lower case; empty when there is no ".".
+std::string extensionOf(std::string_view path);
+bool isPhotoExtension(std::string_view extension);
+
+/// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
+Outcome readPhoto(Input const& input);
+
+/// Reads one image from standard input, under the path "-".
+Outcome readStandardInput(std::string const& extension);
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_PHOTO_H

@@ -1,0 +1,67 @@
+#ifndef QUAVEL_APPS_PIPELINE_H
+#define QUAVEL_APPS_PIPELINE_H
+
+#include <condition_variable>
+#include <cstddef>
+#include <deque>
+#include <exception>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <thread>
+#include <vector>
+
+#include "Outcome.h"
+
+namespace app {
+
+/// Some files that follow each other.
+struct Batch {
+  std::vector<Input> inputs;
+  std::vector<Outcome> outcomes;
+  double seconds = 0;     ///< That the work took.
+  std::size_t bytes = 0;  ///< Of the outcomes' texts.
+  bool isDone = false;
+  std::exception_ptr failure;  ///< What the work threw.
+};
+
+/// Works on batches on some threads and hands them back in the order they came in.
+class Pipeline {
+ public:
+  using Work = std::function<void(Batch&)>;
+
+  /// With one job the work is done by the caller of `submit`.
+  Pipeline(unsigned jobs, Work work);
+  /// Drops what has not begun and waits for what has.
+  ~Pipeline();
+  Pipeline(Pipeline const&) = delete;
+  Pipeline& operator=(Pipeline const&) = delete;
+
+  void submit(std::unique_ptr<Batch> batch);
+  /// The oldest batch once it is done, null when there is none; or throws what its work threw.
+  std::unique_ptr<Batch> take();
+  bool isEmpty() const { return order_.empty(); }
+  /// Enough batches are under way to keep the threads busy.
+  bool isFull() const;
+  bool isOldestDone();
+
+ private:
+  void start();
+  void workOn(Batch& batch) const;
+  void runThread();
+
+  unsigned jobs_;
+  Work work_;
+  std::vector<std::thread> threads_;
+  std::deque<std::unique_ptr<Batch>> order_;  // of the caller's thread alone
+  bool hasBegun_ = false;
+  std::mutex mutex_;
+  std::condition_variable hasWork_;
+  std::condition_variable hasDone_;
+  std::deque<Batch*> waiting_;
+  bool isEnding_ = false;
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_PIPELINE_H

@@ -1,0 +1,126 @@
+#include "Progress.h"
+
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <exception>
+#include <string>
+#include <system_error>
+
+#include "Console.h"
+#include "Interrupt.h"
+#include "Source.h"
+
+namespace app {
+
+namespace {
+
+constexpr auto kQuietStart = std::chrono::milliseconds(500);
+constexpr auto kInterval = std::chrono::milliseconds(100);
+
+double secondsSince(std::chrono::steady_clock::time_point start) {
+  return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+/// A list in a pipe can be read only once.
+bool isRereadable(std::string const& list) {
+  struct stat status = {};
+  return list.empty() || (::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode));
+}
+
+std::string rate(std::size_t files, double seconds) {
+  return std::to_string(static_cast<long>(static_cast<double>(files) / std::max(seconds, 1e-6)));
+}
+
+std::string duration(double seconds) {
+  auto const whole = static_cast<long>(seconds) + 1;
+  if (whole < 60) {
+    return std::to_string(whole) + " s";
+  }
+  return whole < 3600
+             ? std::to_string(whole / 60) + " min"
+             : std::to_string(whole / 3600) + " h " + std::to_string(whole / 60 % 60) + " min";
+}
+
+}  // namespace
+
+Progress::Progress(Console& console, Options const& options)
+    : console_(console),
+      options_(options),
+      isShown_(console.isTerminal() && !options.isQuiet && !options.fromStdin),
+      nextTick_(start_ + kQuietStart) {}
+
+Progress::~Progress() {
+  console_.hideProgress();
+  isEnding_ = true;
+  if (counter_.joinable()) {
+    counter_.join();
+  }
+}
+
+void Progress::tick() {
+  auto const now = Clock::now();
+  if (!isShown_ || now < nextTick_) {
+    return;
+  }
+  if (nextTick_ == start_ + kQuietStart) {
+    startCounting();
+  }
+  nextTick_ = now + kInterval;
+  console_.showProgress(line(secondsSince(start_)));
+}
+
+void Progress::startCounting() {
+  if (!isRereadable(options_.filesFrom)) {
+    return;
+  }
+  interrupt::Shield const shield;
+  try {
+    counter_ = std::thread([this] {
+      try {
+        Source source(options_, [](auto&&...) {});
+        Input input;
+        std::size_t count = 0;
+        while (!isEnding_ && source.next(input)) {
+          ++count;
+        }
+        total_ = count;
+      } catch (std::exception const&) {  // the total stays unknown
+      }
+    });
+  } catch (std::system_error const&) {  // likewise
+  }
+}
+
+std::string Progress::line(double seconds) const {
+  std::size_t const files = records_ + failures_;
+  std::size_t const total = total_;
+  std::string text = std::to_string(files);
+  if (total >= files && total > 0) {
+    text += " of " + std::to_string(total);
+  }
+  text += " files, " + rate(files, seconds) + " files/s";
+  if (total >= files && files > 0) {
+    text += ", " +
+            duration(seconds / static_cast<double>(files) * static_cast<double>(total - files)) +
+            " left";
+  }
+  return text;
+}
+
+void Progress::sumUp() {
+  std::size_t const files = records_ + failures_;
+  if (options_.isQuiet || (files == 1 && failures_ == 0)) {
+    return;
+  }
+  double const seconds = secondsSince(start_);
+  char time[32];
+  std::snprintf(time, sizeof time, "%.3f s", seconds);
+  console_.say(std::to_string(files) + (files == 1 ? " file, " : " files, ") +
+               std::to_string(records_) + (records_ == 1 ? " record, " : " records, ") +
+               std::to_string(failures_) + " without record, " + time + ", " +
+               rate(files, seconds) + " files/s");
+}
+
+}  // namespace app

@@ -1,0 +1,51 @@
+#ifndef QUAVEL_APPS_PROGRESS_H
+#define QUAVEL_APPS_PROGRESS_H
+
+#include <atomic>
+#include <chrono>
+#include <cstddef>
+#include <thread>
+
+#include "Options.h"
+
+namespace app {
+
+class Console;
+
+/// Counts the files, shows how far the work is once it takes long enough, and sums it up.
+class Progress {
+ public:
+  /// `options` must outlive this.
+  Progress(Console& console, Options const& options);
+  ~Progress();
+  Progress(Progress const&) = delete;
+  Progress& operator=(Progress const&) = delete;
+
+  void count(bool hasRecord) { ++(hasRecord ? records_ : failures_); }
+  /// Shows the line when it is time to.
+  void tick();
+  void sumUp();
+
+  std::size_t failures() const { return failures_; }
+
+ private:
+  using Clock = std::chrono::steady_clock;
+
+  void startCounting();
+  std::string line(double seconds) const;
+
+  Console& console_;
+  Options const& options_;
+  bool isShown_;
+  Clock::time_point start_ = Clock::now();
+  Clock::time_point nextTick_;
+  std::size_t records_ = 0;
+  std::size_t failures_ = 0;
+  std::thread counter_;
+  std::atomic<bool> isEnding_{false};
+  std::atomic<std::size_t> total_{0};  // 0 until it is known
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_PROGRESS_H

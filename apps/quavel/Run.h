@@ -1,0 +1,16 @@
+#ifndef QUAVEL_APPS_RUN_H
+#define QUAVEL_APPS_RUN_H
+
+#include "Console.h"
+#include "Options.h"
+#include "Output.h"
+
+namespace app {
+
+/// Reads what the options ask for and writes it. Gives the exit status. Throws OutputClosed, or
+/// std::system_error when the output cannot be written.
+int run(Options const& options, Output& output, Console& console);
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_RUN_H

@@ -1,0 +1,59 @@
+#include "Source.h"
+
+#include <sys/stat.h>
+
+#include <system_error>
+
+namespace app {
+
+Source::Source(Options const& options, Report report)
+    : options_(options), report_(std::move(report)) {
+  if (!options.filesFrom.empty()) {
+    list_.emplace(options.filesFrom, options.isNulSeparated ? '\0' : '\n');
+  }
+}
+
+bool Source::isReady() {
+  return walk_ || nextPath_ < options_.paths.size() || !list_ || list_->isReady();
+}
+
+bool Source::next(Input& input) { return nextOfPaths(input) || nextOfList(input); }
+
+bool Source::nextOfPaths(Input& input) {
+  while (walk_ || nextPath_ < options_.paths.size()) {
+    if (walk_) {
+      if (walk_->next(input)) {
+        return true;
+      }
+      walk_.reset();
+      continue;
+    }
+    std::string const& path = options_.paths[nextPath_++];
+    struct stat status = {};
+    bool const exists = ::stat(path.c_str(), &status) == 0;
+    if (exists && S_ISDIR(status.st_mode)) {
+      walk_.emplace(path, report_);
+      continue;
+    }
+    input = {path, exists && S_ISREG(status.st_mode), {}};
+    return true;
+  }
+  return false;
+}
+
+bool Source::nextOfList(Input& input) {
+  if (!list_) {
+    return false;
+  }
+  if (list_->next(input)) {
+    return true;
+  }
+  if (list_->error != 0) {
+    report_(options_.filesFrom,
+            "the list cannot be read on: " + std::generic_category().message(list_->error), true);
+  }
+  list_.reset();
+  return false;
+}
+
+}  // namespace app

@@ -1,0 +1,42 @@
+#ifndef QUAVEL_APPS_TABLEWRITER_H
+#define QUAVEL_APPS_TABLEWRITER_H
+
+#include <chrono>
+
+#include "Layout.h"
+#include "Writer.h"
+
+namespace app {
+
+/// A table for people, laid out page by page so that no more than a page is ever held. On a
+/// terminal it fits the width; elsewhere nothing is cut. A single file becomes a card.
+class TableWriter : public Writer {
+ public:
+  TableWriter(Options const& options, Output& output);
+
+  void prepare(Outcome& outcome) const override;
+  void add(Outcome&& outcome) override;
+  void pause() override;
+  void end() override;
+
+ private:
+  std::vector<std::string> cellsOf(Outcome const& outcome) const;
+  void writePage();
+  Widths naturalWidths() const;
+  void useLayout(Widths const& natural);
+
+  Options const& options_;
+  Output& output_;
+  std::vector<Column> columns_;
+  std::vector<std::vector<std::string>> page_;
+  std::chrono::steady_clock::time_point pageStart_;
+  std::size_t files_ = 0;
+  std::string card_;  // of the first file
+  std::size_t line_ = 0;
+  Widths natural_;  // of the layout in use
+  Widths widths_;
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_TABLEWRITER_H

@@ -1,0 +1,156 @@
+#include "Text.h"
+
+#include <locale.h>
+#include <wchar.h>
+
+#include <algorithm>
+
+namespace app {
+
+namespace {
+
+/// Makes the C library's multibyte functions mean UTF-8 on this thread, whatever the user's locale.
+class Utf8Scope {
+ public:
+  Utf8Scope() : previous_(::uselocale(utf8())) {}
+  ~Utf8Scope() { ::uselocale(previous_); }
+  Utf8Scope(Utf8Scope const&) = delete;
+  Utf8Scope& operator=(Utf8Scope const&) = delete;
+
+ private:
+  static locale_t utf8() {
+    static locale_t const locale = ::newlocale(LC_CTYPE_MASK, "C.UTF-8", nullptr);
+    return locale;
+  }
+
+  locale_t previous_;
+};
+
+constexpr std::string_view kEllipsis = "…";
+
+std::size_t cellsOf(Character const& character) {
+  Utf8Scope const scope;
+  int const width = ::wcwidth(character.code);
+  return width < 0 ? 1 : static_cast<std::size_t>(width);
+}
+
+/// Bytes at the start of `text` that fit the cells.
+std::size_t fittingBytes(std::string_view text, std::size_t width) {
+  std::size_t bytes = 0;
+  std::size_t used = 0;
+  while (bytes < text.size()) {
+    Character const next = firstCharacter(text.substr(bytes));
+    used += cellsOf(next);
+    if (used > width) {
+      break;
+    }
+    bytes += next.length;
+  }
+  return bytes;
+}
+
+}  // namespace
+
+Character firstCharacter(std::string_view text) {
+  auto const byte = static_cast<unsigned char>(text.front());
+  if (byte < 0x80) {
+    return {static_cast<wchar_t>(byte), 1, true};
+  }
+  Utf8Scope const scope;
+  std::mbstate_t state = {};
+  wchar_t code = 0;
+  std::size_t const length = std::mbrtowc(&code, text.data(), text.size(), &state);
+  if (length > text.size()) {  // invalid or incomplete: both are the largest numbers
+    return {static_cast<wchar_t>(byte), 1, false};
+  }
+  return {code, length, true};
+}
+
+bool isAscii(std::string_view text) {
+  return std::all_of(text.begin(), text.end(),
+                     [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+}
+
+bool isUtf8(std::string_view text) {
+  while (!text.empty()) {
+    Character const next = firstCharacter(text);
+    if (!next.isValid) {
+      return false;
+    }
+    text.remove_prefix(next.length);
+  }
+  return true;
+}
+
+std::string textAsUtf8(std::string const& text) {
+  if (isAscii(text) || isUtf8(text)) {
+    return text;
+  }
+  std::string utf8;
+  for (char const c : text) {
+    auto const byte = static_cast<unsigned char>(c);
+    if (byte < 0x80) {
+      utf8 += c;
+      continue;
+    }
+    utf8 += static_cast<char>(0xc0 | byte >> 6);
+    utf8 += static_cast<char>(0x80 | (byte & 0x3f));
+  }
+  return utf8;
+}
+
+std::string pathAsUtf8(std::string const& path) {
+  if (isAscii(path)) {
+    return path;
+  }
+  std::string utf8;
+  for (std::string_view rest = path; !rest.empty();) {
+    Character const next = firstCharacter(rest);
+    utf8 += next.isValid ? rest.substr(0, next.length) : "\xef\xbf\xbd";
+    rest.remove_prefix(next.length);
+  }
+  return utf8;
+}
+
+std::size_t cells(std::string_view text) {
+  if (isAscii(text)) {
+    return text.size();
+  }
+  std::size_t sum = 0;
+  while (!text.empty()) {
+    Character const next = firstCharacter(text);
+    sum += cellsOf(next);
+    text.remove_prefix(next.length);
+  }
+  return sum;
+}
+
+std::string keepStart(std::string const& text, std::size_t width) {
+  if (cells(text) <= width) {
+    return text;
+  }
+  if (width == 0) {
+    return {};
+  }
+  return text.substr(0, fittingBytes(text, width - 1)).append(kEllipsis);
+}
+
+std::string keepEnd(std::string const& text, std::size_t width) {
+  std::size_t const all = cells(text);
+  if (all <= width) {
+    return text;
+  }
+  if (width == 0) {
+    return {};
+  }
+  std::size_t dropped = 0;
+  std::size_t left = all;
+  while (left > width - 1) {
+    Character const next = firstCharacter(std::string_view(text).substr(dropped));
+    left -= cellsOf(next);
+    dropped += next.length;
+  }
+  return std::string(kEllipsis) + text.substr(dropped);
+}
+
+}  // namespace app

@@ -1,0 +1,76 @@
+#include "Writer.h"
+
+#include <algorithm>
+
+#include "CardWriter.h"
+#include "CsvWriter.h"
+#include "JsonWriter.h"
+#include "TableWriter.h"
+
+namespace app {
+
+namespace {
+
+bool isAbsent(Value const& value) { return std::holds_alternative<std::monostate>(value); }
+
+/// Keeps all outcomes and hands them to another writer in the order of a field.
+class SortingWriter : public Writer {
+ public:
+  SortingWriter(Field const& field, std::unique_ptr<Writer> next)
+      : field_(field), next_(std::move(next)) {}
+
+  void prepare(Outcome&) const override {}
+  void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
+  void end() override;
+
+ private:
+  Field const& field_;
+  std::unique_ptr<Writer> next_;
+  std::vector<Outcome> outcomes_;
+};
+
+void SortingWriter::end() {
+  auto const value = field_.value;
+  std::stable_sort(outcomes_.begin(), outcomes_.end(), [value](Outcome const& a, Outcome const& b) {
+    Value const left = value(a);
+    Value const right = value(b);
+    if (isAbsent(left) || isAbsent(right)) {
+      return !isAbsent(left) && isAbsent(right);  // what has no value comes last
+    }
+    return left < right;
+  });
+  for (auto& outcome : outcomes_) {
+    next_->prepare(outcome);
+    next_->add(std::move(outcome));
+    outcome = {};
+  }
+  next_->end();
+}
+
+std::unique_ptr<Writer> makeForm(Options const& options, Output& output) {
+  switch (options.form) {
+    case FormKind::Json:
+    case FormKind::Jsonl:
+      return std::make_unique<JsonWriter>(options, output);
+    case FormKind::Csv:
+      return std::make_unique<CsvWriter>(options, output);
+    case FormKind::Card:
+      return std::make_unique<CardWriter>(options, output);
+    default:
+      return std::make_unique<TableWriter>(options, output);
+  }
+}
+
+}  // namespace
+
+Writer::~Writer() = default;
+
+std::unique_ptr<Writer> makeWriter(Options const& options, Output& output) {
+  auto form = makeForm(options, output);
+  if (options.sort == nullptr) {
+    return form;
+  }
+  return std::make_unique<SortingWriter>(*options.sort, std::move(form));
+}
+
+}  // namespace app

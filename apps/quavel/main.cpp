@@ -1,0 +1,76 @@
+#include <fcntl.h>
+#include <signal.h>
+#include <unistd.h>
+
+#include <exception>
+#include <new>
+#include <sstream>
+#include <string>
+#include <system_error>
+
+#include "Console.h"
+#include "Interrupt.h"
+#include "Options.h"
+#include "Output.h"
+#include "Run.h"
+#include "Why.h"
+
+namespace {
+
+/// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
+/// under their numbers.
+void holdStandardStreams() {
+  int fd = 0;
+  do {
+    fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
+  } while (0 <= fd && fd <= STDERR_FILENO);
+  if (fd > STDERR_FILENO) {
+    ::close(fd);
+  }
+}
+
+int explain(std::string const& path, app::Output& output) {
+  std::ostringstream text;
+  bool const hasRecord = app::explainFile(path, text);
+  output.add(text.str());
+  output.flush();
+  return hasRecord ? app::kSuccess : app::kSomeFailed;
+}
+
+int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
+  if (!parsed.status && !parsed.options.why.empty()) {
+    return explain(parsed.options.why, output);
+  }
+  if (!parsed.status) {
+    return app::run(parsed.options, output, console);
+  }
+  output.add(parsed.output);
+  output.flush();
+  if (!parsed.error.empty()) {
+    console.say(parsed.error);
+  }
+  return *parsed.status;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  holdStandardStreams();
+  ::signal(SIGPIPE, SIG_IGN);  // a write then tells
+  app::interrupt::install();
+  app::Console console;
+  app::Output output(console);
+  try {
+    return runOptions(app::parseOptions(argc, argv), output, console);
+  } catch (app::OutputClosed const&) {
+    return app::kSuccess;  // whoever read the output has seen enough
+  } catch (std::system_error const& error) {
+    console.say("the output cannot be written: " + error.code().message() +
+                "; it ends early. Check the disk or where the output goes");
+  } catch (std::bad_alloc const&) {
+    console.say("not enough memory; leave out --sort, or name fewer files at a time");
+  } catch (std::exception const& error) {
+    console.say(std::string("unexpected: ") + error.what());
+  }
+  return app::kSomeFailed;
+}

@@ -1,0 +1,200 @@
+"""quavel --why: the reason it names is the one the file was built to have."""
+
+import json
+import os
+import struct
+import subprocess
+import tempfile
+import unittest
+from pathlib import Path
+
+COMMAND = os.environ["QUAVEL_COMMAND"]
+SAMPLES = os.environ.get("QUAVEL_SAMPLES")
+
+WIDTH, HEIGHT, SUBFILE, MODEL, DATE, SUBIFDS, EXIF = (
+    0x100, 0x101, 0xFE, 0x110, 0x132, 0x14A, 0x8769)
+ORIGINAL, FOCAL, PIXEL_X = 0x9003, 0x920A, 0xA002
+ASCII, SHORT, LONG, RATIONAL, UNDEFINED, SRATIONAL = 2, 3, 4, 5, 7, 10
+
+
+def entry(tag, kind, count, value):
+    """A little-endian entry; a SHORT in the value field reads the same as a LONG there."""
+    return struct.pack("<HHII", tag, kind, count, value)
+
+
+def number(tag, value):
+    return entry(tag, LONG, 1, value)
+
+
+def directory(*entries):
+    return struct.pack("<H", len(entries)) + b"".join(entries) + bytes(4)
+
+
+def tiff(*entries):
+    return b"II*\0\x08\0\0\0" + directory(*entries)
+
+
+def segment(marker, payload):
+    return struct.pack(">HH", marker, len(payload) + 2) + payload
+
+
+def box(kind, payload):
+    return struct.pack(">I4s", len(payload) + 8, kind) + payload
+
+
+def cr3(*children):
+    identifier = bytes.fromhex("85c0b687820f11e08111f4ce462b6a48")
+    return box(b"ftyp", b"crx ") + box(b"moov", box(b"uuid", identifier + b"".join(children)))
+
+
+def raf(image, section):
+    header = b"FUJIFILM".ljust(84, b"\0") + struct.pack(">I", 104)
+    header = header.ljust(100, b"\0") + struct.pack(">I", 116 + len(image))
+    return header + bytes(12) + image + section
+
+
+NEF_SIZE = (number(WIDTH, 160), number(HEIGHT, 120))
+FULL = directory(number(WIDTH, 6000), number(HEIGHT, 4000), number(SUBFILE, 0))
+
+# Extension, bytes, and what the verdict must say.
+REFUSED = [
+    ("tif", b"II+\0" + bytes(12), "TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF"),
+    ("dng", b"PK\3\4" + bytes(12), "TIFF header at 0 begins with 50 4b, not with 49 49"),
+    ("cr2", b"II*\0\x08\0", "TIFF header at 0: 4 bytes wanted at 4, but the file ends at 6"),
+    ("tif", tiff(number(WIDTH, 1))[:-4], "offset of the next directory, behind the 1 entries of "
+     "IFD0 at 8: 4 bytes wanted at 0x16 (22), but the file ends at 0x16 (22)"),
+    ("tif", tiff(number(1, 1), number(2, 2))[:23], "entry 2 of 2 of IFD0 at 8: 2 bytes wanted at "
+     "0x16 (22), but"),
+    ("tif", tiff(entry(WIDTH, 99, 1, 1)), "0x0100 ImageWidth at 0xa (10) in IFD0: field type 99"),
+    ("tif", tiff(entry(WIDTH, SHORT, 65537, 0)), "it declares 65537 SHORT values; more than 65536"),
+    ("tif", tiff(entry(WIDTH, UNDEFINED, 1, 0)), "in IFD0 is of type UNDEFINED; one number wanted"),
+    ("tif", tiff(entry(DATE, ASCII, 20, 912345)), "0x0132 DateTime at 0xa (10) in IFD0: its 20 "
+     "ASCII values would begin at 0xdebd9 (912345) and end at 0xdebed (912365), but the file ends"),
+    ("tif", tiff(number(DATE, 7)), "0x0132 DateTime at 0xa (10) in IFD0 holds 1 LONG value; ASCII"),
+    ("3fr", tiff(number(SUBFILE, 1)), "declares a reduced image (NewSubfileType bit 0) and names"),
+    ("nrw", tiff(number(SUBFILE, 1), number(SUBIFDS, 38)) + directory(number(SUBFILE, 1)),
+     "and none of its 1 SubIFDs says that it is the full image"),
+    ("nef", tiff(number(WIDTH, 6000), number(HEIGHT, 4000)), "IFD0 at 8 declares 6000 x 4000; a "
+     "NEF's first directory must be 160 x 120"),
+    ("nef", tiff(NEF_SIZE[0]), "no 0x0101 ImageLength in IFD0 at 8; a NEF's first directory"),
+    ("nef", tiff(*NEF_SIZE, entry(EXIF, LONG, 2, 8)), "in IFD0 holds 2 LONG values; exactly one"),
+    ("arw", tiff(number(SUBIFDS, 9999), number(EXIF, 38)) + directory(), "count of SubIFD 1 of 1"
+     " at 0x270f (9999): 2 bytes wanted"),
+    ("arw", tiff(number(SUBIFDS, 44), number(EXIF, 38)) + directory() + directory(
+        number(SUBFILE, 1)), "SubIFD 1 of 1 at 0x2c (44) declares a reduced image (NewSub"),
+    ("jpg", box(b"ftyp", b"heic"), "the file begins with 00 00, not with ff d8"),
+    ("jpg", b"\xff\xd8" + segment(0xFFE1, b"Exif\0\0\xff\xff"), "TIFF header of the Exif segment "
+     "at 0xc (12) begins with ff ff"),
+    ("jpg", b"\xff\xd8" + segment(0xFFE1, b"Exif\0\0" + tiff(number(EXIF, 26)) + directory(
+        entry(PIXEL_X, SHORT, 2, 0))), "0xa002 PixelXDimension at 0x28 (40) in the Exif IFD holds"),
+    ("jpeg", b"\xff\xd8\xff\xdb\0", "the length of the segment 0xffdb at 2: 2 bytes wanted at 4"),
+    ("raf", b"FUJIFILN" + bytes(99), "the file begins with 46 55 4a 49 46 49 4c 4e, not with"),
+    ("raf", raf(tiff(), b"no"), "TIFF header of the raw section at 0x82 (130) begins with 6e 6f"),
+    ("raf", raf(tiff(), tiff()), "no 0xf000 (the vendor directory) in IFD0 of the raw section"),
+    ("cr3", box(b"ftyp", b"crx "), "the header of the next box before a moov box was met: 4 bytes "
+     "wanted at 0xc (12)"),
+    ("cr3", b"\0\0\0\1mdat" + bytes(8), "the mdat box at 0 before a moov box was met has size 1;"),
+    ("cr3", cr3(box(b"CMT3", b"")), "uuid box at 0x14 (20) has neither a CMT1 nor a CMT2 box"),
+    ("cr3", cr3(box(b"CMT1", tiff()), b"\0\0\0\x07free"), "the free box at 0x42 (66) in the "
+     "metadata uuid box at 0x14 (20) has size 7"),
+    ("cr3", box(b"moov", box(b"uuid", bytes(16))), "identifier is another one"),
+    ("cr3", cr3(box(b"CMT2", tiff(entry(FOCAL, SRATIONAL, 1, 26)) + bytes(8))), "0x920a Focal"
+     "Length at 0x3e (62) in IFD0 of the CMT2 box holds 1 SRATIONAL value; 1 RATIONAL value"),
+]
+
+# Extension, bytes, and a line of the explanation.
+ACCEPTED = [
+    ("nef", tiff(*NEF_SIZE), "absent: width, height: IFD0 at 8 names 0 SubIFDs (0x014a)"),
+    ("nef", tiff(*NEF_SIZE), "dateTimeOriginal: no 0x8769 ExifIFDPointer in IFD0 at 8"),
+    ("nef", tiff(*NEF_SIZE), "dateTimeDigitized, dateTime: never taken from NEF files"),
+    ("arw", tiff(number(SUBIFDS, 26)) + FULL, "width, height: no 0x8769 ExifIFDPointer"),
+    ("tif", tiff(entry(DATE, ASCII, 1, 0)), "dateTime: 0x0132 DateTime at 0xa (10) in IFD0 holds"),
+    ("jpg", b"\xff\xd8" + segment(0xFFC2, bytes(9)), "The frame at 2 is progressive (SOF2)"),
+    ("cr3", cr3(box(b"CMT1", tiff())), "fNumber: no CMT2 box in the metadata uuid box at 0x14"),
+    ("cr3", cr3(box(b"CMT2", tiff(entry(FOCAL, RATIONAL, 1, 26)) + bytes(8))),
+     "focalLength: 0x920a FocalLength at 0x3e (62) in IFD0 of the CMT2 box is 0/0"),
+]
+
+SAMPLE_REASONS = {
+    "arw-03.arw": "the entry count of SubIFD 1 of 1",
+    "cr3-04.cr3": "the header of the next box in the metadata uuid box",
+    "dng-04.dng": "0x0132 DateTime at 0xe6 (230) in IFD0: its 20 ASCII values would begin at",
+    "dng-05.dng": "magic 43, not 42",
+    "jpg-08.jpg": "0xa002 PixelXDimension at 0x1e4 (484) in the Exif IFD holds 2 SHORT values",
+    "jpg-09.jpg": "the TIFF header of the Exif segment at 0xc (12) begins with ff ff",
+    "jpg-11.jpg": "not with ff d8 (SOI)",
+    "nef-02.nef": "IFD0 at 8 declares 160 x 106",
+    "nef-03.nef": "entry 11 of 28 of IFD0 at 8",
+    "raf-01.raf": "the TIFF header of the raw section",
+    "raf-02.raf": "the TIFF header of the raw section",
+    "tif-01.tif": "the offset of the next directory, behind the 15 entries of IFD0",
+    "tif-04.tif": "magic 43, not 42",
+    "tiff-02.tiff": "magic 43, not 42",
+}
+
+
+class WhyTest(unittest.TestCase):
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.folder = Path(folder.name)
+
+    def why(self, path):
+        done = subprocess.run([COMMAND, "--why", path], capture_output=True, text=True, timeout=60)
+        self.assertEqual(done.stderr, "")
+        self.assertLessEqual(len(done.stdout.splitlines()), 24)
+        self.assertRegex(done.stdout, r"\A[^\x00-\x09\x0b-\x1f\x7f]*\Z")
+        for doubt in ("would have refused", "found nothing wrong", "did not find"):
+            self.assertNotIn(doubt, done.stdout)
+        return done.returncode, done.stdout
+
+    def write(self, name, content):
+        path = self.folder / name
+        path.write_bytes(content)
+        return path
+
+    def test_names_the_step_that_failed(self):
+        for extension, content, reason in REFUSED:
+            with self.subTest(reason):
+                status, text = self.why(self.write("x." + extension, content))
+                self.assertEqual(status, 1)
+                self.assertIn("no record: ", text.splitlines()[0])
+                self.assertIn(reason, text.splitlines()[0])
+
+    def test_tells_why_fields_are_absent(self):
+        for extension, content, line in ACCEPTED:
+            with self.subTest(line):
+                status, text = self.why(self.write("x." + extension, content))
+                self.assertEqual(status, 0)
+                self.assertIn(line, text)
+
+    def test_says_what_the_content_looks_like(self):
+        text = self.why(self.write("x.jpg", box(b"ftyp", b"he\x1bc")))[1]
+        self.assertIn(r'looks like an ISO base media file of brand "he\x1bc"', text)
+
+    def test_opens_nothing_but_photos(self):
+        os.mkfifo(self.folder / "pipe.nef")
+        self.write("empty.nef", b"")
+        self.write("x.txt", b"II*")
+        for name, reason in (
+                ("none.nef", "No such file"), ("pipe.nef", "FIFO"), ("", "is a folder"),
+                ("x.txt", "tiff tif dng nef cr2 raf arw jpeg jpg nrw 3fr cr3"),
+                ("empty.nef", "is empty")):
+            with self.subTest(name):
+                status, text = self.why(self.folder / name)
+                self.assertEqual(status, 1)
+                self.assertIn(reason, text)
+
+    @unittest.skipUnless(SAMPLES, "QUAVEL_SAMPLES is not set")
+    def test_names_the_reasons_of_real_files(self):
+        for line in (Path(SAMPLES) / "expected.ndjson").read_text().splitlines():
+            sample = json.loads(line)
+            with self.subTest(sample["file"]):
+                status, text = self.why(Path(SAMPLES) / sample["file"])
+                self.assertEqual(status, 1 if sample["expected"] is None else 0)
+                if status == 1:
+                    self.assertIn(SAMPLE_REASONS[sample["file"]], text.splitlines()[0])
+
+
+if __name__ == "__main__":
+    unittest.main()
