@@ -79,6 +79,18 @@ TEST(Limit, StepsOver65536BoxesSideBySide) {
   }
 }
 
+TEST(Limit, ReadsAMillionValuesOfOneDirectory) {
+  for (std::size_t const entries : {16U, 17U}) {
+    Directory const directory = {std::vector<Field>(entries, claim(1, kByte, 65536, 8))};
+    Bytes bytes = tiff(kII, directory) + Bytes(65536, '\0');
+    auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+    std::shared_ptr<QVStream> stream = std::make_shared<QVMStream>(data, bytes.size());
+    stream->byteOrder = kII;
+    stream->setOffset(8);
+    EXPECT_EQ(QVTiffImageFileDirectory().read(stream, {}), entries == 16);
+  }
+}
+
 // What an entry or a value costs is the stream's business: these files have 300 of each in every
 // directory, and no directory is read more often than its limit says.
 TEST(Limit, BoundsTheReadsOfRepeatedDirectories) {

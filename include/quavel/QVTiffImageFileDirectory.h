@@ -21,7 +21,8 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
   /// Reads the directory at the stream's position, parsing the listed tags alone and only until
   /// each was met once; an empty list wants every entry. Of a repeated tag the first entry counts.
   /// False: the entry count, a tag, a wanted entry or the next directory's offset cannot be read;
-  /// only in the last case are the new `entries` kept.
+  /// only in the last case are the new `entries` kept. False too: the entries parsed hold more than
+  /// 1048576 values, which the tags of no reader can.
   bool read(std::shared_ptr<QVStream>& stream, std::vector<unsigned short> const& tags);
 
   /// The entry kept for `tag`, or null.

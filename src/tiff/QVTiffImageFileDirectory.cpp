@@ -13,6 +13,10 @@ namespace quavel {
 
 namespace {
 
+// Sixteen full lists: more than any reader's tags can hold, and far more than a real directory
+// does. It bounds what the same few bytes, listed by each of 65535 entries, cost one who wants all.
+constexpr std::size_t kMostValues = std::size_t{1} << 20U;
+
 /// The tags that a directory's reader wants; none listed means all.
 class WantedTags {
  public:
@@ -140,6 +144,7 @@ bool QVTiffImageFileDirectory::readEntries(std::shared_ptr<QVStream>& stream, un
   WantedTags const wanted(tags);
   long const firstEntry = stream->getOffset();
 
+  std::size_t valuesRead = 0;
   EntryReader entryReader(*stream, firstEntry, count);
   for (unsigned short i = 0; i < count; ++i) {
     if (!entryReader.moveTo(i)) {
@@ -158,6 +163,10 @@ bool QVTiffImageFileDirectory::readEntries(std::shared_ptr<QVStream>& stream, un
     detail::RawEntry rawEntry;
     auto entry = pools.entries.make();
     if (!entryReader.readRest(&rawEntry) || !entry->read(*stream, rawEntry, pools)) {
+      return false;
+    }
+    valuesRead += entry->values ? entry->values->size() : 0;
+    if (valuesRead > kMostValues) {
       return false;
     }
     kept.emplace_hint(place, tag, std::move(entry));  // of a repeated tag, the first stays
