@@ -134,7 +134,7 @@ void check(Options& options, Texts const& texts) {
   if (options.fromStdin) {
     options.extension = extensionOf("." + options.extension);
     if (!isPhotoExtension(options.extension)) {
-      throw CLI::ValidationError("--extension: give one of: " + std::string(kExtensions));
+      throw CLI::ValidationError("--extension: give one of: " + extensionList());
     }
   }
   bool const hasPaths = !options.paths.empty() || !options.filesFrom.empty();

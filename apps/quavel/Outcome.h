@@ -12,8 +12,8 @@ namespace app {
 /// One file to read.
 struct Input {
   std::string path;
-  bool isRegular = false;  ///< Known to be a regular file; otherwise that is still to be checked.
-  std::string problem;     ///< Why it cannot even be tried; empty otherwise.
+  bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
+  std::string problem;   ///< Why it cannot even be tried; empty otherwise.
 };
 
 /// What became of one file.

@@ -49,9 +49,7 @@ std::string irregular(mode_t mode) {
   return std::string("is a ") + kind + ", no regular file; give a photo, or use --stdin";
 }
 
-std::string unsupported() {
-  return "has no photo's extension; give one of: " + std::string(kExtensions);
-}
+std::string unsupported() { return "has no photo's extension; give one of: " + extensionList(); }
 
 std::string incomplete(std::string const& extension) {
   return "is no whole ." + extension + " file: cut short, damaged or of another kind";
@@ -84,8 +82,8 @@ std::string whyUnfit(Input const& input) {
   if (!input.problem.empty()) {
     return input.problem;
   }
-  if (input.isRegular) {
-    return isPhotoExtension(extensionOf(input.path)) ? std::string() : unsupported();
+  if (input.isPhoto) {
+    return {};
   }
   struct stat status = {};
   if (::stat(input.path.c_str(), &status) == -1) {
@@ -129,17 +127,16 @@ std::string extensionOf(std::string_view path) {
 }
 
 bool isPhotoExtension(std::string_view extension) {
-  if (extension.empty() || extension.find(' ') != std::string_view::npos) {
-    return false;
+  return std::find(std::begin(kExtensions), std::end(kExtensions), extension) !=
+         std::end(kExtensions);
+}
+
+std::string extensionList() {
+  std::string list;
+  for (auto const extension : kExtensions) {
+    list.append(list.empty() ? "" : " ").append(extension);
   }
-  for (std::string_view rest = kExtensions; !rest.empty();) {
-    auto const end = std::min(rest.find(' '), rest.size());
-    if (rest.substr(0, end) == extension) {
-      return true;
-    }
-    rest.remove_prefix(std::min(end + 1, rest.size()));
-  }
-  return false;
+  return list;
 }
 
 Outcome readPhoto(Input input) {

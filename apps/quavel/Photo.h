@@ -8,8 +8,11 @@
 
 namespace app {
 
-/// The extensions that name a format, separated by spaces.
-inline constexpr std::string_view kExtensions = "tiff tif dng nef cr2 raf arw jpeg jpg nrw 3fr cr3";
+/// The extensions that name a format.
+inline constexpr std::string_view kExtensions[] = {"tiff", "tif",  "dng", "nef", "cr2", "raf",
+                                                   "arw",  "jpeg", "jpg", "nrw", "3fr", "cr3"};
+/// All of them, separated by spaces.
+std::string extensionList();
 
 /// What follows the last ".", in lower case; empty when there is no ".".
 std::string extensionOf(std::string_view path);

@@ -4,6 +4,8 @@
 
 #include <system_error>
 
+#include "Photo.h"
+
 namespace app {
 
 Source::Source(Options const& options, Report report)
@@ -35,7 +37,8 @@ bool Source::nextOfPaths(Input& input) {
       walk_.emplace(path, report_);
       continue;
     }
-    input = {path, exists && S_ISREG(status.st_mode), {}};
+    bool const isFile = exists && S_ISREG(status.st_mode);
+    input = {path, isFile && isPhotoExtension(extensionOf(path)), {}};
     return true;
   }
   return false;

@@ -34,11 +34,10 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
   QVCR3Box child;
   int siblings = 0;
   int metadataBoxes = 0;
-  while (stream->getOffset() < end) {
+  for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (++siblings > box::kMostSiblings) {
       return false;
     }
-    long const childStart = stream->getOffset();
     if (!child.read(stream)) {
       return false;
     }

@@ -152,18 +152,20 @@ bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
   if (!values) {
     return true;
   }
-  out.reserve(values->size());
+  // As long as it can get, then cut: appending would ask for room at each character.
+  out.resize(values->size());
+  std::size_t length = 0;
+  bool isText = true;
   for (auto const& value : *values) {
-    if (value->type != EntryValueType::ASCII) {
-      return false;
-    }
+    isText = value->type == EntryValueType::ASCII;
     char const character = static_cast<char>(value->value[0]);
-    if (character == '\0') {
-      return true;
+    if (!isText || character == '\0') {
+      break;
     }
-    out.push_back(character);
+    out[length++] = character;
   }
-  return true;
+  out.resize(length);
+  return isText;
 }
 
 }  // namespace quavel
