@@ -24,22 +24,15 @@ class BlockPool {
     return {block_, ::new (object) T()};
   }
 
-  /// Appends `count` new objects to a list, one for each call of `fill` on them.
-  template <class Fill>
-  void appendTo(std::vector<std::shared_ptr<T>>& list, std::size_t count, Fill fill) {
-    while (count > 0) {
-      startBlockIfFull();
-      std::size_t const run = std::min(count, kBlockSize - block_->used);
-      T* const first = block_->end();
-      for (std::size_t i = 0; i < run; ++i) {
-        fill(*::new (first + i) T());
-        ++block_->used;
-      }
-      for (std::size_t i = 0; i < run; ++i) {
-        list.emplace_back(block_, first + i);
-      }
-      count -= run;
-    }
+  /// Appends a new object to a list. The objects come from two blocks in turn: when a list is let
+  /// go, counting down the same block at every step would make each step wait for the one before.
+  T& appendTo(std::vector<std::shared_ptr<T>>& list) {
+    block_.swap(otherBlock_);
+    startBlockIfFull();
+    T* const object = ::new (block_->end()) T();
+    ++block_->used;
+    list.emplace_back(block_, object);
+    return *object;
   }
 
  private:
@@ -63,6 +56,7 @@ class BlockPool {
   }
 
   std::shared_ptr<Block> block_;
+  std::shared_ptr<Block> otherBlock_;
 };
 
 /// What the entries of one directory are made of. The three kinds own each other in this order,
@@ -72,7 +66,7 @@ struct EntryPools {
 
   BlockPool<QVTiffImageFileDirectoryEntry, 12> entries;
   BlockPool<ValueList, 12> lists;
-  BlockPool<QVTiffImageFileDirectoryEntryValue, 64> values;  // a date takes 20, a model up to 32
+  BlockPool<QVTiffImageFileDirectoryEntryValue, 32> values;  // a date takes 20, a lens 40
 };
 
 }  // namespace quavel::detail

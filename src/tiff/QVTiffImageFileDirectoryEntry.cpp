@@ -69,28 +69,25 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::uint64_t size,
                 detail::EntryPools& pools, detail::EntryPools::ValueList& list) {
   EntryValueType const type = fieldTypeToValueType[entry.typeCode];
   bool const isReversed = detail::isReversed(stream);
-  auto const append = [&](std::uint8_t const* bytes, std::uint64_t length) {
-    pools.values.appendTo(list, length / size, [=](Value& value) mutable {
-      value.type = type;
-      storeValue(bytes, size, isReversed, value);
-      bytes += size;
-    });
-  };
+  std::uint64_t left = entry.count * size;
+  bool const isInField = left <= detail::kEntryFieldSize;
+  if (!isInField) {
+    stream.setOffset(numberAt<std::uint32_t>(entry.field, isReversed));
+  }
 
   list.reserve(std::min(entry.count, kFirstListCapacity));
-  std::uint64_t left = entry.count * size;
-  if (left <= detail::kEntryFieldSize) {
-    append(entry.field, left);
-    return true;
-  }
-  stream.setOffset(numberAt<std::uint32_t>(entry.field, isReversed));
   std::array<std::uint8_t, 512> part;  // whole values of any size
   while (left > 0) {
     std::size_t const length = std::min<std::uint64_t>(left, part.size());
-    if (detail::readUpTo(stream, part.data(), length) < length) {
+    if (!isInField && detail::readUpTo(stream, part.data(), length) < length) {
       return false;
     }
-    append(part.data(), length);
+    std::uint8_t const* const bytes = isInField ? entry.field : part.data();
+    for (std::size_t position = 0; position < length; position += size) {
+      Value& value = pools.values.appendTo(list);
+      value.type = type;
+      storeValue(bytes + position, size, isReversed, value);
+    }
     left -= length;
   }
   return true;
