@@ -101,6 +101,7 @@ TEST(Cr3, StoresTheExifDirectoryUpToTheFirstMalformedEntry) {
       {shorts(kLensModel, {1}), false, "iso=-1"},
       {shorts(kIso, {400, 400}), false, "iso=-1"},
       {longs(kIso, {70000}), true, "iso=4464"},
+      {shorts(kIso, {40000}), true, "iso=40000"},
       {ratio(kAperture, 4, 1, kSRational), false, "iso=400"},
       {ratio(kShutterSpeed, 7, 1), false, "iso=400"},
       {ratio(kFocalLength, 35, 1, kSRational), false, "iso=400"},
@@ -192,6 +193,13 @@ TEST(Cr3, LeavesItsContainersAtTheirEnds) {
   EXPECT_FALSE(moov.read(source.stream));  // this one is no moov
   source.stream->setOffset(0);
   EXPECT_FALSE(QVCR3UUIDBox().read(source.stream));
+
+  Source broken(box("moov", uuidBox(Bytes(8, '\0')) + box("free", "")) + "behind");
+  EXPECT_FALSE(QVCR3MoovBox().read(broken.stream));
+  EXPECT_EQ(broken.stream->getOffset(), static_cast<long>(broken.bytes.size()) - 6);
+  Source foreign(uuidBox(Bytes(8, '\0'), Bytes(16, '\x11')) + "behind");
+  EXPECT_TRUE(QVCR3UUIDBox().read(foreign.stream));
+  EXPECT_EQ(foreign.stream->getOffset(), static_cast<long>(foreign.bytes.size()) - 6);
 }
 
 }  // namespace

@@ -82,6 +82,8 @@ TEST(Tiff, Refuses) {
           f.sub(kSubIFDs, 1).set(longs(kWidth, {1, 2}));
         },
         false, main},
+       {"SubIFD's orientation of type 99",
+        [](auto& f) { f.sub(kSubIFDs, 1).set(values(kOrientation, 99, 1, {1})); }, false, main},
        {"height of 0", [](auto& f) { f.sub(kSubIFDs, 1).set(longs(kLength, {})); }, false,
         "width=6000 " + main},
        {"pointer of 2",

@@ -25,6 +25,8 @@ TEST(Jpeg, ReconcilesTheTwoSizes) {
   EXPECT_EQ(afterEdit([](auto& f) { f.set(shorts(kOrientation, {1})); }),
             frame + "orientation=1 " + kOriginal);
   EXPECT_EQ(afterEdit([](auto& f) { f.remove(kOrientation); }), frame + kOriginal);
+  EXPECT_EQ(afterEdit([](auto& f) { f.set(shorts(kOrientation, {0})); }),
+            "width=3000 height=4000 orientation=0 " + kOriginal);
   EXPECT_EQ(afterEdit([](auto& f) { f.sub(kExif).set(shorts(kPixelX, {2999})); }),
             "width=2999 height=4000 orientation=6 " + kOriginal);
   EXPECT_EQ(afterEdit([](auto& f) { f.sub(kExif).set(shorts(kPixelY, {500})); }),
@@ -65,6 +67,7 @@ TEST(Jpeg, WalksOverOtherSegments) {
   EXPECT_EQ(read(soi + segment(0xffe1, "http://ns.adobe") + sof0() + exif), frame);
   EXPECT_EQ(read(soi + sof0() + exif), all);
   EXPECT_EQ(read(soi + sof0(5, 9) + sof0(7, 3) + segment(0xffe1, "abcd")), "width=7 height=9");
+  EXPECT_EQ(read(soi + sof0(7, 3) + sof0(5, 9) + segment(0xffe1, "abcd")), "width=7 height=9");
   EXPECT_EQ(read(soi + sof0(0, 9) + segment(0xffe1, "abcd")), "");
   EXPECT_EQ(read(soi + exif + segment(0xffc2, sof0().substr(4))), all);  // progressive
   EXPECT_EQ(read(soi + "\xff\xdd\xff\xff\xff\xff" + sof0()), frame);     // DRI: 4 bytes on
@@ -95,6 +98,14 @@ TEST(Jpeg, GoesOnAfterALengthThatLeadsBack) {
   EXPECT_EQ(read(Bytes("\xff\xd8\xff\xdb\0\0", 6) + Bytes("\0\4\0\0", 4) + sof0()),
             "width=4000 height=3000");
   EXPECT_EQ(read(Bytes("\xff\xd8", 2) + Bytes(1000, '\0')), "none");
+}
+
+TEST(Jpeg, WalksThousandsOfSegments) {
+  Bytes file = "\xff\xd8";
+  for (int i = 0; i < 20000; ++i) {
+    file += "\xff\xd9\xff\xff";  // EOI, and the two bytes that it skips
+  }
+  EXPECT_EQ(read(file + sof0()), "width=4000 height=3000");
 }
 
 TEST(Jpeg, SkipsElevenMarkersByAFixedLength) {

@@ -59,6 +59,8 @@ TEST(Reader, IgnoresTheCaseOfAPathsExtensionOnly) {
   TemporaryFile const upperCase(jpeg, "JPG");
   TemporaryFile const unsupported(jpeg, "png");
   EXPECT_TRUE(QVReader(upperCase.path).metadata);
+  TemporaryFile const withAnI(tiff(kII, plainTiff()), "TIFF");
+  EXPECT_TRUE(QVReader(withAnI.path).metadata);
   EXPECT_FALSE(QVReader(unsupported.path).metadata);
   EXPECT_FALSE(readBuffer(jpeg, "JPG"));
   EXPECT_FALSE(QVReader("/nonexistent/photo.jpg").metadata);

@@ -18,6 +18,7 @@ TEST(Sweep, AcceptsNoPrefixBeforeTheLastNeededByte) {
     for (ByteOrder const order : kOrders) {
       SCOPED_TRACE(fixture.extension);
       Bytes const bytes = fixture.bytes(order);
+      EXPECT_FALSE(readBuffer("", fixture.extension));
       bool wasRead = false;
       for (std::size_t length = 0; length <= bytes.size(); ++length) {
         auto const record = readBuffer(bytes.substr(0, length), fixture.extension);
@@ -27,6 +28,7 @@ TEST(Sweep, AcceptsNoPrefixBeforeTheLastNeededByte) {
         EXPECT_TRUE(record || !wasRead) << length;
         wasRead = record != nullptr;
       }
+      EXPECT_EQ(describe(readBuffer(bytes, fixture.extension)), fixture.expected);
     }
   }
 }

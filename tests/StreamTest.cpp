@@ -104,6 +104,9 @@ TEST_P(StreamTest, CountsOffsetsFromTheBase) {
   ASSERT_TRUE(stream->readChar(&character));
   EXPECT_EQ(character, '6');
   EXPECT_EQ(stream->getOffset(), 3);
+  stream->setOffset(-3);
+  ASSERT_TRUE(stream->readChar(&character));
+  EXPECT_EQ(character, '1');
 }
 
 TEST_P(StreamTest, DeliversWhatIsLeftAndThenNothing) {
@@ -193,6 +196,34 @@ TEST(ReadAheadStream, AnswersFromItsWindowAndMovesByOneSeekAndOneRead) {
   EXPECT_EQ(stream.readBuffer(reinterpret_cast<std::uint8_t*>(whole.data()), whole.size()),
             static_cast<std::int64_t>(bytes.size()));
   EXPECT_EQ(whole, bytes);
+}
+
+/// Takes no position beyond a limit, and fails reads that touch a broken byte.
+struct PartlyBrokenStream : QVMStream {
+  using QVMStream::QVMStream;
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    return offset + count > 9000 ? -1 : QVMStream::readBuffer(destination, count);
+  }
+  void setOffset(long const& newOffset) override {
+    if (newOffset <= 0xeffffff0) {
+      QVMStream::setOffset(newOffset);
+    }
+  }
+};
+
+TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {
+  Bytes bytes(20000, 'x');
+  auto const source = std::make_shared<PartlyBrokenStream>(
+      reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
+  detail::ReadAheadStream stream(source);
+  stream.setOffset(100);
+  stream.setOffset(0xfffffff0);
+  EXPECT_EQ(stream.getOffset(), 100);
+  unsigned int number = 0;
+  EXPECT_TRUE(stream.readLong(&number));
+  EXPECT_EQ(number, 0x78787878U);
+  stream.setOffset(8998);
+  EXPECT_FALSE(stream.readLong(&number));
 }
 
 TEST(ReadAheadStream, TakesAReadErrorForTheEnd) {

@@ -58,6 +58,53 @@ TEST(TiffEntry, ReadsValuesFromTheFieldAndFromBehind) {
   EXPECT_TRUE(empty->values->empty());
 }
 
+TEST(TiffEntry, ReadsLongListsOfEightByteValues) {
+  for (ByteOrder const order : kOrders) {
+    Bytes doubles;
+    std::vector<std::int64_t> halves;
+    for (std::int64_t i = 0; i < 130; ++i) {
+      halves.push_back(i);
+      halves.push_back(1);
+      doubles += number(order, i == 129 ? 0xc002000000000000 : 0, 8);
+    }
+    auto const fractions = readEntry(order, {1, kRational, 130, 4, halves});
+    ASSERT_TRUE(fractions && fractions->values->size() == 130);
+    EXPECT_EQ(fractions->values->at(64)->longValue(), 64U);
+    EXPECT_EQ(fractions->values->at(129)->rationalValue().numerator, 129U);
+
+    Source source(u16(order, kDouble) + u32(order, 130) + u32(order, 10) + doubles, order);
+    QVTiffImageFileDirectoryEntry entry;
+    ASSERT_TRUE(entry.read(source.stream));
+    EXPECT_EQ(entry.values->back()->doubleValue(), -2.25);
+  }
+}
+
+TEST(TiffEntry, LeavesTheStreamWhereItsLastReadEnded) {
+  struct Row {
+    Bytes bytes;
+    bool isRead;
+    long position;
+  };
+  Row const rows[] = {
+      {u16(kMM, kShort) + u32(kMM, 1) + "abcdefgh", true, 8},
+      {u16(kMM, kShort) + u32(kMM, 3) + u32(kMM, 12) + "..abcdef", true, 18},
+      {u16(kMM, kUndefined) + u32(kMM, 0) + "abcd", true, 6},
+      {u16(kMM, kUndefined) + u32(kMM, 9) + "abcd", true, 10},
+      {u16(kMM, 99) + u32(kMM, 1) + "abcd", false, 2},
+      {u16(kMM, kShort) + u32(kMM, 70000) + "abcd", false, 6},
+  };
+  for (Row const& row : rows) {
+    Source source(row.bytes);
+    EXPECT_EQ(QVTiffImageFileDirectoryEntry().read(source.stream), row.isRead);
+    EXPECT_EQ(source.stream->getOffset(), row.position);
+  }
+  Source cut(u16(kMM, kUndefined) + u32(kMM, 4) + "AB");
+  QVTiffImageFileDirectoryEntry entry;
+  EXPECT_FALSE(entry.read(cut.stream));
+  ASSERT_TRUE(entry.bytes);
+  EXPECT_EQ(Bytes(entry.bytes->begin(), entry.bytes->end()), Bytes("AB\0\0", 4));
+}
+
 TEST(TiffEntry, KeepsUndefinedBytesApart) {
   auto const inlineBytes = readEntry(kMM, characters(1, "abcd", kUndefined));
   ASSERT_TRUE(inlineBytes && inlineBytes->bytes);
@@ -158,6 +205,65 @@ TEST(TiffDirectory, KeepsTheFirstOfTheWantedTags) {
   ASSERT_TRUE(ifd.read(empty.stream, {kOrientation}));
   EXPECT_TRUE(ifd.entries->empty());
   EXPECT_EQ(ifd.nextIFDOffset, 9U);
+}
+
+TEST(TiffDirectory, ReadsAListedTagOnceAndTheLongestLists) {
+  // The second Orientation is malformed; 0x0140 and 0x0180 differ in their upper bits alone.
+  Bytes const bytes = tiff(kII, {{shorts(kOrientation, {6}), values(kOrientation, 99, 1, {1}),
+                                  shorts(0x0140, {1}), shorts(0x0180, {2})}});
+  std::vector<unsigned short> tags = {kOrientation, 0x0140, 0x0180, 0x0140};
+  for (int const more : {0, 40}) {
+    for (int i = 0; i < more; ++i) {
+      tags.push_back(static_cast<unsigned short>(0x9000 + i));
+    }
+    Source source(bytes, kII);
+    source.stream->setOffset(8);
+    QVTiffImageFileDirectory ifd;
+    ASSERT_TRUE(ifd.read(source.stream, tags));
+    ASSERT_EQ(ifd.entries->size(), 3U);
+    EXPECT_EQ(ifd.entryForTag(0x0180)->values->front()->longValue(), 2U);
+  }
+}
+
+/// Delivers nine bytes at most, or claims more than it was asked for.
+struct OddStream : QVMStream {
+  using QVMStream::QVMStream;
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    auto const delivered = QVMStream::readBuffer(destination, std::min<std::size_t>(count, 9));
+    return claimsMore && count > 8 ? delivered + 1000 : delivered;
+  }
+  bool claimsMore = false;
+};
+
+TEST(TiffDirectory, TakesAStreamInPiecesButNoClaimBeyondWhatWasAsked) {
+  for (bool const claimsMore : {false, true}) {
+    Bytes bytes = tiff(kMM, plainTiff());
+    auto const odd =
+        std::make_shared<OddStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
+    odd->claimsMore = claimsMore;
+    std::shared_ptr<QVStream> stream = odd;
+    EXPECT_EQ(QVTiffImage().read(stream), !claimsMore);
+  }
+}
+
+TEST(TiffDirectory, ReadsValuesBehindTheFieldWhenTheSeekToThemIsRefused) {
+  Bytes const before(100, '.');
+  TemporaryFile const file(before + tiff(kMM, {{claim(kModel, kAscii, 5, 50)}}).substr(8), "bin");
+  std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file.path);
+  stream->setOffset(100);
+  stream->baseOffset = -100;  // offset 50 is now before the start
+  QVTiffImageFileDirectory ifd;
+  EXPECT_FALSE(ifd.read(stream, {kModel}));  // only the next directory's offset is behind
+  TemporaryFile const longer(
+      before + tiff(kMM, {{claim(kModel, kAscii, 5, 50)}, 7}).substr(8) + "HELLO", "bin");
+  stream = std::make_shared<QVFStream>(longer.path);
+  stream->setOffset(100);
+  stream->baseOffset = -100;
+  ASSERT_TRUE(ifd.read(stream, {kModel}));
+  std::string text;
+  EXPECT_TRUE(ifd.entryForTag(kModel)->convertToString(text));
+  EXPECT_EQ(text, "");  // the four bytes of the offset 7 begin with NUL
+  EXPECT_EQ(ifd.entryForTag(kModel)->values->back()->charValue(), 'H');
 }
 
 TEST(TiffDirectory, StopsOnceAllWantedTagsAreFound) {

@@ -23,7 +23,7 @@ class QUAVEL_EXPORT QVCR3Box {
   /// The header read last; null before a `read`.
   std::shared_ptr<QVCR3BoxHeader> header() const;
 
-  std::shared_ptr<QVCR3BoxHeader> boxHeader;  ///< A fresh one for each `read`.
+  std::shared_ptr<QVCR3BoxHeader> boxHeader;  ///< Of the last `read`.
 };
 
 }  // namespace quavel

@@ -19,7 +19,7 @@ class QUAVEL_EXPORT QVCR3CMT1Box : public QVCR3Box {
   bool read(std::shared_ptr<QVStream>& stream) override;
   /// Reads the payload with the stream at its TIFF header and `baseOffset` there.
   bool readExif(std::shared_ptr<QVStream>& stream);
-  /// Fills the fields below in the order of their tags' importance, up to the first malformed one.
+  /// Fills the orientation, the date, the size and the model, up to the first malformed one.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
   std::int32_t width = -1;        ///< Pixels.

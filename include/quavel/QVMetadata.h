@@ -32,18 +32,19 @@ class QUAVEL_EXPORT QVMetadata {
   /// The best date there is: the original one, else the digitized one, else the file's.
   std::string captureDate() const;
 
-  std::int32_t width = -1;        ///< Of the full-size image, in pixels.
-  std::int32_t height = -1;       ///< Of the full-size image, in pixels.
-  std::int32_t orientation = -1;  ///< TIFF Orientation, unchecked; CR3 gives 1 when it is absent.
-  bool isRaw = false;             ///< The format is a camera's raw format.
-  std::string dateTimeOriginal;   ///< "YYYY:MM:DD HH:MM:SS" in well-made files, like all dates.
-  std::string dateTimeDigitized;  ///< When the image was stored.
-  std::string dateTime;           ///< When the file was changed last.
-  bool hasShootingInfo = false;   ///< A shooting record was read into the fields below.
-  std::string model;              ///< Of the camera.
-  std::string lensModel;          ///< Exif LensModel.
-  std::int32_t iso = -1;          ///< ISOSpeedRatings
-  float apexFNumber = std::nanf("");        ///< F-number that ApertureValue amounts to.
+  std::int32_t width = -1;   ///< Of the full-size image, in pixels.
+  std::int32_t height = -1;  ///< Of the full-size image, in pixels.
+  std::int32_t orientation =
+      -1;              ///< TIFF Orientation, unchecked; a CR3's main directory without one gives 1.
+  bool isRaw = false;  ///< The format is a camera's raw format.
+  std::string dateTimeOriginal;       ///< "YYYY:MM:DD HH:MM:SS" in well-made files, like all dates.
+  std::string dateTimeDigitized;      ///< When the image was stored.
+  std::string dateTime;               ///< When the file was changed last.
+  bool hasShootingInfo = false;       ///< A shooting record was read into the fields below.
+  std::string model;                  ///< Of the camera.
+  std::string lensModel;              ///< Exif LensModel.
+  std::int32_t iso = -1;              ///< ISOSpeedRatings
+  float apexFNumber = std::nanf("");  ///< F-number that ApertureValue amounts to.
   float apexExposureTime = std::nanf("");   ///< Seconds that ShutterSpeedValue amounts to.
   float apertureValue = std::nanf("");      ///< APEX units.
   float shutterSpeedValue = std::nanf("");  ///< APEX units.

@@ -43,7 +43,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
   friend class QVTiffImageFileDirectory;
 
   bool read(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools);
-  void storeUndefined(detail::RawEntry const& entry, bool isReversed);
+  bool storeUndefined(detail::RawEntry const& entry, bool isReversed);
 };
 
 }  // namespace quavel

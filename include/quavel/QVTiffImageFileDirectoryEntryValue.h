@@ -27,8 +27,8 @@ enum class EntryValueType : std::uint8_t {
   DOUBLE = 11,
 };
 
-/// Field types by their code in the file. Code 13 (IFD) is an ordinary LONG; an entry refuses
-/// code 0 and the codes from 14 on before it looks here.
+/// Field types by their code in the file. Code 13 (IFD) is an ordinary LONG. An entry refuses code
+/// 0 and the codes from 14 on, and keeps the bytes of code 7 apart.
 inline constexpr std::array<EntryValueType, 14> fieldTypeToValueType = {
     EntryValueType::UNDEFINED, EntryValueType::BYTE,      EntryValueType::ASCII,
     EntryValueType::SHORT,     EntryValueType::LONG,      EntryValueType::RATIONAL,

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <utility>
 
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectory.h"
@@ -35,6 +36,21 @@ constexpr int kMostExifSegments = 64;
 // of any size, holes included.
 constexpr int kMostSegments = 1 << 24;
 
+// A constant, unlike the public map made of it: it is there before any constructor of a host's.
+constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
+    {0xffd8, 2},  // SOI
+    {0xffdd, 4},  // DRI
+    {0xffd0, 2},
+    {0xffd1, 2},
+    {0xffd2, 2},
+    {0xffd3, 2},  // RST0 to RST3
+    {0xffd4, 2},
+    {0xffd5, 2},
+    {0xffd6, 2},
+    {0xffd7, 2},  // RST4 to RST7
+    {0xffd9, 2},  // EOI
+}};
+
 }  // namespace
 
 /// What the segments have shown so far.
@@ -47,13 +63,8 @@ struct QVJPEGImage::Walk {
   unsigned short frameHeight = 0;
 };
 
-std::map<std::uint16_t, std::uint16_t> const QVJPEGImage::markerSkipLengths = {
-    {0xffd8, 2},                                         // SOI
-    {0xffdd, 4},                                         // DRI
-    {0xffd0, 2}, {0xffd1, 2}, {0xffd2, 2}, {0xffd3, 2},  // RST0 to RST3
-    {0xffd4, 2}, {0xffd5, 2}, {0xffd6, 2}, {0xffd7, 2},  // RST4 to RST7
-    {0xffd9, 2},                                         // EOI
-};
+std::map<std::uint16_t, std::uint16_t> const QVJPEGImage::markerSkipLengths(kFixedSkips.begin(),
+                                                                            kFixedSkips.end());
 
 bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   stream->byteOrder = ByteOrder::BigEndian;
@@ -81,10 +92,11 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
                               Walk& walk) {
-  auto const fixedSkip = markerSkipLengths.find(marker);
-  if (fixedSkip != markerSkipLengths.end()) {
-    stream->setOffset(stream->getOffset() + fixedSkip->second);
-    return true;
+  for (auto const& [skippedMarker, skip] : kFixedSkips) {
+    if (marker == skippedMarker) {
+      stream->setOffset(stream->getOffset() + skip);
+      return true;
+    }
   }
 
   unsigned short length = 0;

@@ -1,7 +1,6 @@
 #include "quavel/QVReader.h"
 
 #include <algorithm>
-#include <cctype>
 #include <string_view>
 #include <utility>
 
@@ -26,6 +25,11 @@ namespace {
 template <class Format>
 std::shared_ptr<QVMetadata> make() {
   return std::make_shared<Format>();
+}
+
+/// ASCII alone: in a Turkish locale the C library would not make "tif" of "TIF".
+char lowerCase(char letter) {
+  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
 }
 
 struct ExtensionRow {
@@ -54,8 +58,7 @@ std::shared_ptr<QVMetadata> readRecord(QVReader const& reader, std::string const
 
 QVReader::QVReader(std::string const& path) {
   std::string extension = getPathExtension(path);
-  std::transform(extension.begin(), extension.end(), extension.begin(),
-                 [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
+  std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
   auto file = std::make_shared<QVFStream>(path);
   metadata =
       readRecord(*this, extension, std::make_shared<detail::ReadAheadStream>(std::move(file)));

@@ -61,8 +61,8 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
   std::size_t there = 0;
   while (there < count) {
     std::int64_t const delivered = stream.readBuffer(destination + there, count - there);
-    if (delivered <= 0) {
-      break;
+    if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - there) {
+      break;  // a count beyond what was asked for is no count
     }
     there += static_cast<std::size_t>(delivered);
   }

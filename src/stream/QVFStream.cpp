@@ -21,15 +21,13 @@ std::int64_t QVFStream::readBuffer(std::uint8_t* destination, std::size_t count)
 }
 
 long QVFStream::getOffset() {
-  if (fd == -1) {
-    return static_cast<long>(-baseOffset);
-  }
-  return static_cast<long>(::lseek(fd, 0, SEEK_CUR) - baseOffset);
+  // Unsigned, here and below: a result out of range wraps around instead of being undefined.
+  auto const position = static_cast<std::uint64_t>(fd == -1 ? 0 : ::lseek(fd, 0, SEEK_CUR));
+  return static_cast<long>(position - static_cast<std::uint64_t>(baseOffset));
 }
 
 void QVFStream::setOffset(long const& offset) {
   if (fd != -1) {
-    // Unsigned, a sum out of range wraps around instead of being undefined.
     ::lseek(fd,
             static_cast<off_t>(static_cast<std::uint64_t>(baseOffset) +
                                static_cast<std::uint64_t>(offset)),

@@ -11,7 +11,7 @@ ReadAheadStream::ReadAheadStream(std::shared_ptr<QVStream> source) : source_(std
 std::int64_t ReadAheadStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   std::size_t delivered = copyFromWindow(destination, count);
   while (delivered < count) {
-    moveWindow();
+    moveWindow(count - delivered);
     std::size_t const copied = copyFromWindow(destination + delivered, count - delivered);
     if (copied == 0) {
       break;
@@ -21,15 +21,25 @@ std::int64_t ReadAheadStream::readBuffer(std::uint8_t* destination, std::size_t 
   return static_cast<std::int64_t>(delivered);
 }
 
-long ReadAheadStream::getOffset() { return static_cast<long>(position_ - baseOffset); }
+long ReadAheadStream::getOffset() {
+  return static_cast<long>(static_cast<std::uint64_t>(position_) -
+                           static_cast<std::uint64_t>(baseOffset));
+}
 
 void ReadAheadStream::setOffset(long const& offset) {
   // Unsigned, a sum out of range wraps around instead of being undefined.
   auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
                                                 static_cast<std::uint64_t>(offset));
-  if (target >= 0) {
-    position_ = target;
+  if (target < 0 || (target > kSurelyAccepted && !sourceAccepts(target))) {
+    return;
   }
+  position_ = target;
+}
+
+bool ReadAheadStream::sourceAccepts(std::int64_t target) {
+  source_->setOffset(static_cast<long>(target));
+  sourcePosition_ = source_->getOffset();
+  return sourcePosition_ == target;
 }
 
 std::size_t ReadAheadStream::copyFromWindow(std::uint8_t* destination, std::size_t count) {
@@ -43,13 +53,18 @@ std::size_t ReadAheadStream::copyFromWindow(std::uint8_t* destination, std::size
   return copied;
 }
 
-void ReadAheadStream::moveWindow() {
+void ReadAheadStream::moveWindow(std::size_t needed) {
   if (sourcePosition_ != position_) {
     source_->setOffset(static_cast<long>(position_));
   }
   std::size_t const wanted = isFirstWindow_ ? kFirstWindowSize : kNextWindowSize;
   isFirstWindow_ = false;
-  std::int64_t const delivered = source_->readBuffer(window_.data(), wanted);
+  std::int64_t delivered = source_->readBuffer(window_.data(), wanted);
+  if (delivered < 0) {
+    // What is broken may lie behind the bytes that are needed.
+    source_->setOffset(static_cast<long>(position_));
+    delivered = source_->readBuffer(window_.data(), std::min(needed, window_.size()));
+  }
   windowStart_ = position_;
   windowSize_ = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));
   sourcePosition_ = position_ + static_cast<std::int64_t>(windowSize_);

@@ -21,33 +21,37 @@ constexpr std::size_t kMostValues = std::size_t{1} << 20U;
 class WantedTags {
  public:
   explicit WantedTags(std::vector<unsigned short> const& tags) : tags_(tags) {
+    if (tags.size() > kLongList) {
+      sorted_ = tags;
+      std::sort(sorted_.begin(), sorted_.end());
+      sorted_.erase(std::unique(sorted_.begin(), sorted_.end()), sorted_.end());
+      distinctCount_ = sorted_.size();
+      return;
+    }
     for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
-      bool const isNew = (mask_ & bitOf(*tag)) == 0 || std::find(tags.begin(), tag, *tag) == tag;
-      distinctCount_ += isNew ? 1 : 0;
+      distinctCount_ += std::find(tags.begin(), tag, *tag) == tag ? 1 : 0;
       mask_ |= bitOf(*tag);
     }
   }
 
   bool areAll() const { return tags_.empty(); }
   bool contain(unsigned short tag) const {
-    if ((mask_ & bitOf(tag)) == 0) {
-      return false;
+    if (!sorted_.empty()) {
+      return std::binary_search(sorted_.begin(), sorted_.end(), tag);
     }
-    for (unsigned short const wanted : tags_) {
-      if (wanted == tag) {
-        return true;
-      }
-    }
-    return false;
+    return (mask_ & bitOf(tag)) != 0 && std::find(tags_.begin(), tags_.end(), tag) != tags_.end();
   }
   /// One named twice counts once.
   std::size_t distinctCount() const { return distinctCount_; }
 
  private:
+  static constexpr std::size_t kLongList = 16;  // no format's own list is longer
+
   static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
 
   std::vector<unsigned short> const& tags_;
-  std::uint64_t mask_ = 0;  // says of most unwanted tags that they are not listed
+  std::vector<unsigned short> sorted_;  // of a long list only
+  std::uint64_t mask_ = 0;              // says of most unwanted tags that they are not listed
   std::size_t distinctCount_ = 0;
 };
 
@@ -160,6 +164,8 @@ bool QVTiffImageFileDirectory::readEntries(std::shared_ptr<QVStream>& stream, un
     if (!wanted.areAll() && isMet) {
       continue;
     }
+    // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
+    stream->setOffset(firstEntry + static_cast<long>(detail::kEntrySize) * (i + 1));
     detail::RawEntry rawEntry;
     auto entry = pools.entries.make();
     if (!entryReader.readRest(&rawEntry) || !entry->read(*stream, rawEntry, pools)) {

@@ -58,10 +58,17 @@ std::size_t usedFieldSize(std::uint64_t valueSize, std::uint32_t count) {
   return std::min<std::uint64_t>(count * valueSize, detail::kEntryFieldSize);
 }
 
-/// Bytes of one value of the type; 1 where no values are read.
+bool isKnown(std::uint16_t typeCode) {
+  return typeCode != 0 && typeCode < fieldTypeToValueType.size();
+}
+
+bool isTooLong(RawEntry const& entry) {
+  return entry.typeCode != kUndefinedCode && entry.count > kMostValues;
+}
+
+/// Bytes of one value of a known type; of UNDEFINED, which has none, those of one byte.
 std::uint64_t sizeOfType(std::uint16_t typeCode) {
-  bool const hasValues = typeCode < fieldTypeToValueType.size() && typeCode != kUndefinedCode;
-  return hasValues ? Value::sizeOfValueOfType(fieldTypeToValueType[typeCode]) : 1;
+  return typeCode == kUndefinedCode ? 1 : Value::sizeOfValueOfType(fieldTypeToValueType[typeCode]);
 }
 
 /// Appends the entry's values, each `size` bytes wide. False: they are not all in the data.
@@ -99,7 +106,10 @@ QVTiffImageFileDirectoryEntry::QVTiffImageFileDirectoryEntry() = default;
 
 bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   RawEntry entry;
-  if (!stream->readShort(&entry.typeCode) || !stream->readLong(&entry.count)) {
+  if (!stream->readShort(&entry.typeCode) || !isKnown(entry.typeCode)) {
+    return false;
+  }
+  if (!stream->readLong(&entry.count) || isTooLong(entry)) {
     return false;
   }
   std::array<std::uint8_t, detail::kEntryFieldSize> field;
@@ -112,36 +122,37 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVTiffImageFileDirectoryEntry::read(QVStream& stream, RawEntry const& entry,
                                          detail::EntryPools& pools) {
-  if (entry.typeCode == 0 || entry.typeCode >= fieldTypeToValueType.size()) {
+  if (!isKnown(entry.typeCode) || isTooLong(entry)) {
     return false;
   }
   std::uint64_t const valueSize = sizeOfType(entry.typeCode);
-  if (entry.fieldSize < usedFieldSize(valueSize, entry.count)) {
-    return false;
-  }
+  bool const isWhole = entry.fieldSize >= usedFieldSize(valueSize, entry.count);
   if (entry.typeCode == kUndefinedCode) {
-    storeUndefined(entry, detail::isReversed(stream));
-    return true;
-  }
-  if (entry.count > kMostValues) {
-    return false;
+    return storeUndefined(entry, detail::isReversed(stream)) && isWhole;
   }
 
   auto list = pools.lists.make();
-  if (!readValues(stream, entry, valueSize, pools, *list)) {
+  if (!isWhole || !readValues(stream, entry, valueSize, pools, *list)) {
     return false;
   }
   values = std::move(list);
   return true;
 }
 
-void QVTiffImageFileDirectoryEntry::storeUndefined(RawEntry const& entry, bool isReversed) {
-  if (entry.count > detail::kEntryFieldSize) {
-    dataOffset = numberAt<std::uint32_t>(entry.field, isReversed);
-    dataCount = entry.count;
-    return;
+/// False: the offset of the bytes is not all there. Bytes in the field are stored even when some
+/// are missing, which stay zero.
+bool QVTiffImageFileDirectoryEntry::storeUndefined(RawEntry const& entry, bool isReversed) {
+  if (entry.count <= detail::kEntryFieldSize) {
+    bytes = std::make_shared<std::vector<std::uint8_t>>(entry.count);
+    std::copy_n(entry.field, std::min<std::size_t>(entry.count, entry.fieldSize), bytes->begin());
+    return true;
   }
-  bytes = std::make_shared<std::vector<std::uint8_t>>(entry.field, entry.field + entry.count);
+  if (entry.fieldSize < detail::kEntryFieldSize) {
+    return false;
+  }
+  dataOffset = numberAt<std::uint32_t>(entry.field, isReversed);
+  dataCount = entry.count;
+  return true;
 }
 
 bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
