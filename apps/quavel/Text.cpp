@@ -4,12 +4,14 @@
 #include <wchar.h>
 
 #include <algorithm>
+#include <cstdint>
+#include <iterator>
 
 namespace app {
 
 namespace {
 
-/// Makes the C library's multibyte functions mean UTF-8 on this thread, whatever the user's locale.
+/// Makes the C library's `wcwidth` know all characters on this thread, whatever the user's locale.
 class Utf8Scope {
  public:
   Utf8Scope() : previous_(::uselocale(utf8())) {}
@@ -25,6 +27,16 @@ class Utf8Scope {
 
   locale_t previous_;
 };
+
+struct Lead {
+  unsigned char first;
+  unsigned char last;
+  std::size_t length;
+  std::uint32_t least;  // what is smaller has a shorter form
+};
+
+// Decoded here, as the C library takes numbers above U+10FFFF and longer forms for characters.
+constexpr Lead kLeads[] = {{0xc2, 0xdf, 2, 0x80}, {0xe0, 0xef, 3, 0x800}, {0xf0, 0xf4, 4, 0x10000}};
 
 constexpr std::string_view kEllipsis = "…";
 
@@ -56,14 +68,26 @@ Character firstCharacter(std::string_view text) {
   if (byte < 0x80) {
     return {static_cast<wchar_t>(byte), 1, true};
   }
-  Utf8Scope const scope;
-  std::mbstate_t state = {};
-  wchar_t code = 0;
-  std::size_t const length = std::mbrtowc(&code, text.data(), text.size(), &state);
-  if (length > text.size()) {  // invalid or incomplete: both are the largest numbers
-    return {static_cast<wchar_t>(byte), 1, false};
+  Character const invalid = {static_cast<wchar_t>(byte), 1, false};
+  auto const* const lead =
+      std::find_if(std::begin(kLeads), std::end(kLeads),
+                   [byte](Lead const& row) { return row.first <= byte && byte <= row.last; });
+  if (lead == std::end(kLeads) || text.size() < lead->length) {
+    return invalid;
   }
-  return {code, length, true};
+  std::uint32_t code = byte & (0x7fU >> lead->length);
+  for (std::size_t i = 1; i < lead->length; ++i) {
+    auto const next = static_cast<unsigned char>(text[i]);
+    if ((next & 0xc0) != 0x80) {
+      return invalid;
+    }
+    code = code << 6 | (next & 0x3f);
+  }
+  bool const isSurrogate = 0xd800 <= code && code <= 0xdfff;
+  if (code < lead->least || code > 0x10ffff || isSurrogate) {
+    return invalid;
+  }
+  return {static_cast<wchar_t>(code), lead->length, true};
 }
 
 bool isAscii(std::string_view text) {

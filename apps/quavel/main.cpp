@@ -68,8 +68,10 @@ int main(int argc, char** argv) {
     console.say("the output cannot be written: " + error.code().message() +
                 "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {
+    output.giveUp();
     console.say("not enough memory; leave out --sort, or name fewer files at a time");
   } catch (std::exception const& error) {
+    output.giveUp();
     console.say(std::string("unexpected: ") + error.what());
   }
   return app::kSomeFailed;

@@ -130,6 +130,11 @@ class Forms(CommandTest):
         self.assertNotIn(b"Lens", card.stdout)
         self.assertEqual(card.stderr, b"")
         self.assertRegex(self.run_quavel("--absent", "show", "a.cr3").stdout, rb"Lens +-\n")
+        self.put("b.tif", photo())
+        chosen = [["--fields", "iso,model", "b.tif"], ["--card", "--fields", "iso,model", "b.tif"]]
+        for arguments in chosen:
+            self.assertRegex(self.run_quavel(*arguments).stdout, rb"^  ISO +-\n  Camera +-\n$")
+            self.assertEqual(self.run_quavel("--absent", "skip", *arguments).stdout, b"")
 
     def test_table_shows_what_a_later_page_brings(self):
         for i in range(600):
@@ -181,6 +186,20 @@ class Names(CommandTest):
             self.assertIn(r"\x1b[31m\r\nÿ".replace(r"\r", r"\x0d"), text)
         usage = self.run_quavel("--\x1b[31m", status=2)
         self.assertNotIn(b"\x1b", usage.stderr)
+
+    def test_bytes_beyond_utf8_end_no_run(self):
+        for bad in (b"\xf4\x90\x80\x80", b"\xf8\x88\x80\x80\x80", b"\xfc\x84\x80\x80\x80\x80",
+                    b"\xed\xa0\x80", b"\xc0\xaf", b"\xe0\x80\xaf", b"\xf0\x8f\xbf\xbf"):
+            self.put(b"1" + bad + b".cr3", cr3(model=b"A" + bad))
+            self.put("2.cr3", cr3(model="\U0010ffff\ud7ff\u0800".encode()))
+            for form in ([], ["--card"], ["--json"], ["--jsonl"], ["--csv"]):
+                output = self.run_quavel(*form, ".").stdout.decode()  # strict
+                self.assertIn("2.cr3", output)
+            first, second = json.loads(self.run_quavel("--json", ".").stdout)
+            self.assertEqual(first["model"], "A" + bad.decode("latin1"))
+            self.assertEqual(first["path"], "./1" + "\ufffd" * len(bad) + ".cr3")
+            self.assertEqual(second["model"], "\U0010ffff\ud7ff\u0800")
+            os.remove(os.path.join(os.fsencode(self.folder), b"1" + bad + b".cr3"))
 
     def test_texts_that_are_no_utf8_are_latin1(self):
         self.put("a.cr3", cr3(model=b"Cam\xe9ra"))
