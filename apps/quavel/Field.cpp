@@ -44,7 +44,7 @@ Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 Value error(Outcome const& outcome) { return present(outcome.error); }
 
 Value pathBytes(Outcome const& outcome) {
-  if (isAscii(outcome.path) || isUtf8(outcome.path)) {
+  if (pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";

@@ -124,13 +124,13 @@ std::string textAsUtf8(std::string text) {
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isAscii(path)) {
+  if (isAscii(path) && path.find('\0') == std::string::npos) {
     return path;
   }
   std::string utf8;
   for (std::string_view rest = path; !rest.empty();) {
     Character const next = firstCharacter(rest);
-    utf8 += next.isValid ? rest.substr(0, next.length) : "\xef\xbf\xbd";
+    utf8 += next.isValid && next.code != 0 ? rest.substr(0, next.length) : "\xef\xbf\xbd";
     rest.remove_prefix(next.length);
   }
   return utf8;

@@ -23,7 +23,7 @@ bool isUtf8(std::string_view text);
 /// A text out of a file as UTF-8. Files that are not UTF-8 are mostly Latin-1: when any byte is
 /// wrong, all from 0x80 on are taken as the characters of that number.
 std::string textAsUtf8(std::string text);
-/// A file name as UTF-8, each byte that is none replaced by U+FFFD.
+/// A file name as UTF-8, each byte that is none, and each NUL, replaced by U+FFFD.
 std::string pathAsUtf8(std::string const& path);
 
 /// Terminal cells that an escaped text takes.

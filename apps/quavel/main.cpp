@@ -20,7 +20,10 @@ namespace {
 /// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
 /// under their numbers.
 void holdStandardStreams() {
-  int fd = 0;
+  int fd = STDIN_FILENO;
+  if (::fcntl(fd, F_GETFD) == -1) {
+    fd = ::open("/dev/null", O_WRONLY | O_CLOEXEC);  // empty input would pass for an empty list
+  }
   do {
     fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);

@@ -173,6 +173,8 @@ class Names(CommandTest):
                      for r in records]
             self.assertEqual(paths, names)
         self.assertEqual(records[4]["path"], "caf\ufffd.tif")
+        row, = self.rows("--files-from", "-", input=b"b\0c\n", status=1)
+        self.assertEqual((row["path"], row["pathBytes"]), ("b\ufffdc", "620063"))
 
     def test_nothing_steers_the_terminal(self):
         name = b"\x1b]0;owned\x07\xe9\xe2\x80\xae.cr3"
@@ -269,8 +271,12 @@ class Inputs(CommandTest):
         for arguments in ([], ["--json", "--csv", "x"], ["--fields", "colour", "x"], ["--stdin"],
                           ["--fields", "iso,iso", "x"], ["-0", "x"], ["--jobs", "0", "x"],
                           ["--stdin", "--extension", "txt"], ["--stdin", "--extension", "nef", "x"],
-                          ["--absent", "no", "x"], ["--files-from", "missing"], ["--nonsense"]):
-            done = self.run_quavel(*arguments, status=2)
+                          ["--absent", "no", "x"], ["--files-from", "missing"], ["--nonsense"],
+                          ["--files-from", "."], ["--files-from", "-"], ["--why", ""],
+                          ["--files-from", ""], ["--sort", "", "x"],
+                          ["--absent", "", "x"], ["--fields", "iso,,model", "x"],
+                          ["--fields", "", "x"], ["--fields", "iso,", "x"]):
+            done = self.run_quavel(*arguments, status=2, preexec_fn=lambda: os.close(0))
             self.assertRegex(done.stderr, rb"^quavel: .")
             self.assertEqual(done.stdout, b"")
 
@@ -300,7 +306,8 @@ class Endings(CommandTest):
             process.stderr.close()
 
     def test_interrupt_leaves_whole_output(self):
-        for jobs in ("1", "3"):
+        for jobs, signals in (("1", [signal.SIGINT]), ("3", [signal.SIGINT]),
+                              ("1", [signal.SIGINT, signal.SIGTERM, signal.SIGHUP])):
             with tempfile.TemporaryFile() as listed:
                 listed.write(self.many())
                 listed.seek(0)
@@ -308,9 +315,10 @@ class Endings(CommandTest):
                 with subprocess.Popen([COMMAND, "--json", "--jobs", jobs, "-0", "--files-from", "-"],
                                       stdin=listed, stdout=subprocess.PIPE, cwd=self.folder) as process:
                     select.select([process.stdout], [], [], 60)
-                    process.send_signal(signal.SIGINT)
+                    for number in signals:
+                        process.send_signal(number)
                     output = process.stdout.read()
-                    self.assertEqual(process.wait(60), 130)
+                    self.assertIn(process.wait(60), [128 + number for number in signals])
             self.assertLess(len(json.loads(output)), 20000)
 
     def test_records_come_before_the_list_ends(self):
