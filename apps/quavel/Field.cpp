@@ -16,6 +16,7 @@ namespace {
 using quavel::QVMetadata;
 
 constexpr std::size_t kLongestCell = 200;
+constexpr std::size_t kMostBytes = 8 * kLongestCell;
 
 template <class T>
 Value present(T value) {
@@ -144,7 +145,7 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   }
   std::string text = field.words(value);
   text.erase(text.find_last_not_of(' ') + 1);  // cameras pad their texts
-  return keepStart(escaped(text), kLongestCell);
+  return keepStart(escaped(text), kLongestCell, kMostBytes);
 }
 
 std::string exact(float value) {

@@ -165,6 +165,15 @@ void check(Options& options, Texts const& texts) {
   }
 }
 
+/// The parser parts some groups by two blank lines.
+std::string helpOf(CLI::App const& command) {
+  std::string help = command.help();
+  for (auto at = help.find("\n\n\n"); at != std::string::npos; at = help.find("\n\n\n")) {
+    help.erase(at, 1);
+  }
+  return help;
+}
+
 }  // namespace
 
 ParsedOptions parseOptions(int argc, char const* const* argv) {
@@ -186,7 +195,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
     check(options, texts);
   } catch (CLI::CallForHelp const&) {
     parsed.status = kSuccess;
-    parsed.output = command.help();
+    parsed.output = helpOf(command);
   } catch (CLI::CallForVersion const& version) {
     parsed.status = kSuccess;
     parsed.output = std::string(version.what()) + "\n";

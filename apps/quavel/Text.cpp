@@ -46,14 +46,14 @@ std::size_t cellsOf(Character const& character) {
   return width < 0 ? 1 : static_cast<std::size_t>(width);
 }
 
-/// Bytes at the start of `text` that fit the cells.
-std::size_t fittingBytes(std::string_view text, std::size_t width) {
+/// Bytes at the start of `text` that fit the cells, and are no more than `most`.
+std::size_t fittingBytes(std::string_view text, std::size_t width, std::size_t most) {
   std::size_t bytes = 0;
   std::size_t used = 0;
   while (bytes < text.size()) {
     Character const next = firstCharacter(text.substr(bytes));
     used += cellsOf(next);
-    if (used > width) {
+    if (used > width || bytes + next.length > most) {
       break;
     }
     bytes += next.length;
@@ -149,14 +149,14 @@ std::size_t cells(std::string_view text) {
   return sum;
 }
 
-std::string keepStart(std::string const& text, std::size_t width) {
-  if (cells(text) <= width) {
+std::string keepStart(std::string const& text, std::size_t width, std::size_t most) {
+  if (text.size() <= most && cells(text) <= width) {
     return text;
   }
   if (width == 0) {
     return {};
   }
-  return text.substr(0, fittingBytes(text, width - 1)).append(kEllipsis);
+  return text.substr(0, fittingBytes(text, width - 1, most)).append(kEllipsis);
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
@@ -169,9 +169,13 @@ std::string keepEnd(std::string const& text, std::size_t width) {
   }
   std::size_t dropped = 0;
   std::size_t left = all;
-  while (left > width - 1) {
+  while (dropped < text.size()) {
     Character const next = firstCharacter(std::string_view(text).substr(dropped));
-    left -= cellsOf(next);
+    std::size_t const taken = cellsOf(next);
+    if (left < width && taken > 0) {  // a mark would go to the ellipsis
+      break;
+    }
+    left -= taken;
     dropped += next.length;
   }
   return std::string(kEllipsis) + text.substr(dropped);

@@ -29,7 +29,9 @@ std::string pathAsUtf8(std::string const& path);
 /// Terminal cells that an escaped text takes.
 std::size_t cells(std::string_view text);
 /// The start of an escaped text, respectively its end, cut with "…" to fit the cells.
-std::string keepStart(std::string const& text, std::size_t width);
+/// The start has no more bytes than `most` besides: marks take no cells.
+std::string keepStart(std::string const& text, std::size_t width,
+                      std::size_t most = std::string::npos);
 std::string keepEnd(std::string const& text, std::size_t width);
 
 }  // namespace app
