@@ -9,6 +9,7 @@ import os
 import pty
 import re
 import select
+import shutil
 import signal
 import struct
 import subprocess
@@ -180,6 +181,19 @@ class Forms(CommandTest):
                               ("quavel.fish", r"set -l fields ((?:[^\n]*\\\n)*[^\n]*)")):
             found = re.search(pattern, (folder / name).read_text(encoding="utf-8"))
             self.assertEqual(found[1].replace("\\", " ").split(), header, name)
+
+    @unittest.skipUnless(shutil.which("bash"), "needs bash")
+    def test_bash_completes_values_and_names(self):
+        self.put("-a.tif", b"")
+        script = Path(__file__).resolve().parents[2] / "apps/quavel/completions/quavel"
+        for words, expected in ((["--absent", "=", "sh"], "show"), (["--absent", "="], "skip show"),
+                                (["--absent", "s"], "skip show"), (["--fields", "=", "iso,mod"], "iso,model"),
+                                (["--cs"], "--csv"), (["--", "-"], "-a.tif"), (["--", "--sort", "i"], "")):
+            run = 'compopt() { :; }; . "$0"; COMP_WORDS=(quavel "$@"); COMP_CWORD=$#; _quavel; ' \
+                  'echo "${COMPREPLY[*]}"'
+            done = subprocess.run(["bash", "-c", run, script, *words], cwd=self.folder,
+                                  capture_output=True, text=True, check=True, timeout=60)
+            self.assertEqual(done.stdout.strip(), expected, words)
 
 
 class Names(CommandTest):
