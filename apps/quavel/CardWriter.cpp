@@ -54,7 +54,7 @@ std::string cardOf(Options const& options, Outcome const& outcome) {
   }
   for (auto const* field : options.fields.empty() ? all : options.fields) {
     std::string const text = inWords(*field, outcome);
-    if (text.empty() && !options.showAbsent.value_or(false)) {
+    if (text.empty() && !options.showAbsent.value_or(!options.fields.empty())) {
       continue;
     }
     std::string label = field->label;

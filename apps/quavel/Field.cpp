@@ -16,6 +16,7 @@ namespace {
 using quavel::QVMetadata;
 
 constexpr std::size_t kLongestCell = 200;
+constexpr std::size_t kMostBytes = 8 * kLongestCell;
 
 template <class T>
 Value present(T value) {
@@ -44,7 +45,7 @@ Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 Value error(Outcome const& outcome) { return present(outcome.error); }
 
 Value pathBytes(Outcome const& outcome) {
-  if (isAscii(outcome.path) || isUtf8(outcome.path)) {
+  if (pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";
@@ -144,7 +145,7 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   }
   std::string text = field.words(value);
   text.erase(text.find_last_not_of(' ') + 1);  // cameras pad their texts
-  return keepStart(escaped(text), kLongestCell);
+  return keepStart(escaped(text), kLongestCell, kMostBytes);
 }
 
 std::string exact(float value) {

@@ -23,11 +23,12 @@ void write(int fd, char const* text) {
   std::size_t left = std::strlen(text);
   while (left > 0) {
     ssize_t const count = ::write(fd, text, left);
-    if (count <= 0) {
+    if (count > 0) {
+      text += count;
+      left -= static_cast<std::size_t>(count);
+    } else if (count == 0 || errno != EINTR) {
       return;
     }
-    text += count;
-    left -= static_cast<std::size_t>(count);
   }
 }
 
@@ -45,7 +46,10 @@ void write(int fd, char const* text) {
 
 void handle(int signal) {
   if (askedBy != 0) {
-    ::_exit(128 + askedBy);
+    if (signal == SIGALRM) {
+      ::_exit(128 + askedBy);
+    }
+    return;  // the end is under way, and the alarm bounds it
   }
   askedBy = signal;
   if (!isWriting) {
@@ -78,7 +82,11 @@ void handle(int signal, struct sigaction const& action) {
 void install() {
   struct sigaction action = {};
   action.sa_handler = handle;  // without SA_RESTART: a write that waits returns
+  // None cuts another's handling short but the alarm.
   ::sigemptyset(&action.sa_mask);
+  for (int const signal : kSignals) {
+    ::sigaddset(&action.sa_mask, signal);
+  }
   handle(SIGALRM, action);
   for (int const signal : kSignals) {
     handle(signal, action);

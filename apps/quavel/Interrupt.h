@@ -26,7 +26,7 @@ void setTail(char const* tail);
 void setProgressShown(bool isShown);
 
 /// While one lives, an interrupt waits for it: what is being written is finished first. After a
-/// second, or at a second signal, it waits no more.
+/// second it waits no more; further signals change nothing.
 class WriteScope {
  public:
   WriteScope();

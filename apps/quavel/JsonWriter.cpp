@@ -14,6 +14,8 @@ constexpr std::size_t kUsualObject = 700;
 /// Appends a value. Nearly all texts can stand between quotes as they are; the others are left to
 /// the JSON library.
 struct AppendJson {
+  using Handler = nlohmann::json::error_handler_t;
+
   std::string& json;
 
   void operator()(std::monostate) const { json += "null"; }
@@ -27,7 +29,7 @@ struct AppendJson {
     if (std::all_of(value.begin(), value.end(), isPlain)) {
       json.append(1, '"').append(value).append(1, '"');
     } else {
-      json += nlohmann::json(value).dump();
+      json += nlohmann::json(value).dump(-1, ' ', false, Handler::replace);
     }
   }
   static bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }

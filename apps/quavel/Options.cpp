@@ -38,9 +38,9 @@ class ShortFormatter : public CLI::Formatter {
 
 /// The texts of the arguments before they are checked.
 struct Texts {
-  std::vector<std::string> fields;
-  std::string sort;
-  std::string absent;
+  std::vector<std::string> fields;  // each a list
+  std::optional<std::string> sort;
+  std::optional<std::string> absent;
 };
 
 std::string fieldNames() {
@@ -60,11 +60,30 @@ Field const* wantedField(std::string const& option, std::string const& name) {
   return field;
 }
 
+/// Splits by hand: the parser's own lists pass over empty names.
+void addFields(std::string_view list, Fields& fields) {
+  for (bool isLast = false; !isLast;) {
+    auto const comma = list.find(',');
+    isLast = comma == std::string_view::npos;
+    std::string const name(list.substr(0, comma));
+    auto const* const field = wantedField("--fields", name);
+    if (std::count(fields.begin(), fields.end(), field) > 0) {
+      throw CLI::ValidationError("--fields: '" + name + "' is named twice");
+    }
+    fields.push_back(field);
+    list.remove_prefix(isLast ? list.size() : comma + 1);
+  }
+}
+
+std::string refuseEmpty(std::string const& argument) {
+  return argument.empty() ? "is empty: name a file" : "";
+}
+
 void addInputs(CLI::App& command, Options& options) {
   command.add_option("PATH", options.paths, "Photos and folders of photos")->type_name("");
   auto* const list = command.add_option("--files-from", options.filesFrom,
                                         "Read the photos' paths from a file; -: standard input");
-  list->type_name("FILE");
+  list->type_name("FILE")->check(refuseEmpty);
   command.add_flag("-0,--null", options.isNulSeparated, "Paths in that file end with a NUL")
       ->needs(list);
   auto* const standardInput =
@@ -74,7 +93,8 @@ void addInputs(CLI::App& command, Options& options) {
   extension->type_name("EXT")->needs(standardInput);
   standardInput->needs(extension)->excludes(list);
   command.add_option("--why", options.why, "Tell why a file gives no record, or lacks fields")
-      ->type_name("FILE");
+      ->type_name("FILE")
+      ->check(refuseEmpty);
 }
 
 void addForms(CLI::App& command, FormKind& form) {
@@ -100,7 +120,6 @@ void addForms(CLI::App& command, FormKind& form) {
 
 void addChoices(CLI::App& command, Options& options, Texts& texts) {
   command.add_option("--fields", texts.fields, "Show these fields, in this order")
-      ->delimiter(',')
       ->expected(1, CLI::detail::expected_max_vector_size)
       ->allow_extra_args(false)
       ->type_name("A,B,..");
@@ -115,20 +134,16 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
 }
 
 void check(Options& options, Texts const& texts) {
-  for (auto const& name : texts.fields) {
-    auto const* const field = wantedField("--fields", name);
-    if (std::count(options.fields.begin(), options.fields.end(), field) > 0) {
-      throw CLI::ValidationError("--fields: '" + name + "' is named twice");
-    }
-    options.fields.push_back(field);
+  for (auto const& list : texts.fields) {
+    addFields(list, options.fields);
   }
-  if (!texts.sort.empty()) {
-    options.sort = wantedField("--sort", texts.sort);
+  if (texts.sort) {
+    options.sort = wantedField("--sort", *texts.sort);
   }
-  if (!texts.absent.empty() && texts.absent != "skip" && texts.absent != "show") {
+  if (texts.absent && texts.absent != "skip" && texts.absent != "show") {
     throw CLI::ValidationError("--absent: give skip or show");
   }
-  if (!texts.absent.empty()) {
+  if (texts.absent) {
     options.showAbsent = texts.absent == "show";
   }
   if (options.fromStdin) {
@@ -148,6 +163,15 @@ void check(Options& options, Texts const& texts) {
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
                                         : "no photos given: name files or folders");
   }
+}
+
+/// The parser parts some groups by two blank lines.
+std::string helpOf(CLI::App const& command) {
+  std::string help = command.help();
+  for (auto at = help.find("\n\n\n"); at != std::string::npos; at = help.find("\n\n\n")) {
+    help.erase(at, 1);
+  }
+  return help;
 }
 
 }  // namespace
@@ -171,7 +195,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
     check(options, texts);
   } catch (CLI::CallForHelp const&) {
     parsed.status = kSuccess;
-    parsed.output = command.help();
+    parsed.output = helpOf(command);
   } catch (CLI::CallForVersion const& version) {
     parsed.status = kSuccess;
     parsed.output = std::string(version.what()) + "\n";

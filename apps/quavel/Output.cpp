@@ -8,6 +8,7 @@
 
 #include <cerrno>
 #include <system_error>
+#include <utility>
 
 #include "Console.h"
 #include "Interrupt.h"
@@ -95,8 +96,15 @@ void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
   interrupt::setTail(nullptr);
-  if (tail_ != nullptr) {
-    write(tail_);
+  if (char const* const tail = std::exchange(tail_, nullptr)) {
+    write(tail);
+  }
+}
+
+void Output::giveUp() noexcept {
+  try {
+    finish();
+  } catch (...) {  // NOLINT(bugprone-empty-catch): the caller reports what came first
   }
 }
 

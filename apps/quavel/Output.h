@@ -26,6 +26,8 @@ class Output {
   void enclose(std::string_view head, char const* tail);
   /// Flushes and writes the tail.
   void finish();
+  /// The same when the rest is lost already: nothing is thrown.
+  void giveUp() noexcept;
 
   bool isTerminal() const { return isTerminal_; }
   /// Cells in a line of the terminal.

@@ -2,6 +2,7 @@
 
 #include <fcntl.h>
 #include <poll.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -14,13 +15,26 @@ namespace {
 constexpr std::size_t kStep = std::size_t{1} << 16;
 constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system takes none longer
 
+/// What the first read would say, before anything is put out. 0, or the system's error.
+int whyUnreadable(int fd) {
+  struct stat status = {};
+  int const flags = ::fcntl(fd, F_GETFL);
+  if (flags == -1 || (flags & O_ACCMODE) == O_WRONLY) {
+    return EBADF;
+  }
+  return ::fstat(fd, &status) == 0 && S_ISDIR(status.st_mode) ? EISDIR : 0;
+}
+
 }  // namespace
 
 PathList::PathList(std::string const& name, char separator)
     : fd_(name == "-" ? STDIN_FILENO : ::open(name.c_str(), O_RDONLY | O_CLOEXEC)),
       separator_(separator) {
-  if (fd_ == -1) {
-    throw std::system_error(errno, std::generic_category());
+  if (int const problem = fd_ == -1 ? errno : whyUnreadable(fd_)) {
+    if (fd_ > STDIN_FILENO) {
+      ::close(fd_);
+    }
+    throw std::system_error(problem, std::generic_category());
   }
 }
 

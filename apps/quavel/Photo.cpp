@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <exception>
 #include <new>
 #include <system_error>
 #include <utility>
@@ -154,6 +155,8 @@ Outcome readPhoto(Input input) {
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
+  } catch (std::exception const& error) {
+    outcome.error = std::string("cannot be read: ") + error.what();
   }
   return outcome;
 }
@@ -173,6 +176,8 @@ Outcome readStandardInput(std::string const& extension) {
     }
   } catch (std::bad_alloc const&) {
     outcome.error = kOutOfMemory;
+  } catch (std::exception const& error) {
+    outcome.error = std::string("cannot be read: ") + error.what();
   }
   return outcome;
 }

@@ -59,7 +59,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
 int Runner::run() {
   if (options_.fromStdin) {
     Outcome outcome = readStandardInput(options_.extension);
-    writer_->prepare(outcome);
+    writer_->prepareSafely(outcome);
     emit(std::move(outcome));
     return end();
   }
@@ -109,7 +109,7 @@ void Runner::work(Batch& batch) const {
   batch.outcomes.reserve(batch.inputs.size());
   for (auto& input : batch.inputs) {
     Outcome outcome = readPhoto(std::move(input));
-    writer_->prepare(outcome);
+    writer_->prepareSafely(outcome);
     batch.bytes += outcome.text.size();
     batch.outcomes.push_back(std::move(outcome));
   }

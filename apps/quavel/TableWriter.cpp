@@ -13,6 +13,7 @@ namespace {
 
 constexpr std::size_t kPage = 500;
 constexpr auto kPatience = std::chrono::milliseconds(200);
+constexpr auto kFirstPatience = std::chrono::milliseconds(12);  // then a user sees that it works
 constexpr std::size_t kLeastChosen = 6;
 
 std::vector<Column> defaultColumns() {
@@ -74,8 +75,9 @@ TableWriter::TableWriter(Options const& options, Output& output)
 void TableWriter::prepare(Outcome& outcome) const {
   if (outcome.record) {
     outcome.cells = cellsOf(outcome);
-    outcome.text = cardOf(options_, outcome);
-    outcome.record.reset();
+    if (!isCardLikely_) {
+      outcome.record.reset();
+    }
   }
 }
 
@@ -92,16 +94,18 @@ std::vector<std::string> TableWriter::cellsOf(Outcome const& outcome) const {
 
 void TableWriter::add(Outcome&& outcome) {
   if (++files_ == 1) {
-    card_ = std::move(outcome.text);
+    first_ = outcome;
+    isCardLikely_ = false;
   }
   auto const now = std::chrono::steady_clock::now();
-  if (page_.empty()) {
+  if (page_.empty() && !natural_.empty()) {
     pageStart_ = now;
   }
   if (!outcome.cells.empty()) {
     page_.push_back(std::move(outcome.cells));
   }
-  if (page_.size() == kPage || (files_ > 1 && now - pageStart_ > kPatience)) {
+  auto const patience = natural_.empty() ? kFirstPatience : kPatience;
+  if (page_.size() == kPage || (files_ > 1 && now - pageStart_ > patience)) {
     writePage();
   }
 }
@@ -114,7 +118,7 @@ void TableWriter::pause() {
 
 void TableWriter::end() {
   if (files_ == 1) {
-    output_.add(card_);
+    output_.add(cardOf(options_, first_));
   } else {
     writePage();
   }

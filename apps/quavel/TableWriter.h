@@ -1,6 +1,7 @@
 #ifndef QUAVEL_APPS_TABLEWRITER_H
 #define QUAVEL_APPS_TABLEWRITER_H
 
+#include <atomic>
 #include <chrono>
 
 #include "Layout.h"
@@ -29,9 +30,10 @@ class TableWriter : public Writer {
   Output& output_;
   std::vector<Column> columns_;
   std::vector<std::vector<std::string>> page_;
-  std::chrono::steady_clock::time_point pageStart_;
+  std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   std::size_t files_ = 0;
-  std::string card_;  // of the first file
+  std::atomic<bool> isCardLikely_{true};  // no file has come yet: records are kept
+  Outcome first_;
   std::size_t line_ = 0;
   Widths natural_;  // of the layout in use
   Widths widths_;

@@ -4,12 +4,14 @@
 #include <wchar.h>
 
 #include <algorithm>
+#include <cstdint>
+#include <iterator>
 
 namespace app {
 
 namespace {
 
-/// Makes the C library's multibyte functions mean UTF-8 on this thread, whatever the user's locale.
+/// Makes the C library's `wcwidth` know all characters on this thread, whatever the user's locale.
 class Utf8Scope {
  public:
   Utf8Scope() : previous_(::uselocale(utf8())) {}
@@ -26,6 +28,16 @@ class Utf8Scope {
   locale_t previous_;
 };
 
+struct Lead {
+  unsigned char first;
+  unsigned char last;
+  std::size_t length;
+  std::uint32_t least;  // what is smaller has a shorter form
+};
+
+// Decoded here, as the C library takes numbers above U+10FFFF and longer forms for characters.
+constexpr Lead kLeads[] = {{0xc2, 0xdf, 2, 0x80}, {0xe0, 0xef, 3, 0x800}, {0xf0, 0xf4, 4, 0x10000}};
+
 constexpr std::string_view kEllipsis = "…";
 
 std::size_t cellsOf(Character const& character) {
@@ -34,14 +46,14 @@ std::size_t cellsOf(Character const& character) {
   return width < 0 ? 1 : static_cast<std::size_t>(width);
 }
 
-/// Bytes at the start of `text` that fit the cells.
-std::size_t fittingBytes(std::string_view text, std::size_t width) {
+/// Bytes at the start of `text` that fit the cells, and are no more than `most`.
+std::size_t fittingBytes(std::string_view text, std::size_t width, std::size_t most) {
   std::size_t bytes = 0;
   std::size_t used = 0;
   while (bytes < text.size()) {
     Character const next = firstCharacter(text.substr(bytes));
     used += cellsOf(next);
-    if (used > width) {
+    if (used > width || bytes + next.length > most) {
       break;
     }
     bytes += next.length;
@@ -56,14 +68,26 @@ Character firstCharacter(std::string_view text) {
   if (byte < 0x80) {
     return {static_cast<wchar_t>(byte), 1, true};
   }
-  Utf8Scope const scope;
-  std::mbstate_t state = {};
-  wchar_t code = 0;
-  std::size_t const length = std::mbrtowc(&code, text.data(), text.size(), &state);
-  if (length > text.size()) {  // invalid or incomplete: both are the largest numbers
-    return {static_cast<wchar_t>(byte), 1, false};
+  Character const invalid = {static_cast<wchar_t>(byte), 1, false};
+  auto const* const lead =
+      std::find_if(std::begin(kLeads), std::end(kLeads),
+                   [byte](Lead const& row) { return row.first <= byte && byte <= row.last; });
+  if (lead == std::end(kLeads) || text.size() < lead->length) {
+    return invalid;
   }
-  return {code, length, true};
+  std::uint32_t code = byte & (0x7fU >> lead->length);
+  for (std::size_t i = 1; i < lead->length; ++i) {
+    auto const next = static_cast<unsigned char>(text[i]);
+    if ((next & 0xc0) != 0x80) {
+      return invalid;
+    }
+    code = code << 6 | (next & 0x3f);
+  }
+  bool const isSurrogate = 0xd800 <= code && code <= 0xdfff;
+  if (code < lead->least || code > 0x10ffff || isSurrogate) {
+    return invalid;
+  }
+  return {static_cast<wchar_t>(code), lead->length, true};
 }
 
 bool isAscii(std::string_view text) {
@@ -100,13 +124,13 @@ std::string textAsUtf8(std::string text) {
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isAscii(path)) {
+  if (isAscii(path) && path.find('\0') == std::string::npos) {
     return path;
   }
   std::string utf8;
   for (std::string_view rest = path; !rest.empty();) {
     Character const next = firstCharacter(rest);
-    utf8 += next.isValid ? rest.substr(0, next.length) : "\xef\xbf\xbd";
+    utf8 += next.isValid && next.code != 0 ? rest.substr(0, next.length) : "\xef\xbf\xbd";
     rest.remove_prefix(next.length);
   }
   return utf8;
@@ -125,14 +149,14 @@ std::size_t cells(std::string_view text) {
   return sum;
 }
 
-std::string keepStart(std::string const& text, std::size_t width) {
-  if (cells(text) <= width) {
+std::string keepStart(std::string const& text, std::size_t width, std::size_t most) {
+  if (text.size() <= most && cells(text) <= width) {
     return text;
   }
   if (width == 0) {
     return {};
   }
-  return text.substr(0, fittingBytes(text, width - 1)).append(kEllipsis);
+  return text.substr(0, fittingBytes(text, width - 1, most)).append(kEllipsis);
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
@@ -145,9 +169,13 @@ std::string keepEnd(std::string const& text, std::size_t width) {
   }
   std::size_t dropped = 0;
   std::size_t left = all;
-  while (left > width - 1) {
+  while (dropped < text.size()) {
     Character const next = firstCharacter(std::string_view(text).substr(dropped));
-    left -= cellsOf(next);
+    std::size_t const taken = cellsOf(next);
+    if (left < width && taken > 0) {  // a mark would go to the ellipsis
+      break;
+    }
+    left -= taken;
     dropped += next.length;
   }
   return std::string(kEllipsis) + text.substr(dropped);

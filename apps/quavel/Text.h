@@ -23,13 +23,15 @@ bool isUtf8(std::string_view text);
 /// A text out of a file as UTF-8. Files that are not UTF-8 are mostly Latin-1: when any byte is
 /// wrong, all from 0x80 on are taken as the characters of that number.
 std::string textAsUtf8(std::string text);
-/// A file name as UTF-8, each byte that is none replaced by U+FFFD.
+/// A file name as UTF-8, each byte that is none, and each NUL, replaced by U+FFFD.
 std::string pathAsUtf8(std::string const& path);
 
 /// Terminal cells that an escaped text takes.
 std::size_t cells(std::string_view text);
 /// The start of an escaped text, respectively its end, cut with "…" to fit the cells.
-std::string keepStart(std::string const& text, std::size_t width);
+/// The start has no more bytes than `most` besides: marks take no cells.
+std::string keepStart(std::string const& text, std::size_t width,
+                      std::size_t most = std::string::npos);
 std::string keepEnd(std::string const& text, std::size_t width);
 
 }  // namespace app

@@ -10,6 +10,9 @@ namespace {
 
 /// The number with up to `digits` decimals, without trailing zeros.
 std::string decimal(float value, int digits) {
+  if (std::isinf(value)) {
+    return value < 0 ? "-∞" : "∞";
+  }
   if (!(std::fabs(value) < 1e7F)) {
     char text[32];
     std::snprintf(text, sizeof text, "%g", static_cast<double>(value));

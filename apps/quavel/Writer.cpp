@@ -1,6 +1,7 @@
 #include "Writer.h"
 
 #include <algorithm>
+#include <exception>
 
 #include "CardWriter.h"
 #include "CsvWriter.h"
@@ -40,7 +41,7 @@ void SortingWriter::end() {
     return left < right;
   });
   for (auto& outcome : outcomes_) {
-    next_->prepare(outcome);
+    next_->prepareSafely(outcome);
     next_->add(std::move(outcome));
     outcome = {};
   }
@@ -64,6 +65,18 @@ std::unique_ptr<Writer> makeForm(Options const& options, Output& output) {
 }  // namespace
 
 Writer::~Writer() = default;
+
+void Writer::prepareSafely(Outcome& outcome) const {
+  try {
+    prepare(outcome);
+  } catch (std::exception const& error) {
+    Outcome failed;
+    failed.path = std::move(outcome.path);
+    failed.error = std::string("cannot be shown: ") + error.what();
+    outcome = std::move(failed);
+    prepare(outcome);
+  }
+}
 
 std::unique_ptr<Writer> makeWriter(Options const& options, Output& output) {
   auto form = makeForm(options, output);

@@ -18,6 +18,8 @@ class Writer {
 
   /// Does the form's own share of the work on one file, on any thread. Drops the record.
   virtual void prepare(Outcome& outcome) const = 0;
+  /// The same, but what goes wrong becomes the error of the file and ends nothing.
+  void prepareSafely(Outcome& outcome) const;
   /// Takes the prepared outcomes in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
   /// Hands on what was held back: nothing else may come for a while.

@@ -20,7 +20,10 @@ namespace {
 /// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
 /// under their numbers.
 void holdStandardStreams() {
-  int fd = 0;
+  int fd = STDIN_FILENO;
+  if (::fcntl(fd, F_GETFD) == -1) {
+    fd = ::open("/dev/null", O_WRONLY | O_CLOEXEC);  // empty input would pass for an empty list
+  }
   do {
     fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);
@@ -68,8 +71,10 @@ int main(int argc, char** argv) {
     console.say("the output cannot be written: " + error.code().message() +
                 "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {
+    output.giveUp();
     console.say("not enough memory; leave out --sort, or name fewer files at a time");
   } catch (std::exception const& error) {
+    output.giveUp();
     console.say(std::string("unexpected: ") + error.what());
   }
   return app::kSomeFailed;
