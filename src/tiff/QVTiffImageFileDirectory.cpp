@@ -26,6 +26,7 @@ class WantedTags {
       std::sort(sorted_.begin(), sorted_.end());
       sorted_.erase(std::unique(sorted_.begin(), sorted_.end()), sorted_.end());
       distinctCount_ = sorted_.size();
+      mask_ = ~std::uint64_t{0};
       return;
     }
     for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
@@ -36,10 +37,18 @@ class WantedTags {
 
   bool areAll() const { return tags_.empty(); }
   bool contain(unsigned short tag) const {
+    if ((mask_ & bitOf(tag)) == 0) {
+      return false;
+    }
     if (!sorted_.empty()) {
       return std::binary_search(sorted_.begin(), sorted_.end(), tag);
     }
-    return (mask_ & bitOf(tag)) != 0 && std::find(tags_.begin(), tags_.end(), tag) != tags_.end();
+    for (unsigned short const wanted : tags_) {
+      if (wanted == tag) {
+        return true;
+      }
+    }
+    return false;
   }
   /// One named twice counts once.
   std::size_t distinctCount() const { return distinctCount_; }
