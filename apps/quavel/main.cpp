@@ -20,10 +20,11 @@ namespace {
 /// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
 /// under their numbers.
 void holdStandardStreams() {
-  int fd = STDIN_FILENO;
-  if (::fcntl(fd, F_GETFD) == -1) {
-    fd = ::open("/dev/null", O_WRONLY | O_CLOEXEC);  // empty input would pass for an empty list
+  if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
+    // Not for reading: empty input would pass for an empty list.
+    static_cast<void>(::open("/dev/null", O_WRONLY | O_CLOEXEC));
   }
+  int fd = -1;
   do {
     fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);
