@@ -40,14 +40,14 @@ constexpr int kMostSegments = 1 << 24;
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
-    {0xffd0, 2},
-    {0xffd1, 2},
-    {0xffd2, 2},
-    {0xffd3, 2},  // RST0 to RST3
-    {0xffd4, 2},
-    {0xffd5, 2},
-    {0xffd6, 2},
-    {0xffd7, 2},  // RST4 to RST7
+    {0xffd0, 2},  // RST0
+    {0xffd1, 2},  // RST1
+    {0xffd2, 2},  // RST2
+    {0xffd3, 2},  // RST3
+    {0xffd4, 2},  // RST4
+    {0xffd5, 2},  // RST5
+    {0xffd6, 2},  // RST6
+    {0xffd7, 2},  // RST7
     {0xffd9, 2},  // EOI
 }};
 

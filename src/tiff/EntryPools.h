@@ -18,19 +18,15 @@ template <class T, std::size_t kBlockSize>
 class BlockPool {
  public:
   std::shared_ptr<T> make() {
-    startBlockIfFull();
-    T* const object = block_->end();
-    ++block_->used;
-    return {block_, ::new (object) T()};
+    T* const object = makeInBlock();
+    return {block_, object};
   }
 
   /// Appends a new object to a list. The objects come from two blocks in turn: when a list is let
   /// go, counting down the same block at every step would make each step wait for the one before.
   T& appendTo(std::vector<std::shared_ptr<T>>& list) {
     block_.swap(otherBlock_);
-    startBlockIfFull();
-    T* const object = ::new (block_->end()) T();
-    ++block_->used;
+    T* const object = makeInBlock();
     list.emplace_back(block_, object);
     return *object;
   }
@@ -49,10 +45,13 @@ class BlockPool {
     alignas(T) std::byte slots[kBlockSize * sizeof(T)];
   };
 
-  void startBlockIfFull() {
+  T* makeInBlock() {
     if (!block_ || block_->used == kBlockSize) {
       block_ = std::make_shared<Block>();
     }
+    T* const object = ::new (block_->end()) T();
+    ++block_->used;
+    return object;
   }
 
   std::shared_ptr<Block> block_;
