@@ -3,6 +3,7 @@
 #include <utility>
 
 #include "formats/BoxTypes.h"
+#include "formats/BoxWalk.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVCR3CMT1Box.h"
 #include "quavel/QVCR3CMT2Box.h"
@@ -15,13 +16,13 @@ namespace quavel {
 bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
-  QVCR3Box topLevelBox;
+  QVCR3BoxHeader topLevelBox;
   for (int i = 0; i < box::kMostSiblings; ++i) {
     long const boxStart = stream->getOffset();
-    if (!topLevelBox.read(stream)) {
+    if (!detail::stepOverBox(stream, topLevelBox)) {
       return false;
     }
-    if (topLevelBox.boxHeader->type() == box::Moov) {
+    if (topLevelBox.boxType == box::Moov) {
       stream->setOffset(boxStart);
       QVCR3MoovBox moov;
       return moov.read(stream) && storeInfoFromMoov(moov);

@@ -1,6 +1,7 @@
 #include "quavel/QVCR3MoovBox.h"
 
 #include "formats/BoxTypes.h"
+#include "formats/BoxWalk.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVCR3UUIDBox.h"
 #include "quavel/QVStream.h"
@@ -31,17 +32,17 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  QVCR3Box child;
+  QVCR3BoxHeader child;
   int siblings = 0;
   int metadataBoxes = 0;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (++siblings > box::kMostSiblings) {
       return false;
     }
-    if (!child.read(stream)) {
+    if (!detail::stepOverBox(stream, child)) {
       return false;
     }
-    if (child.boxHeader->type() != box::Uuid) {
+    if (child.boxType != box::Uuid) {
       continue;
     }
     stream->setOffset(childStart);

@@ -1,6 +1,7 @@
 #include "quavel/QVCR3UUIDBox.h"
 
 #include "formats/BoxTypes.h"
+#include "formats/BoxWalk.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVCR3CMT1Box.h"
 #include "quavel/QVCR3CMT2Box.h"
@@ -46,17 +47,17 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  QVCR3Box child;
+  QVCR3BoxHeader child;
   int siblings = 0;
   int directoryBoxes = 0;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (++siblings > box::kMostSiblings) {
       return false;
     }
-    if (!child.read(stream)) {
+    if (!detail::stepOverBox(stream, child)) {
       return false;
     }
-    unsigned int const type = child.boxHeader->type();
+    std::uint32_t const type = child.boxType;
     if (type != box::CMT1 && type != box::CMT2) {
       continue;
     }
