@@ -55,6 +55,23 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
+/// Copies bytes. Most reads are of a number: copied by its known size, it takes no call.
+inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std::size_t count) {
+  switch (count) {
+    case 2:
+      std::memcpy(destination, source, 2);
+      return;
+    case 4:
+      std::memcpy(destination, source, 4);
+      return;
+    case 8:
+      std::memcpy(destination, source, 8);
+      return;
+    default:
+      std::memcpy(destination, source, count);
+  }
+}
+
 /// Reads until `count` bytes are there or the data ends, for a stream may deliver less at a time
 /// than is asked for. Returns how many there are.
 inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::size_t count) {

@@ -1,7 +1,8 @@
 #include "quavel/QVMStream.h"
 
 #include <algorithm>
-#include <cstring>
+
+#include "stream/Bytes.h"
 
 namespace quavel {
 
@@ -13,14 +14,7 @@ std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count)
   if (delivered == 0) {
     return 0;
   }
-  // Most reads are of a number: copied by its known size, it takes no call.
-  if (delivered == sizeof(std::uint32_t)) {
-    std::memcpy(destination, buffer + offset, sizeof(std::uint32_t));
-  } else if (delivered == sizeof(std::uint16_t)) {
-    std::memcpy(destination, buffer + offset, sizeof(std::uint16_t));
-  } else {
-    std::memcpy(destination, buffer + offset, delivered);
-  }
+  detail::copyBytes(destination, buffer + offset, delivered);
   offset += delivered;
   return static_cast<std::int64_t>(delivered);
 }

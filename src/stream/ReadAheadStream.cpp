@@ -1,8 +1,9 @@
 #include "stream/ReadAheadStream.h"
 
 #include <algorithm>
-#include <cstring>
 #include <utility>
+
+#include "stream/Bytes.h"
 
 namespace quavel::detail {
 
@@ -48,7 +49,7 @@ std::size_t ReadAheadStream::copyFromWindow(std::uint8_t* destination, std::size
     return 0;
   }
   std::size_t const copied = std::min(count, windowSize_ - skipped);
-  std::memcpy(destination, window_.data() + skipped, copied);
+  copyBytes(destination, window_.data() + skipped, copied);
   position_ += static_cast<std::int64_t>(copied);
   return copied;
 }
