@@ -176,7 +176,7 @@ TEST(TiffEntry, ConvertsTextUpToTheFirstNul) {
 }
 
 TEST(TiffDirectory, KeepsTheFirstOfTheWantedTags) {
-  Directory directory = {{ascii(kModel, "Camera"), shorts(kOrientation, {6}),
+  Directory directory = {{shorts(kOrientation, {6}), ascii(kModel, "Camera"),
                           shorts(kOrientation, {8}), values(0xbeef, 99, 1, {1}),
                           longs(kExif, {1234})}};
   directory.next = 77;
@@ -189,6 +189,11 @@ TEST(TiffDirectory, KeepsTheFirstOfTheWantedTags) {
   EXPECT_EQ(ifd.entryForTag(kOrientation)->values->front()->longValue(), 6U);
   EXPECT_EQ(ifd.nextIFDOffset, 77U);
   EXPECT_FALSE(ifd.entryForTag(kModel));
+
+  source.stream->setOffset(8);
+  QVTiffImageFileDirectory stopped;
+  ASSERT_TRUE(stopped.read(source.stream, {kOrientation}));
+  EXPECT_EQ(stopped.nextIFDOffset, 77U);
 
   source.stream->setOffset(8);
   EXPECT_FALSE(ifd.read(source.stream, {}));  // it wants the entry of type 99 too
@@ -248,37 +253,49 @@ TEST(TiffDirectory, TakesAStreamInPiecesButNoClaimBeyondWhatWasAsked) {
 
 TEST(TiffDirectory, ReadsValuesBehindTheFieldWhenTheSeekToThemIsRefused) {
   Bytes const before(100, '.');
-  TemporaryFile const file(before + tiff(kMM, {{claim(kModel, kAscii, 5, 50)}}).substr(8), "bin");
-  std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file.path);
-  stream->setOffset(100);
-  stream->baseOffset = -100;  // offset 50 is now before the start
-  QVTiffImageFileDirectory ifd;
-  EXPECT_FALSE(ifd.read(stream, {kModel}));  // only the next directory's offset is behind
-  TemporaryFile const longer(
-      before + tiff(kMM, {{claim(kModel, kAscii, 5, 50)}, 7}).substr(8) + "HELLO", "bin");
-  stream = std::make_shared<QVFStream>(longer.path);
-  stream->setOffset(100);
-  stream->baseOffset = -100;
-  ASSERT_TRUE(ifd.read(stream, {kModel}));
-  std::string text;
-  EXPECT_TRUE(ifd.entryForTag(kModel)->convertToString(text));
-  EXPECT_EQ(text, "");  // the four bytes of the offset 7 begin with NUL
-  EXPECT_EQ(ifd.entryForTag(kModel)->values->back()->charValue(), 'H');
+  Directory const directory = {{claim(kModel, kAscii, 5, 50)}, 7};
+  Directory const followed = {{claim(kModel, kAscii, 5, 50), claim(0x4845, 0x4c4c, 0x4f000000, 0)}};
+  struct Row {
+    Bytes bytes;
+    Bytes values;
+  };
+  for (Row const& row : {Row{tiff(kMM, directory) + "HELLO", Bytes("\0\0\0\7H", 5)},
+                         Row{tiff(kMM, followed), "HELLO"}}) {
+    TemporaryFile const file(before + row.bytes.substr(8), "bin");
+    std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file.path);
+    stream->setOffset(100);
+    stream->baseOffset = -100;  // offset 50 is now before the start
+    QVTiffImageFileDirectory ifd;
+    ASSERT_TRUE(ifd.read(stream, {kModel}));
+    Bytes values;
+    for (auto const& value : *ifd.entryForTag(kModel)->values) {
+      values.push_back(value->charValue());
+    }
+    EXPECT_EQ(values, row.values);
+  }
 }
 
 TEST(TiffDirectory, StopsOnceAllWantedTagsAreFound) {
   Bytes const three =
-      tiff(kII, {{shorts(1, {10}), shorts(2, {20}), shorts(3, {30})}, 0xffffffff}).substr(8, 38);
+      tiff(kII, {{shorts(1, {10}), shorts(65, {20}), shorts(3, {30})}, 0xffffffff}).substr(8, 38);
   Source source(u16(kII, 20) + three.substr(2), kII);
   QVTiffImageFileDirectory ifd;
   EXPECT_FALSE(ifd.read(source.stream, {4}));
   EXPECT_FALSE(ifd.entries);
-  source.stream->setOffset(0);
-  // All were found; then the next directory's offset is missing.
-  EXPECT_FALSE(ifd.read(source.stream, {3, 1}));
-  ASSERT_TRUE(ifd.entries);
-  EXPECT_EQ(ifd.entryForTag(3)->values->front()->longValue(), 30U);
-  EXPECT_EQ(ifd.nextIFDOffset, 0U);
+  for (int const times : {1, 2, 9}) {
+    std::vector<unsigned short> tags;
+    for (int i = 0; i < times; ++i) {
+      tags.insert(tags.end(), {3, 1});
+    }
+    source.stream->setOffset(0);
+    ifd.entries = nullptr;
+    // All are found; then the next directory's offset is missing.
+    EXPECT_FALSE(ifd.read(source.stream, tags));
+    ASSERT_TRUE(ifd.entries) << times;
+    EXPECT_EQ(ifd.entries->size(), 2U);
+    EXPECT_EQ(ifd.entryForTag(3)->values->front()->longValue(), 30U);
+    EXPECT_EQ(ifd.nextIFDOffset, 0U);
+  }
 }
 
 }  // namespace

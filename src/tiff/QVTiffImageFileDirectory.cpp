@@ -8,6 +8,7 @@
 #include "stream/Bytes.h"
 #include "tiff/EntryPools.h"
 #include "tiff/RawEntry.h"
+#include "tiff/WantedTags.h"
 
 namespace quavel {
 
@@ -17,113 +18,80 @@ namespace {
 // does. It bounds what the same few bytes, listed by each of 65535 entries, cost one who wants all.
 constexpr std::size_t kMostValues = std::size_t{1} << 20U;
 
-/// The tags that a directory's reader wants; none listed means all.
-class WantedTags {
+/// A walk over a directory's entries, which takes from the stream as many at a time as its buffer
+/// holds.
+class EntryWalk {
  public:
-  explicit WantedTags(std::vector<unsigned short> const& tags) : tags_(tags) {
-    if (tags.size() > kLongList) {
-      sorted_ = tags;
-      std::sort(sorted_.begin(), sorted_.end());
-      sorted_.erase(std::unique(sorted_.begin(), sorted_.end()), sorted_.end());
-      distinctCount_ = sorted_.size();
-      mask_ = ~std::uint64_t{0};
-      return;
-    }
-    for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
-      distinctCount_ += std::find(tags.begin(), tag, *tag) == tag ? 1 : 0;
-      mask_ |= bitOf(*tag);
-    }
-  }
-
-  bool areAll() const { return tags_.empty(); }
-  bool contain(unsigned short tag) const {
-    if ((mask_ & bitOf(tag)) == 0) {
-      return false;
-    }
-    if (!sorted_.empty()) {
-      return std::binary_search(sorted_.begin(), sorted_.end(), tag);
-    }
-    for (unsigned short const wanted : tags_) {
-      if (wanted == tag) {
-        return true;
-      }
-    }
-    return false;
-  }
-  /// One named twice counts once.
-  std::size_t distinctCount() const { return distinctCount_; }
-
- private:
-  static constexpr std::size_t kLongList = 16;  // no format's own list is longer
-
-  static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
-
-  std::vector<unsigned short> const& tags_;
-  std::vector<unsigned short> sorted_;  // of a long list only
-  std::uint64_t mask_ = 0;              // says of most unwanted tags that they are not listed
-  std::size_t distinctCount_ = 0;
-};
-
-/// Gives a directory's entries one after the other, taking from the stream as many at a time as
-/// its buffer holds.
-class EntryReader {
- public:
-  EntryReader(QVStream& stream, long firstEntry, unsigned short count)
+  /// The stream stands at the first of `count` entries.
+  EntryWalk(QVStream& stream, unsigned short count)
       : stream_(stream),
-        firstEntry_(firstEntry),
-        count_(count),
-        isReversed_(detail::isReversed(stream)) {}
+        isReversed_(detail::isReversed(stream)),
+        bufferOffset_(stream.getOffset()),
+        left_(count) {}
 
-  /// Goes on to entry `i`. False: its tag is not in the data. Moves the stream.
-  bool moveTo(unsigned short i) {
-    current_ = detail::kEntrySize * static_cast<std::size_t>(i - firstBuffered_);
-    if (current_ + detail::kEntryTypePosition > buffered_) {
-      fill(i);
-    }
-    return current_ + detail::kEntryTypePosition <= buffered_;
+  bool isAtEnd() const { return left_ == 0; }
+
+  void advance() {
+    entry_ += detail::kEntrySize;
+    --left_;
+  }
+
+  /// Whether the data holds the current entry's tag. May move the stream.
+  bool hasTag() {
+    return isBuffered(detail::kEntryTypePosition) || fillBuffer();
   }
 
   unsigned short tag() const { return number<std::uint16_t>(0); }
 
-  /// The rest of the current entry. False: its type or count is not in the data.
+  /// What follows the tag. False: the type or the count is not in the data.
   bool readRest(detail::RawEntry* entry) const {
-    if (current_ + detail::kEntryFieldPosition > buffered_) {
+    if (!isBuffered(detail::kEntryFieldPosition)) {
       return false;
     }
     entry->typeCode = number<std::uint16_t>(detail::kEntryTypePosition);
     entry->count = number<std::uint32_t>(detail::kEntryCountPosition);
-    entry->field = buffer_.data() + current_ + detail::kEntryFieldPosition;
-    entry->fieldSize =
-        std::min(buffered_ - current_ - detail::kEntryFieldPosition, detail::kEntryFieldSize);
+    entry->field = entry_ + detail::kEntryFieldPosition;
+    auto const left = static_cast<std::size_t>(bufferEnd_ - entry->field);
+    entry->fieldSize = std::min(left, detail::kEntryFieldSize);
     return true;
   }
 
+  /// Where the next entry begins, and where the last one ends.
+  long nextOffset() const { return offset() + kEntrySize; }
+  long end() const { return offset() + kEntrySize * left_; }
+
  private:
+  static constexpr long kEntrySize = detail::kEntrySize;
+
+  long offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
+
+  /// Whether the buffer holds the first `size` bytes of the current entry.
+  bool isBuffered(std::size_t size) const {
+    return bufferEnd_ - entry_ >= static_cast<std::ptrdiff_t>(size);
+  }
+
   template <class Number>
   Number number(std::size_t position) const {
-    return detail::numberAt<Number>(buffer_.data() + current_ + position, isReversed_);
+    return detail::numberAt<Number>(entry_ + position, isReversed_);
   }
 
-  void fill(unsigned short i) {
-    std::size_t const left = detail::kEntrySize * static_cast<std::size_t>(count_ - i);
-    stream_.setOffset(offsetOf(i));
-    buffered_ = detail::readUpTo(stream_, buffer_.data(), std::min(left, buffer_.size()));
-    firstBuffered_ = i;
-    current_ = 0;
-  }
-
-  long offsetOf(unsigned short i) const {
-    return firstEntry_ + static_cast<long>(detail::kEntrySize) * i;
+  /// Buffers the current entry and those behind it. False: its tag is not in the data.
+  bool fillBuffer() {
+    bufferOffset_ = offset();
+    stream_.setOffset(bufferOffset_);
+    entry_ = buffer_.data();
+    std::size_t const size = std::min(detail::kEntrySize * left_, buffer_.size());
+    bufferEnd_ = entry_ + detail::readUpTo(stream_, buffer_.data(), size);
+    return isBuffered(detail::kEntryTypePosition);
   }
 
   QVStream& stream_;
-  long const firstEntry_;
-  unsigned short const count_;
   bool const isReversed_;
-  unsigned short firstBuffered_ = 0;
-  std::size_t current_ = 0;   // where the current entry begins in the buffer
-  std::size_t buffered_ = 0;  // bytes
+  long bufferOffset_;  // of the buffer's first byte in the stream
+  unsigned int left_;  // entries from the current one on
   std::array<std::uint8_t, 64 * detail::kEntrySize> buffer_;
+  std::uint8_t const* entry_ = buffer_.data();
+  std::uint8_t const* bufferEnd_ = buffer_.data();
 };
 
 }  // namespace
@@ -153,45 +121,35 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
 bool QVTiffImageFileDirectory::readEntries(std::shared_ptr<QVStream>& stream, unsigned short count,
                                            std::vector<unsigned short> const& tags,
                                            EntryMap& kept) {
+  detail::WantedTags wanted(tags.data(), tags.size());
   detail::EntryPools pools;
-  WantedTags const wanted(tags);
-  long const firstEntry = stream->getOffset();
-
   std::size_t valuesRead = 0;
-  EntryReader entryReader(*stream, firstEntry, count);
-  for (unsigned short i = 0; i < count; ++i) {
-    if (!entryReader.moveTo(i)) {
+  EntryWalk walk(*stream, count);
+  for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
+    if (!walk.hasTag()) {
       return false;
     }
-    unsigned short const tag = entryReader.tag();
-    if (!wanted.areAll() && !wanted.contain(tag)) {
-      continue;
-    }
-    auto const place = kept.lower_bound(tag);
-    // A listed tag that has been met is wanted no longer.
-    bool const isMet = place != kept.end() && place->first == tag;
-    if (!wanted.areAll() && isMet) {
+    unsigned short const tag = walk.tag();
+    if (!wanted.take(tag)) {
       continue;
     }
     // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
-    stream->setOffset(firstEntry + static_cast<long>(detail::kEntrySize) * (i + 1));
+    stream->setOffset(walk.nextOffset());
     detail::RawEntry rawEntry;
     auto entry = pools.entries.make();
-    if (!entryReader.readRest(&rawEntry) || !entry->read(*stream, rawEntry, pools)) {
+    if (!walk.readRest(&rawEntry) || !entry->read(*stream, rawEntry, pools)) {
       return false;
     }
     valuesRead += entry->values ? entry->values->size() : 0;
     if (valuesRead > kMostValues) {
       return false;
     }
-    kept.emplace_hint(place, tag, std::move(entry));  // of a repeated tag, the first stays
-    if (!wanted.areAll() && kept.size() == wanted.distinctCount()) {
-      break;
-    }
+    // Most directories are sorted by tag. Of a repeated one, the first entry stays.
+    kept.emplace_hint(kept.end(), tag, std::move(entry));
   }
 
   // The entries may have left the stream anywhere.
-  stream->setOffset(firstEntry + static_cast<long>(detail::kEntrySize) * count);
+  stream->setOffset(walk.end());
   return true;
 }
 

@@ -1,0 +1,87 @@
+#ifndef QUAVEL_SRC_TIFF_WANTEDTAGS_H
+#define QUAVEL_SRC_TIFF_WANTEDTAGS_H
+
+#include <array>
+#include <bitset>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+
+namespace quavel::detail {
+
+/// The tags that the reader of a directory still wants: each until it is met. None listed means
+/// all, always.
+class WantedTags {
+ public:
+  WantedTags(unsigned short const* tags, std::size_t count) : areAll_(count == 0) {
+    if (areAll_) {
+      mask_ = ~std::uint64_t{0};
+    } else if (count > kShortList) {
+      longList_ = std::make_unique<LongList>();
+    }
+    for (auto const* tag = tags; tag != tags + count; ++tag) {
+      add(*tag);
+    }
+  }
+
+  /// Whether the tag is wanted. Having been met, a listed tag is wanted no longer.
+  bool take(unsigned short tag) {
+    if ((mask_ & bitOf(tag)) == 0) {
+      return false;
+    }
+    return areAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
+  }
+
+  /// Whether there is a list and all that it names was met.
+  bool areMet() const { return left_ == 0 && !areAll_; }
+
+ private:
+  static constexpr std::size_t kShortList = 16;  // no format's own list is longer
+  using LongList = std::bitset<std::size_t{UINT16_MAX} + 1>;
+
+  static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
+
+  void add(unsigned short tag) {
+    if (longList_) {
+      left_ += longList_->test(tag) ? 0 : 1;
+      longList_->set(tag);
+    } else if ((mask_ & bitOf(tag)) == 0 || find(tag) == left_) {
+      shortList_[left_++] = tag;
+    }
+    mask_ |= bitOf(tag);
+  }
+
+  bool takeFromLongList(unsigned short tag) {
+    bool const isWanted = longList_->test(tag);
+    longList_->reset(tag);
+    left_ -= isWanted ? 1 : 0;
+    return isWanted;
+  }
+
+  bool takeFromShortList(unsigned short tag) {
+    std::size_t const i = find(tag);
+    if (i == left_) {
+      return false;
+    }
+    shortList_[i] = shortList_[--left_];
+    return true;
+  }
+
+  std::size_t find(unsigned short tag) const {
+    std::size_t i = 0;
+    while (i < left_ && shortList_[i] != tag) {
+      ++i;
+    }
+    return i;
+  }
+
+  bool const areAll_;
+  std::uint64_t mask_ = 0;  // says of most unwanted tags that they are not listed
+  std::size_t left_ = 0;    // listed tags that are still to be met
+  std::array<unsigned short, kShortList> shortList_;
+  std::unique_ptr<LongList> longList_;  // null for a short one
+};
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_TIFF_WANTEDTAGS_H
