@@ -80,6 +80,23 @@ TEST(Allocation, FailureLeavesNothingBehind) {
   }
 }
 
+TEST(Allocation, AreFewWhateverTheFormat) {
+  for (Fixture const& fixture : fixtures()) {
+    SCOPED_TRACE(fixture.extension);
+    Bytes bytes = fixture.bytes(kII);
+    auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+    allocationsLeft = 20;
+    bool isEnough = true;
+    try {
+      QVReader(data, bytes.size(), fixture.extension);
+    } catch (std::bad_alloc const&) {
+      isEnough = false;
+    }
+    allocationsLeft = kNever;
+    EXPECT_TRUE(isEnough);
+  }
+}
+
 std::size_t heapOf(Bytes bytes, std::string const& extension) {
   auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
   std::size_t const before = live;

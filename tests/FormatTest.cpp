@@ -42,6 +42,20 @@ TEST(Tiff, LeavesOutWhatIsAbsent) {
         "width=6000 height=4000 orientation=9 " + kDates}});
 }
 
+TEST(Tiff, EndsBehindItsLastDirectory) {
+  Bytes const whole = tiff(kII, {{shorts(kWidth, {60}), shorts(kLength, {40})}});
+  EXPECT_EQ(describe(readBuffer(whole, "tif")), "width=60 height=40");
+  for (std::size_t cut = 1; cut <= 4; ++cut) {  // of the next directory's offset
+    EXPECT_FALSE(readBuffer(whole.substr(0, whole.size() - cut), "tif")) << cut;
+  }
+}
+
+TEST(Tiff, TakesALongText) {
+  Bytes const text = Bytes(600, 'a') + Bytes(600, 'b') + "c";
+  Bytes const file = tiff(kMM, {{characters(kDateTime, text), shorts(kOrientation, {6})}});
+  EXPECT_EQ(describe(readBuffer(file, "dng")), "orientation=6 isRaw dateTime=" + text);
+}
+
 TEST(Tiff, Refuses) {
   std::string const main = "orientation=6 " + kFileDate;
   std::string const size = "width=6000 height=4000 orientation=6 " + kFileDate;

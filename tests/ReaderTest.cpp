@@ -82,6 +82,59 @@ TEST(Reader, LeavesNoDescriptorOpen) {
   EXPECT_EQ(openDescriptors(), before);
 }
 
+/// A host's record, which keeps the first character of the Exif directory's date.
+template <class Format>
+struct Keeper : Format {
+  explicit Keeper(Format const& record) : Format(record) {}
+  bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override {
+    kept = ifd->entryForTag(kDateTimeOriginal)->values->front();
+    return Format::storeInfoFromExifIFD(ifd);
+  }
+  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> kept;
+};
+
+template <class Format>
+void expectToKeep(Bytes const& file, Keeper<Format> record) {
+  Source source(file);
+  ASSERT_TRUE(record.read(source.stream));
+  ASSERT_EQ(record.kept.use_count(), 1);
+  EXPECT_EQ(record.kept->charValue(), record.dateTimeOriginal.front());
+}
+
+template <class Format>
+void expectToKeep(std::string const& extension) {
+  SCOPED_TRACE(extension);
+  for (Fixture const& fixture : fixtures()) {
+    if (fixture.extension == extension) {
+      expectToKeep(fixture.bytes(kII), Keeper<Format>(Format()));
+      auto const readBefore = readBuffer(fixture.bytes(kII), extension);
+      expectToKeep(fixture.bytes(kII), Keeper<Format>(dynamic_cast<Format&>(*readBefore)));
+    }
+  }
+}
+
+TEST(Metadata, LetsAHostKeepPartsOfTheExifDirectory) {
+  expectToKeep<QVTiffImage>("tif");
+  expectToKeep<QVNefImage>("nef");
+  expectToKeep<QVARWImage>("arw");
+  expectToKeep<QVJPEGImage>("jpg");
+  expectToKeep<QVRafImage>("raf");
+}
+
+TEST(Metadata, TakesDatesFromAHostsDirectory) {
+  auto const ifd = std::make_shared<QVTiffImageFileDirectory>();
+  QVTiffImage record;
+  record.dateTimeOriginal = "before";
+  EXPECT_TRUE(record.storeInfoFromExifIFD(ifd));
+  Source source(tiff(kMM, {{ascii(kDateTimeDigitized, "digitized")}}));
+  source.stream->setOffset(8);
+  ASSERT_TRUE(ifd->read(source.stream, {}));
+  ifd->entries->emplace(kDateTimeOriginal, nullptr);
+  EXPECT_TRUE(record.storeInfoFromExifIFD(ifd));
+  EXPECT_EQ(record.dateTimeOriginal, "before");
+  EXPECT_EQ(record.dateTimeDigitized, "digitized");
+}
+
 TEST(Metadata, PrefersTheOriginalDate) {
   QVTiffImage record;
   EXPECT_EQ(record.captureDate(), "");

@@ -150,6 +150,15 @@ TEST(TiffEntry, ReadsAsManyValuesAsAreAllowed) {
   EXPECT_EQ(entry.values->back()->byteValue(), 7);
 }
 
+/// Longer than what is read at a time.
+Bytes longText() {
+  Bytes text;
+  while (text.size() < 1300) {
+    text += std::to_string(text.size()) + " ";
+  }
+  return text;
+}
+
 TEST(TiffEntry, ConvertsTextUpToTheFirstNul) {
   struct Row {
     Field field;
@@ -161,6 +170,7 @@ TEST(TiffEntry, ConvertsTextUpToTheFirstNul) {
       {characters(1, Bytes("AB\0CD", 5)), true, "AB"},
       {characters(1, "ABC"), true, "ABC"},
       {characters(1, "trailing  "), true, "trailing  "},
+      {characters(1, longText()), true, longText()},
       {characters(1, "\xe9t\xe9!!"), true, "\xe9t\xe9!!"},
       {characters(1, ""), true, ""},
       {longs(1, {65}), false, ""},
@@ -173,6 +183,11 @@ TEST(TiffEntry, ConvertsTextUpToTheFirstNul) {
     EXPECT_EQ(entry->convertToString(text), row.isText);
     EXPECT_EQ(text, row.text);
   }
+  auto const mixed = readEntry(kII, ascii(1, "ABC"));
+  mixed->values->at(2)->type = EntryValueType::BYTE;
+  std::string text;
+  EXPECT_FALSE(mixed->convertToString(text));
+  EXPECT_EQ(text, "AB");
 }
 
 TEST(TiffDirectory, KeepsTheFirstOfTheWantedTags) {
@@ -295,6 +310,17 @@ TEST(TiffDirectory, StopsOnceAllWantedTagsAreFound) {
     EXPECT_EQ(ifd.entries->size(), 2U);
     EXPECT_EQ(ifd.entryForTag(3)->values->front()->longValue(), 30U);
     EXPECT_EQ(ifd.nextIFDOffset, 0U);
+  }
+}
+
+TEST(TiffDirectory, RefusesAnEntryThatIsCut) {
+  Bytes const whole = tiff(kMM, {{shorts(kOrientation, {6})}});
+  for (std::size_t const left : {0U, 5U, 7U, 9U}) {  // bytes of the entry
+    Source source(whole.substr(0, 10 + left));
+    source.stream->setOffset(8);
+    QVTiffImageFileDirectory ifd;
+    EXPECT_FALSE(ifd.read(source.stream, {kOrientation}));
+    EXPECT_FALSE(ifd.entries) << left;
   }
 }
 

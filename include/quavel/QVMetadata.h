@@ -13,6 +13,10 @@ namespace quavel {
 class QVStream;
 class QVTiffImageFileDirectory;
 
+namespace detail {
+struct RecordOrigin;
+}  // namespace detail
+
 /// What a file tells about its image, and the base of the format readers that fill it. A field
 /// that the file does not give keeps its initial value: -1, NaN, the empty string or false. Texts
 /// are the file's own bytes up to the first NUL; tags are those of TIFF 6.0 and Exif.
@@ -26,7 +30,8 @@ class QUAVEL_EXPORT QVMetadata {
   /// stored by then keep their values.
   virtual bool read(std::shared_ptr<QVStream>& stream) = 0;
 
-  /// Takes the dates from an Exif directory. False: a date is there and is no text.
+  /// Takes the dates from an Exif directory, any part of which an override may keep. False: a date
+  /// is there and is no text.
   virtual bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
   /// The best date there is: the original one, else the digitized one, else the file's.
@@ -55,6 +60,11 @@ class QUAVEL_EXPORT QVMetadata {
   std::int32_t focalLengthIn35mmFilm = -1;  ///< Millimetres.
   float exposureTime = std::nanf("");       ///< Seconds.
   float fNumber = std::nanf("");            ///< Exif FNumber.
+
+ private:
+  friend struct detail::RecordOrigin;
+
+  bool isReadersOwn = false;  // a `QVReader` made it and is reading it
 };
 
 }  // namespace quavel

@@ -13,6 +13,10 @@ namespace quavel {
 class QVStream;
 class QVTiffImageFileDirectoryEntry;
 
+namespace detail {
+class BareDirectory;
+}  // namespace detail
+
 /// A TIFF image file directory (IFD): its wanted entries by tag.
 class QUAVEL_EXPORT QVTiffImageFileDirectory {
  public:
@@ -33,10 +37,9 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
   std::shared_ptr<std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>> entries;
 
  private:
-  using EntryMap = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
+  friend class detail::BareDirectory;
 
-  static bool readEntries(std::shared_ptr<QVStream>& stream, unsigned short count,
-                          std::vector<unsigned short> const& tags, EntryMap& kept);
+  detail::BareDirectory const* bare = nullptr;  // this object, when a reader reads it for itself
 };
 
 }  // namespace quavel

@@ -11,11 +11,10 @@
 namespace quavel {
 
 class QVStream;
-class QVTiffImageFileDirectory;
 class QVTiffImageFileDirectoryEntryValue;
 
 namespace detail {
-struct EntryPools;
+class MapSink;
 struct RawEntry;
 }  // namespace detail
 
@@ -40,9 +39,9 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
   std::uint32_t dataCount = 0;   ///< UNDEFINED of more: how many bytes; else 0.
 
  private:
-  friend class QVTiffImageFileDirectory;
+  friend class detail::MapSink;
 
-  bool read(QVStream& stream, detail::RawEntry const& entry, detail::EntryPools& pools);
+  bool read(QVStream& stream, detail::RawEntry const& entry);
   bool storeUndefined(detail::RawEntry const& entry, bool isReversed);
 };
 

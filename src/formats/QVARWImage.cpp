@@ -21,8 +21,8 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal}, exifIFD)) {
+  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                         exifIFD)) {
     return false;
   }
   if (!exifIFD) {
@@ -32,11 +32,11 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  if (!subIFDs || valueCount(subIFDs) == 0) {
+  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
+  if (subIFDs.size() == 0) {
     return true;
   }
-  auto const rawIFD = readDirectoryAt(stream, subIFDs->values->front()->longValue(),
+  auto const rawIFD = readDirectoryAt(stream, subIFDs[0]->longValue(),
                                       {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength});
   return rawIFD && storeInfoFromSubIFD0(rawIFD);
 }

@@ -15,7 +15,7 @@ namespace {
 /// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
 /// untouched. Not a single value: false.
 bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const* const entry = findEntry(directory, tag);
+  auto const entry = findEntry(directory, tag);
   if (!entry) {
     return true;
   }
@@ -31,7 +31,7 @@ bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& fi
 /// another type: false.
 bool storeFraction(Directory const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
-  auto const* const entry = findEntry(directory, tag);
+  auto const entry = findEntry(directory, tag);
   if (!entry) {
     return true;
   }

@@ -171,10 +171,10 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
-                      tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
-                     exifIFD)) {
+  if (!followExifPointer(*this, stream, mainIFD,
+                         {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
+                          tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
+                         exifIFD)) {
     return false;
   }
   return !exifIFD || storeInfoFromExifIFD(exifIFD);
@@ -201,12 +201,12 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
 }
 
 bool QVJPEGImage::readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag = findEntry(ifd, tag::ImageWidth) != nullptr;
+  bool const hasTiffTag(findEntry(ifd, tag::ImageWidth));
   return storeNumber(ifd, hasTiffTag ? tag::ImageWidth : tag::PixelXDimension, side);
 }
 
 bool QVJPEGImage::readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag = findEntry(ifd, tag::ImageLength) != nullptr;
+  bool const hasTiffTag(findEntry(ifd, tag::ImageLength));
   return storeNumber(ifd, hasTiffTag ? tag::ImageLength : tag::PixelYDimension, side);
 }
 

@@ -29,8 +29,8 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal}, exifIFD)) {
+  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                         exifIFD)) {
     return false;
   }
   // Without it, the raw image's directory is looked for all the same.
@@ -38,12 +38,12 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  if (!subIFDs || valueCount(subIFDs) < 2) {
+  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
+  if (subIFDs.size() < 2) {
     return true;
   }
   // The first leads to a preview, the second to the raw image.
-  auto const rawIFD = readDirectoryAt(stream, (*subIFDs->values)[1]->longValue(),
+  auto const rawIFD = readDirectoryAt(stream, subIFDs[1]->longValue(),
                                       {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType});
   return rawIFD && storeInfoFromSubIFD1(rawIFD);
 }

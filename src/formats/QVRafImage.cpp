@@ -66,8 +66,8 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal}, exifIFD)) {
+  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                         exifIFD)) {
     return false;
   }
   return !exifIFD || storeInfoFromExifIFD(exifIFD);

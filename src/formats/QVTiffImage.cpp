@@ -21,19 +21,16 @@ constexpr std::size_t kMostSubIFDs = 64;
 
 /// The first of the SubIFDs that says it is no reduced image; null when none of those examined
 /// does.
-Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry subIFDs) {
-  if (!subIFDs->values) {
-    return nullptr;
-  }
-  std::size_t const examined = std::min(subIFDs->values->size(), kMostSubIFDs);
+Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& subIFDs) {
+  std::size_t const examined = std::min(subIFDs.size(), kMostSubIFDs);
   for (std::size_t i = 0; i < examined; ++i) {
     auto subIFD =
-        readDirectoryAt(stream, (*subIFDs->values)[i]->longValue(),
+        readDirectoryAt(stream, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     if (!subIFD) {
       return nullptr;
     }
-    auto const* const type = findEntry(subIFD, tag::NewSubfileType);
+    auto const type = findEntry(subIFD, tag::NewSubfileType);
     if (!type) {
       continue;  // one that does not say what it is, is never taken
     }
@@ -50,7 +47,7 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry subIFDs) 
 
 /// The directory of the full-size image; null on failure and when there is none.
 Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
-  auto const* const type = findEntry(mainIFD, tag::NewSubfileType);
+  auto const type = findEntry(mainIFD, tag::NewSubfileType);
   if (!type) {
     return mainIFD;
   }
@@ -61,8 +58,8 @@ Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const&
   if (!isReducedImage(typeValue)) {
     return mainIFD;
   }
-  auto const* const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  return subIFDs ? readFullImageSubIFD(stream, subIFDs) : nullptr;
+  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
+  return readFullImageSubIFD(stream, subIFDs);
 }
 
 }  // namespace
@@ -81,9 +78,9 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
-                     exifIFD)) {
+  if (!followExifPointer(*this, stream, mainIFD,
+                         {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
+                         exifIFD)) {
     return false;
   }
   return !exifIFD || storeInfoFromExifIFD(exifIFD);

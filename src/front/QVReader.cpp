@@ -4,6 +4,7 @@
 #include <string_view>
 #include <utility>
 
+#include "front/RecordOrigin.h"
 #include "quavel/QV3FRImage.h"
 #include "quavel/QVARWImage.h"
 #include "quavel/QVCR2Image.h"
@@ -48,10 +49,13 @@ constexpr ExtensionRow kExtensions[] = {
 std::shared_ptr<QVMetadata> readRecord(QVReader const& reader, std::string const& extension,
                                        std::shared_ptr<QVStream> stream) {
   auto record = reader.createMetadata(extension);
-  if (!record || !record->read(stream)) {
+  if (!record) {
     return nullptr;
   }
-  return record;
+  detail::RecordOrigin::setReadersOwn(*record, true);
+  bool const isRead = record->read(stream);
+  detail::RecordOrigin::setReadersOwn(*record, false);
+  return isRead ? record : nullptr;
 }
 
 }  // namespace

@@ -5,9 +5,13 @@
 #include <bitset>
 #include <cstddef>
 #include <cstdint>
+#include <initializer_list>
 #include <memory>
 
 namespace quavel::detail {
+
+/// A list of tags as readers write it.
+using Tags = std::initializer_list<unsigned short>;
 
 /// The tags that the reader of a directory still wants: each until it is met. None listed means
 /// all, always.
