@@ -2,7 +2,6 @@
 
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectory.h"
-#include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "quavel/QVTiffImageFileDirectoryEntryValue.h"
 #include "tiff/Directories.h"
 #include "tiff/Tags.h"

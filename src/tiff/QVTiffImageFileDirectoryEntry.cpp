@@ -6,7 +6,7 @@
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectoryEntryValue.h"
 #include "stream/Bytes.h"
-#include "tiff/Directories.h"
+#include "tiff/Entry.h"
 #include "tiff/RawEntry.h"
 
 namespace quavel {
