@@ -18,7 +18,8 @@ class QUAVEL_EXPORT QVCR3Image : public QVMetadata {
   bool read(std::shared_ptr<QVStream>& stream) override;
 
  private:
-  bool storeInfoFromMoov(QVCR3MoovBox const& moov);
+  bool storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& moovBox,
+                         std::int64_t position);
   void storeInfoFromCMT1(QVCR3CMT1Box& cmt1);
   void storeInfoFromCMT2(QVCR3CMT2Box& cmt2);
 };

@@ -28,7 +28,11 @@ class QUAVEL_EXPORT QVCR3UUIDBox : public QVCR3Box {
   std::shared_ptr<QVCR3CMT2Box> cmt2Box;       ///< The last one read; or null.
 
  private:
+  friend class QVCR3Image;
+
   bool readChildren(std::shared_ptr<QVStream>& stream, long end);
+
+  std::int64_t position_ = 0;  // of the box read last, in the file
 };
 
 }  // namespace quavel

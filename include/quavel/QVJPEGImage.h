@@ -8,6 +8,10 @@
 
 namespace quavel {
 
+namespace detail {
+class Journal;
+}  // namespace detail
+
 /// Reads a JPEG file (ITU-T T.81) up to its Exif segment and its baseline frame header. Gives the
 /// size, the orientation and the original date.
 class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
@@ -37,10 +41,12 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  private:
   struct Walk;
 
-  bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker, Walk& walk);
-  bool readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk);
-  static bool readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk);
+  bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker, std::int64_t start,
+                   Walk& walk);
+  bool readAPP1(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk);
+  static bool readSOF0(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk);
   void reconcileSizeWith(Walk const& walk);
+  static void noteWhatIsMissing(detail::Journal* journal, Walk const& walk);
 };
 
 }  // namespace quavel

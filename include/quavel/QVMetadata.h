@@ -13,10 +13,6 @@ namespace quavel {
 class QVStream;
 class QVTiffImageFileDirectory;
 
-namespace detail {
-struct RecordOrigin;
-}  // namespace detail
-
 /// What a file tells about its image, and the base of the format readers that fill it. A field
 /// that the file does not give keeps its initial value: -1, NaN, the empty string or false. Texts
 /// are the file's own bytes up to the first NUL; tags are those of TIFF 6.0 and Exif.
@@ -60,11 +56,6 @@ class QUAVEL_EXPORT QVMetadata {
   std::int32_t focalLengthIn35mmFilm = -1;  ///< Millimetres.
   float exposureTime = std::nanf("");       ///< Seconds.
   float fNumber = std::nanf("");            ///< Exif FNumber.
-
- private:
-  friend struct detail::RecordOrigin;
-
-  bool isReadersOwn = false;  // a `QVReader` made it and is reading it
 };
 
 }  // namespace quavel

@@ -8,6 +8,16 @@
 
 namespace quavel {
 
+class QVStream;
+
+namespace detail {
+class Journal;
+class Reading;
+class ReadScope;
+Journal* journalOf(QVStream const& stream);
+Reading& readingOf(QVStream const& stream);
+}  // namespace detail
+
 /// Byte order of multi-byte numbers, as TIFF marks it.
 enum class ByteOrder : std::uint8_t {
   BigEndian = 0,     ///< TIFF "MM"
@@ -66,6 +76,21 @@ class QUAVEL_EXPORT QVStream {
   ByteOrder hostOrder;          ///< Of the machine the library runs on.
   ByteOrder byteOrder;          ///< Of the data now being read; any other value: never reversed.
   std::int64_t baseOffset = 0;  ///< Absolute position, in bytes, that offset 0 stands for.
+
+ private:
+  friend class detail::ReadScope;
+  friend detail::Journal* detail::journalOf(QVStream const& stream);
+  friend detail::Reading& detail::readingOf(QVStream const& stream);
+
+  /// The read that this stream serves, if any. A copy of the stream serves none.
+  struct CurrentReading {
+    CurrentReading() = default;
+    CurrentReading(CurrentReading const& /*other*/) {}
+    CurrentReading& operator=(CurrentReading const& /*other*/) { return *this; }
+
+    detail::Reading* current = nullptr;
+  };
+  CurrentReading reading_;
 };
 
 }  // namespace quavel

@@ -14,7 +14,7 @@ class QVStream;
 class QVTiffImageFileDirectoryEntry;
 
 namespace detail {
-class BareDirectory;
+class ReaderDirectory;
 }  // namespace detail
 
 /// A TIFF image file directory (IFD): its wanted entries by tag.
@@ -37,9 +37,10 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
   std::shared_ptr<std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>> entries;
 
  private:
-  friend class detail::BareDirectory;
+  friend class detail::ReaderDirectory;
 
-  detail::BareDirectory const* bare = nullptr;  // this object, when a reader reads it for itself
+  detail::ReaderDirectory const* ofReader =
+      nullptr;  // this object, if a reader reads it for itself
 };
 
 }  // namespace quavel

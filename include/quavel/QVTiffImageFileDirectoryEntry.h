@@ -13,11 +13,6 @@ namespace quavel {
 class QVStream;
 class QVTiffImageFileDirectoryEntryValue;
 
-namespace detail {
-class MapSink;
-struct RawEntry;
-}  // namespace detail
-
 /// One entry of a TIFF image file directory, without its tag, which the directory keeps.
 class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
  public:
@@ -37,12 +32,6 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
   std::shared_ptr<std::vector<std::uint8_t>> bytes;  ///< UNDEFINED of up to 4 bytes; else null.
   std::uint32_t dataOffset = 0;  ///< UNDEFINED of more: where, from the TIFF header; else 0.
   std::uint32_t dataCount = 0;   ///< UNDEFINED of more: how many bytes; else 0.
-
- private:
-  friend class detail::MapSink;
-
-  bool read(QVStream& stream, detail::RawEntry const& entry);
-  bool storeUndefined(detail::RawEntry const& entry, bool isReversed);
 };
 
 }  // namespace quavel

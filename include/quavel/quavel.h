@@ -14,6 +14,7 @@
 #include "quavel/QVDNGImage.h"
 #include "quavel/QVFStream.h"
 #include "quavel/QVJPEGImage.h"
+#include "quavel/QVJournal.h"
 #include "quavel/QVMStream.h"
 #include "quavel/QVMetadata.h"
 #include "quavel/QVNRWImage.h"

@@ -14,10 +14,6 @@ inline constexpr std::uint32_t CMT2 = 0x434d5432;
 /// Bytes of a box's size and type.
 inline constexpr std::uint32_t kHeaderSize = 8;
 
-/// Siblings that one walk steps over. Cameras write some ten side by side; ends the walk of a huge
-/// file of tiny boxes.
-inline constexpr int kMostSiblings = 65536;
-
 }  // namespace quavel::box
 
 #endif  // QUAVEL_SRC_FORMATS_BOXTYPES_H

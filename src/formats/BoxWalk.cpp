@@ -6,18 +6,52 @@
 
 namespace quavel::detail {
 
-bool stepOverBox(std::shared_ptr<QVStream>& stream, QVCR3BoxHeader& header) {
+namespace {
+
+char const* specialSizeText(std::uint32_t size) {
+  return size == 0   ? " (0 stands for \"to the end of the file\", which is not read)"
+         : size == 1 ? " (1 stands for a 64-bit size, which is not read)"
+                     : "";
+}
+
+}  // namespace
+
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header) {
+  Journal* const journal = journalOf(*stream);
   long const start = stream->getOffset();
-  if (!header.read(stream)) {
+  std::int64_t const position = stream->baseOffset + start;
+  if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
+  }
+  if (!header.read(stream)) {
+    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", place);
   }
   // A smaller one, 0 above all, would lead a walk back to where it has been. That leaves out the
   // standard's sizes 0 (to the end of the file) and 1 (64 bits), which precede no metadata.
   if (header.boxSize < box::kHeaderSize) {
-    return false;
+    return refuse(journal, QVReason::MalformedBox, position,
+                  "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
+                  PlacedBox{header.boxType, position}, place, header.boxSize,
+                  specialSizeText(header.boxSize));
   }
   stream->setOffset(start + long{header.boxSize});
   return true;
+}
+
+void append(std::string& out, PlacedBox box) {
+  std::uint8_t const name[] = {
+      static_cast<std::uint8_t>(box.type >> 24U), static_cast<std::uint8_t>(box.type >> 16U),
+      static_cast<std::uint8_t>(box.type >> 8U), static_cast<std::uint8_t>(box.type)};
+  append(out, QuotedBytes{name, sizeof(name)});
+  out += " box at ";
+  append(out, Offset{box.position});
+}
+
+void append(std::string& out, BoxPlace place) {
+  out += place.text;
+  if (place.parent.type != 0) {
+    append(out, place.parent);
+  }
 }
 
 }  // namespace quavel::detail

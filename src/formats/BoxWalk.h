@@ -1,7 +1,12 @@
 #ifndef QUAVEL_SRC_FORMATS_BOXWALK_H
 #define QUAVEL_SRC_FORMATS_BOXWALK_H
 
+#include <cstdint>
 #include <memory>
+#include <string>
+
+#include "journal/Journal.h"
+#include "journal/Reading.h"
 
 namespace quavel {
 
@@ -10,9 +15,23 @@ class QVStream;
 
 namespace detail {
 
-/// Reads the box header at the stream's position and moves behind the box. False: the header cannot
-/// be read, or its size does not even cover the header.
-bool stepOverBox(std::shared_ptr<QVStream>& stream, QVCR3BoxHeader& header);
+/// A box for notes: "moov box at 0x18 (24)".
+struct PlacedBox {
+  std::uint32_t type = 0;
+  std::int64_t position = 0;  ///< In the file.
+};
+void append(std::string& out, PlacedBox box);
+
+/// Where a box lies, for notes: "in the moov box at 0x18 (24)".
+struct BoxPlace {
+  char const* text;
+  PlacedBox parent = {};  ///< Its type 0: the text says it all.
+};
+void append(std::string& out, BoxPlace place);
+
+/// Reads the box header at the stream's position and moves past the box. False: the header cannot
+/// be read, its size does not even cover the header, or the read has seen too many boxes.
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header);
 
 }  // namespace detail
 }  // namespace quavel

@@ -5,6 +5,7 @@
 #include <memory>
 
 #include "formats/BoxTypes.h"
+#include "formats/BoxWalk.h"
 #include "quavel/QVCR3Box.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVStream.h"
@@ -16,16 +17,19 @@ namespace quavel::detail {
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   long const start = stream->getOffset();
   if (!metadataBox.QVCR3Box::read(stream)) {
     return false;
   }
   QVCR3BoxHeader const& header = *metadataBox.boxHeader;
+  std::int64_t const outerBase = stream->baseOffset;
   if (header.type() != type) {
-    return false;
+    return refuse(journalOf(*stream), QVReason::OtherKind, outerBase + start,
+                  "the {} is not a {} box", PlacedBox{header.type(), outerBase + start},
+                  type == box::CMT1 ? "CMT1" : "CMT2");
   }
 
-  std::int64_t const outerBase = stream->baseOffset;
   ByteOrder const outerOrder = stream->byteOrder;
   stream->baseOffset = outerBase + start + box::kHeaderSize;
   stream->setOffset(0);

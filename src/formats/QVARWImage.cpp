@@ -1,9 +1,7 @@
 #include "quavel/QVARWImage.h"
 
+#include "formats/Steps.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "tiff/Directories.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -11,33 +9,36 @@ namespace quavel {
 using namespace detail;
 
 bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   isRaw = true;
 
   auto const mainIFD =
-      readFirstDirectory(stream, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
+      readFirstDirectory(stream, nullptr, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
 
   Directory exifIFD;
-  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                          exifIFD)) {
     return false;
   }
   if (!exifIFD) {
-    return true;  // without it, the raw image's directory is not looked for either
+    noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
+               "no {} in {}, without which the raw image is not looked for",
+               TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
+    return true;
   }
   if (!storeInfoFromExifIFD(exifIFD)) {
     return false;
   }
 
-  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  if (subIFDs.size() == 0) {
-    return true;
+  Directory rawIFD;
+  if (!readSubIFD(stream, mainIFD, 0, {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength},
+                  rawIFD)) {
+    return false;
   }
-  auto const rawIFD = readDirectoryAt(stream, subIFDs[0]->longValue(),
-                                      {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength});
-  return rawIFD && storeInfoFromSubIFD0(rawIFD);
+  return !rawIFD || storeInfoFromSubIFD0(rawIFD);
 }
 
 bool QVARWImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

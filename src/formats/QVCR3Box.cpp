@@ -8,8 +8,9 @@ namespace quavel {
 QVCR3Box::~QVCR3Box() = default;
 
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
+  detail::ReadScope const scope(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
-  return detail::stepOverBox(stream, *boxHeader);
+  return detail::stepOverBox(stream, {""}, *boxHeader);
 }
 
 std::shared_ptr<QVCR3BoxHeader> QVCR3Box::header() const { return boxHeader; }

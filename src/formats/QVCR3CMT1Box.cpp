@@ -1,8 +1,7 @@
 #include "quavel/QVCR3CMT1Box.h"
 
 #include "formats/MetadataBox.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "tiff/Directories.h"
+#include "formats/Steps.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -14,9 +13,11 @@ bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
-  auto const mainIFD = readFirstDirectory(
-      stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
-               tag::SubIFDs, tag::NewSubfileType, tag::DateTime, tag::Model});
+  ReadScope const scope(*stream);
+  auto const mainIFD =
+      readFirstDirectory(stream, "the CMT1 box",
+                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
+                          tag::SubIFDs, tag::NewSubfileType, tag::DateTime, tag::Model});
   return mainIFD && storeInfoFromMainIFD(mainIFD);
 }
 

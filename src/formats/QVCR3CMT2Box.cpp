@@ -1,9 +1,7 @@
 #include "quavel/QVCR3CMT2Box.h"
 
 #include "formats/MetadataBox.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "tiff/Directories.h"
+#include "formats/Steps.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -17,11 +15,12 @@ namespace {
 bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
   auto const entry = findEntry(directory, tag);
   if (!entry) {
+    noteNoEntry(directory, tag);
     return true;
   }
   auto const* const value = singleValue(entry);
-  if (!value) {
-    return false;
+  if (value == nullptr) {
+    return refuseContent(directory, tag, "exactly one wanted");
   }
   field = value->shortValue();
   return true;
@@ -33,13 +32,19 @@ bool storeFraction(Directory const& directory, unsigned short tag, EntryValueTyp
                    float& field) {
   auto const entry = findEntry(directory, tag);
   if (!entry) {
+    noteNoEntry(directory, tag);
     return true;
   }
   auto const* const value = singleValue(entry);
-  if (!value || value->type != type) {
-    return false;
+  if (value == nullptr || value->type != type) {
+    return refuseContent(
+        directory, tag,
+        type == EntryValueType::RATIONAL ? "1 RATIONAL value wanted" : "1 SRATIONAL value wanted");
   }
   field = value->floatValue();
+  if (std::isnan(field)) {
+    noteNoValue(directory, tag, "{} is 0/0");
+  }
   return true;
 }
 
@@ -50,10 +55,12 @@ bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   auto const exifIFD = readFirstDirectory(
-      stream, {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
-               tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,
-               tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber});
+      stream, "the CMT2 box",
+      {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
+       tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,
+       tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber});
   return exifIFD && storeInfoFromMainIFD(exifIFD);
 }
 
@@ -74,6 +81,7 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!findEntry(ifd, tag::ApertureValue)) {
+    noteNoEntry(ifd, tag::ApertureValue);
     return true;
   }
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {
@@ -85,6 +93,7 @@ bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const
 
 bool QVCR3CMT2Box::storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!findEntry(ifd, tag::ShutterSpeedValue)) {
+    noteNoEntry(ifd, tag::ShutterSpeedValue);
     return true;
   }
   if (!storeFraction(ifd, tag::ShutterSpeedValue, EntryValueType::SRATIONAL, shutterSpeedValue)) {

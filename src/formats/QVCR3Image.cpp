@@ -13,33 +13,63 @@
 
 namespace quavel {
 
+using namespace detail;
+
 bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   isRaw = true;
 
-  QVCR3BoxHeader topLevelBox;
-  for (int i = 0; i < box::kMostSiblings; ++i) {
+  while (true) {
     long const boxStart = stream->getOffset();
-    if (!detail::stepOverBox(stream, topLevelBox)) {
+    QVCR3BoxHeader header;
+    if (!stepOverBox(stream, {" before a moov box was met"}, header)) {
       return false;
     }
-    if (topLevelBox.boxType == box::Moov) {
+    PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};
+    notePassed(scope.reading().journal, found.position, "{}: {} bytes", found, header.boxSize);
+    if (found.type == box::Moov) {
       stream->setOffset(boxStart);
       QVCR3MoovBox moov;
-      return moov.read(stream) && storeInfoFromMoov(moov);
+      return moov.read(stream) && storeInfoFromMoov(*stream, moov, found.position);
     }
   }
-  return false;
 }
 
-bool QVCR3Image::storeInfoFromMoov(QVCR3MoovBox const& moov) {
-  if (!moov.uuidBox || (!moov.uuidBox->cmt1Box && !moov.uuidBox->cmt2Box)) {
-    return false;
+bool QVCR3Image::storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& moovBox,
+                                   std::int64_t position) {
+  Journal* const journal = journalOf(stream);
+  PlacedBox const moov = {box::Moov, position};
+  if (!moovBox.uuidBox) {
+    return refuse(journal, QVReason::MissingPart, position,
+                  "the {} has no uuid box, in which the metadata would be", moov);
   }
-  if (moov.uuidBox->cmt1Box) {
-    storeInfoFromCMT1(*moov.uuidBox->cmt1Box);
+  QVCR3UUIDBox const& uuidBox = *moovBox.uuidBox;
+  PlacedBox const uuid = {box::Uuid, uuidBox.position_};
+  if (uuidBox.userType != metadataUUID) {
+    return refuse(journal, QVReason::MissingPart, uuid.position,
+                  "the last uuid box of the {}, the {}, is not the metadata's: its identifier is "
+                  "another one",
+                  moov, uuid);
   }
-  if (moov.uuidBox->cmt2Box) {
-    storeInfoFromCMT2(*moov.uuidBox->cmt2Box);
+  if (!uuidBox.cmt1Box && !uuidBox.cmt2Box) {
+    return refuse(journal, QVReason::MissingPart, uuid.position,
+                  "the metadata {} has neither a CMT1 nor a CMT2 box", uuid);
+  }
+
+  if (uuidBox.cmt1Box) {
+    storeInfoFromCMT1(*uuidBox.cmt1Box);
+  } else {
+    noteAbsent(journal, {"width", "height", "orientation", "dateTime", "model"},
+               QVReason::NotInFile, "no CMT1 box in the metadata {}", uuid);
+  }
+  if (uuidBox.cmt2Box) {
+    storeInfoFromCMT2(*uuidBox.cmt2Box);
+  } else {
+    noteAbsent(
+        journal,
+        {"lensModel", "iso", "apertureValue", "shutterSpeedValue", "focalLength", "whiteBalance",
+         "meteringMode", "exposureBiasValue", "focalLengthIn35mmFilm", "exposureTime", "fNumber"},
+        QVReason::NotInFile, "no CMT2 box in the metadata {}", uuid);
   }
   return true;
 }

@@ -8,38 +8,32 @@
 
 namespace quavel {
 
-namespace {
-
-// Cameras write one. Each can hold many directories, and all can share the same large one.
-constexpr int kMostMetadataBoxes = 8;
-
-}  // namespace
+using namespace detail;
 
 bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   long const start = stream->getOffset();
   if (!QVCR3Box::read(stream)) {
     return false;
   }
   stream->setOffset(start + long{box::kHeaderSize});
-  if (boxHeader->type() != box::Moov) {
-    return false;
+  PlacedBox const moov = {boxHeader->type(), stream->baseOffset + start};
+  if (moov.type != box::Moov) {
+    return refuse(journalOf(*stream), QVReason::OtherKind, moov.position,
+                  "the {} is not a moov box", moov);
   }
   long const end = start + long{boxHeader->size()};
 
-  bool const isRead = readChildren(stream, end);
+  bool const isRead = readChildren(stream, start, end);
   stream->setOffset(end);
   return isRead;
 }
 
-bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
+  BoxPlace const place = {" in the ", {box::Moov, stream->baseOffset + start}};
   QVCR3BoxHeader child;
-  int siblings = 0;
-  int metadataBoxes = 0;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (++siblings > box::kMostSiblings) {
-      return false;
-    }
-    if (!detail::stepOverBox(stream, child)) {
+    if (!stepOverBox(stream, place, child)) {
       return false;
     }
     if (child.boxType != box::Uuid) {
@@ -48,9 +42,6 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
     stream->setOffset(childStart);
     uuidBox = std::make_shared<QVCR3UUIDBox>();
     if (!uuidBox->read(stream)) {
-      return false;
-    }
-    if (uuidBox->userType == metadataUUID && ++metadataBoxes > kMostMetadataBoxes) {
       return false;
     }
   }

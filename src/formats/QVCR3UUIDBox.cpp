@@ -9,11 +9,9 @@
 
 namespace quavel {
 
-namespace {
+using namespace detail;
 
-// Cameras write one of each kind. Of a kind whose other never comes all are read, and all can lead
-// to the same large directory.
-constexpr int kMostDirectoryBoxes = 8;
+namespace {
 
 template <class MetadataBox>
 bool readKeptChild(std::shared_ptr<QVStream>& stream, long start,
@@ -26,43 +24,44 @@ bool readKeptChild(std::shared_ptr<QVStream>& stream, long start,
 }  // namespace
 
 bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
+  Journal* const journal = scope.reading().journal;
   long const start = stream->getOffset();
   if (!QVCR3Box::read(stream)) {
     return false;
   }
-  if (boxHeader->type() != box::Uuid) {
-    return false;
+  PlacedBox const uuid = {boxHeader->type(), stream->baseOffset + start};
+  position_ = uuid.position;
+  if (uuid.type != box::Uuid) {
+    return refuse(journal, QVReason::OtherKind, uuid.position, "the {} is not a uuid box", uuid);
   }
   long const end = start + long{boxHeader->size()};
 
   stream->setOffset(start + long{box::kHeaderSize});
   for (auto& word : userType) {
     if (!stream->readLong(&word)) {
-      return false;
+      return refuseCut(journal, uuid.position + box::kHeaderSize, sizeof(userType),
+                       "the 16-byte identifier of the {}", uuid);
     }
   }
-  bool const isRead = userType != metadataUUID || readChildren(stream, end);
+  bool const isMetadata = userType == metadataUUID;
+  notePassed(journal, uuid.position, "{}: {}", uuid,
+             isMetadata ? "the metadata" : "another identifier");
+  bool const isRead = !isMetadata || readChildren(stream, end);
   stream->setOffset(end);
   return isRead;
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
+  BoxPlace const place = {" in the metadata ", {box::Uuid, position_}};
   QVCR3BoxHeader child;
-  int siblings = 0;
-  int directoryBoxes = 0;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (++siblings > box::kMostSiblings) {
-      return false;
-    }
-    if (!detail::stepOverBox(stream, child)) {
+    if (!stepOverBox(stream, place, child)) {
       return false;
     }
     std::uint32_t const type = child.boxType;
     if (type != box::CMT1 && type != box::CMT2) {
       continue;
-    }
-    if (++directoryBoxes > kMostDirectoryBoxes) {
-      return false;
     }
     bool const isRead = type == box::CMT1 ? readKeptChild(stream, childStart, cmt1Box)
                                           : readKeptChild(stream, childStart, cmt2Box);

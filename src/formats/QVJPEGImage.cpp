@@ -4,9 +4,8 @@
 #include <array>
 #include <utility>
 
+#include "formats/Steps.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "tiff/Directories.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -17,24 +16,20 @@ namespace {
 
 // Markers of ITU-T T.81.
 constexpr unsigned short kSOF0 = 0xffc0;
+constexpr unsigned short kSOF2 = 0xffc2;
 constexpr unsigned short kSOI = 0xffd8;
+constexpr unsigned short kSOS = 0xffda;
 constexpr unsigned short kAPP1 = 0xffe1;
 
 // A segment's length counts its own two bytes but not the marker's.
 constexpr long kLengthSize = 2;
+constexpr std::int64_t kMarkerSize = 2;
+constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
 // Below it, the Exif size is taken for that of a thumbnail.
 constexpr int kLargestThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
-
-// Files hold one, those with embedded images one for each that the walk meets. All can share the
-// same large directory, and a file has room for tens of thousands.
-constexpr int kMostExifSegments = 64;
-
-// Zeros count as a segment for every 2 bytes: 32 MB of padding stay below. Ends the walk of a file
-// of any size, holes included.
-constexpr int kMostSegments = 1 << 24;
 
 // A constant, unlike the public map made of it: it is there before any constructor of a host's.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
@@ -51,26 +46,50 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd9, 2},  // EOI
 }};
 
+/// Notes why an Exif size does not count, if it does not.
+void noteSize(Directory const& exifIFD, int width, int height) {
+  if (width < 0 || height < 0) {
+    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
+               "{} does not give both sides", NamedDirectory{exifIFD});
+  } else {
+    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
+               "{} declares {} x {}; only more than 500 a side counts", NamedDirectory{exifIFD},
+               width, height);
+  }
+}
+
 }  // namespace
 
-/// What the segments have shown so far.
+/// What the segments have shown so far. Positions, in the file, serve notes alone.
 struct QVJPEGImage::Walk {
   bool sawAPP1 = false;  ///< Of any content, Exif or not.
   bool sawSOF0 = false;
-  int segments = 0;
-  int exifSegments = 0;
+  bool sawExif = false;
   unsigned short frameWidth = 0;
   unsigned short frameHeight = 0;
+  std::int64_t frame = -1;
+  std::int64_t otherFrame = -1;  ///< A progressive one.
+  std::int64_t scan = -1;        ///< Where picture data begins.
 };
 
 std::map<std::uint16_t, std::uint16_t> const QVJPEGImage::markerSkipLengths(kFixedSkips.begin(),
                                                                             kFixedSkips.end());
 
 bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
+  Reading& reading = scope.reading();
+  Journal* const journal = reading.journal;
   stream->byteOrder = ByteOrder::BigEndian;
+  std::int64_t const start = notedPosition(journal, *stream);
   unsigned short marker = 0;
-  if (!stream->readShort(&marker) || marker != kSOI) {
-    return false;
+  if (!stream->readShort(&marker)) {
+    return refuseCut(journal, start, sizeof(marker), "the marker SOI");
+  }
+  if (marker != kSOI) {
+    std::uint8_t const bytes[] = {static_cast<std::uint8_t>(marker >> 8U),
+                                  static_cast<std::uint8_t>(marker)};
+    return refuse(journal, QVReason::OtherKind, start,
+                  "the file begins with {}, not with ff d8 (SOI)", HexBytes{bytes, sizeof(bytes)});
   }
 
   // An ordinary file ends the walk at its frame header. One without a baseline frame or an APP1
@@ -78,20 +97,26 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   Walk walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
+    std::int64_t const segmentStart = notedPosition(journal, *stream);
     if (!stream->readShort(&marker)) {
+      notePassed(journal, segmentStart, "end of the data at {}, where the walk ends",
+                 Offset{segmentStart});
       break;
     }
-    if (++walk.segments > kMostSegments || !readSegment(stream, marker, walk)) {
+    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, segmentStart, walk)) {
       return false;
     }
   }
 
   reconcileSizeWith(walk);
+  if (journal != nullptr) {
+    noteWhatIsMissing(journal, walk);
+  }
   return true;
 }
 
 bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
-                              Walk& walk) {
+                              std::int64_t start, Walk& walk) {
   for (auto const& [skippedMarker, skip] : kFixedSkips) {
     if (marker == skippedMarker) {
       stream->setOffset(stream->getOffset() + skip);
@@ -101,47 +126,70 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
 
   unsigned short length = 0;
   if (!stream->readShort(&length)) {
-    return false;
+    return refuseCut(journalOf(*stream), start + kMarkerSize, sizeof(length),
+                     "the length of the segment {} at {}", HexCode{marker}, Offset{start});
   }
   long const segmentEnd = stream->getOffset() + length - kLengthSize;
-  if (marker == kAPP1 && !readAPP1(stream, walk)) {
+  if (marker == kAPP1 && !readAPP1(stream, start, walk)) {
     return false;
   }
-  if (marker == kSOF0 && !readSOF0(stream, walk)) {
+  if (marker == kSOF0 && !readSOF0(stream, start, walk)) {
     return false;
+  }
+  if (marker == kSOS && walk.scan < 0) {
+    walk.scan = start;
+  }
+  // After the start of the scan, the same two bytes are picture data.
+  if (marker == kSOF2 && walk.scan < 0) {
+    walk.otherFrame = start;
   }
   stream->setOffset(segmentEnd);
   return true;
 }
 
-bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
+bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk) {
+  Journal* const journal = journalOf(*stream);
   std::int64_t const baseOffset = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
   if (stream->readBuffer(identifier.data(), identifier.size()) !=
       static_cast<std::int64_t>(identifier.size())) {
-    return false;
+    return refuseCut(journal, start + kPayloadPosition, identifier.size(),
+                     "the identifier of the APP1 segment at {}", Offset{start});
   }
-  if (identifier == kExifIdentifier) {
+  bool const isExif = identifier == kExifIdentifier;
+  notePassed(journal, start, "the APP1 segment at {}: {}", Offset{start},
+             isExif ? "Exif" : "not Exif");
+  if (isExif) {
     unsigned short padding = 0;
-    if (++walk.exifSegments > kMostExifSegments || !stream->readShort(&padding) ||
-        !readExifSegment(stream)) {
+    if (!stream->readShort(&padding)) {
+      return refuseCut(journal, start + kPayloadPosition + std::int64_t{identifier.size()},
+                       sizeof(padding), "the Exif identifier of the APP1 segment at {}",
+                       Offset{start});
+    }
+    if (!readExifSegment(stream)) {
       return false;
     }
+    walk.sawExif = true;
   }
   stream->baseOffset = baseOffset;
   walk.sawAPP1 = true;
   return true;
 }
 
-bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk) {
+bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk) {
   unsigned char precision = 0;
   unsigned short height = 0;
   unsigned short width = 0;
   if (!stream->readByte(&precision) || !stream->readShort(&height) || !stream->readShort(&width)) {
-    return false;
+    return refuseCut(journalOf(*stream), start + kPayloadPosition,
+                     sizeof(precision) + sizeof(height) + sizeof(width), "the SOF0 segment at {}",
+                     Offset{start});
   }
+  notePassed(journalOf(*stream), start, "the SOF0 segment at {} declares {} x {}", Offset{start},
+             int{width}, int{height});
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
+  walk.frame = start;
   walk.sawSOF0 = true;
   return true;
 }
@@ -162,16 +210,48 @@ void QVJPEGImage::reconcileSizeWith(Walk const& walk) {
   }
 }
 
+void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
+  QVNote const* const exif = journal->absenceOf("width");
+  std::string const exifText = exif == nullptr ? "no Exif IFD gives a size" : exif->text;
+  if (walk.sawSOF0) {
+    noteAbsent(journal, {"width", "height"}, QVReason::NotInFile,
+               "the SOF0 segment at {} declares {} x {}; {}", Offset{walk.frame},
+               int{walk.frameWidth}, int{walk.frameHeight}, exifText);
+  } else {
+    noteAbsent(journal, {"width", "height"}, QVReason::NotInFile,
+               "no baseline frame (SOF0) was met; {}", exifText);
+  }
+  if (!walk.sawExif) {
+    noteAbsent(journal, {"orientation", "dateTimeOriginal"}, QVReason::NotInFile,
+               walk.sawSOF0 && walk.sawAPP1
+                   ? "no Exif segment among those up to SOF0 and an APP1, where the walk ends"
+                   : "no Exif segment (APP1) was met");
+  }
+  if (walk.otherFrame >= 0) {
+    noteHint(journal, QVReason::NotBaseline, walk.otherFrame,
+             "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
+             Offset{walk.otherFrame});
+  }
+  if (walk.scan >= 0) {
+    noteHint(journal, QVReason::PictureData, walk.scan,
+             "Before the scan at {} no {} was met; the walk goes on through picture data, taken as "
+             "segments",
+             Offset{walk.scan}, walk.sawAPP1 ? "SOF0" : "APP1");
+  }
+}
+
 bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   stream->baseOffset += stream->getOffset();
 
-  auto const mainIFD = readFirstDirectory(stream, {tag::Orientation, tag::ExifIFDPointer});
+  auto const mainIFD =
+      readFirstDirectory(stream, "the Exif segment", {tag::Orientation, tag::ExifIFDPointer});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
 
   Directory exifIFD;
-  if (!followExifPointer(*this, stream, mainIFD,
+  if (!followExifPointer(stream, mainIFD,
                          {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
                           tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
                          exifIFD)) {
@@ -193,6 +273,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
+  noteSize(ifd, exifWidth, exifHeight);
   if (exifWidth > kLargestThumbnailSide && exifHeight > kLargestThumbnailSide) {
     width = exifWidth;
     height = exifHeight;

@@ -1,9 +1,7 @@
 #include "quavel/QVNefImage.h"
 
+#include "formats/Steps.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "tiff/Directories.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -12,23 +10,26 @@ using namespace detail;
 
 namespace {
 
-// The first directory of every NEF file describes a thumbnail of this size.
+// What a NEF is known by: its first directory describes a thumbnail of this size.
 constexpr std::int32_t kThumbnailWidth = 160;
 constexpr std::int32_t kThumbnailHeight = 120;
+constexpr char kThumbnailRule[] = "a NEF's first directory must be 160 x 120";
 
 }  // namespace
 
 bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
   isRaw = true;
 
-  auto const mainIFD = readFirstDirectory(stream, {tag::SubIFDs, tag::ImageWidth, tag::ImageLength,
-                                                   tag::Orientation, tag::ExifIFDPointer});
+  auto const mainIFD = readFirstDirectory(
+      stream, nullptr,
+      {tag::SubIFDs, tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
 
   Directory exifIFD;
-  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                          exifIFD)) {
     return false;
   }
@@ -37,26 +38,25 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  if (subIFDs.size() < 2) {
-    return true;
+  // The first SubIFD is a preview's, the second the raw image's.
+  Directory rawIFD;
+  if (!readSubIFD(stream, mainIFD, 1, {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType},
+                  rawIFD)) {
+    return false;
   }
-  // The first leads to a preview, the second to the raw image.
-  auto const rawIFD = readDirectoryAt(stream, subIFDs[1]->longValue(),
-                                      {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType});
-  return rawIFD && storeInfoFromSubIFD1(rawIFD);
+  return !rawIFD || storeInfoFromSubIFD1(rawIFD);
 }
 
 bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   std::int32_t thumbnailWidth = 0;
   std::int32_t thumbnailHeight = 0;
-  if (!storeRequiredNumber(ifd, tag::ImageWidth, thumbnailWidth) ||
-      thumbnailWidth != kThumbnailWidth) {
+  if (!storeRequiredNumber(ifd, tag::ImageWidth, kThumbnailRule, thumbnailWidth) ||
+      !storeRequiredNumber(ifd, tag::ImageLength, kThumbnailRule, thumbnailHeight)) {
     return false;
   }
-  if (!storeRequiredNumber(ifd, tag::ImageLength, thumbnailHeight) ||
-      thumbnailHeight != kThumbnailHeight) {
-    return false;
+  if (thumbnailWidth != kThumbnailWidth || thumbnailHeight != kThumbnailHeight) {
+    return refuse(journalOf(ifd), QVReason::WrongImage, positionOf(ifd), "{} declares {} x {}; {}",
+                  NamedDirectory{ifd}, thumbnailWidth, thumbnailHeight, kThumbnailRule);
   }
   return storeNumber(ifd, tag::Orientation, orientation);
 }

@@ -2,9 +2,9 @@
 
 #include <array>
 
+#include "formats/Steps.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "tiff/Directories.h"
+#include "stream/Bytes.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -22,36 +22,73 @@ constexpr long kRawSectionOffsetPosition = 100;
 // SOI, the APP1 marker and its length (2 bytes each), "Exif" and two zeros.
 constexpr std::uint32_t kTiffHeaderInImage = 12;
 
+/// Reads the offset of a section from the file's header.
+bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, long position,
+                       std::uint32_t& offset) {
+  stream->byteOrder = ByteOrder::BigEndian;
+  stream->setOffset(position);
+  if (!stream->readLong(&offset)) {
+    return refuseCut(journalOf(*stream), position, sizeof(offset), "the offset of {}", section);
+  }
+  notePassed(journalOf(*stream), position, "offset of {} at {}: {}", section, Offset{position},
+             Offset{offset});
+  return true;
+}
+
+/// Whether an image opens as the reader takes for granted. The segment's length may be anything.
+bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
+  return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
+         std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
+}
+
+/// Tells what the embedded image begins with when that explains why its directories are not found.
+void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
+  Journal* const journal = journalOf(stream);
+  if (journal == nullptr || !journal->wantsAll()) {
+    return;
+  }
+  stream.baseOffset = 0;
+  stream.setOffset(static_cast<long>(imageOffset));
+  std::array<std::uint8_t, kTiffHeaderInImage> opening = {};
+  std::size_t const received = readUpTo(stream, opening.data(), opening.size());
+  if (received != 0 && !opensWithExif(opening)) {
+    noteHint(journal, QVReason::OtherOpening, imageOffset,
+             "The embedded JPEG at {} begins with {}; wanted: ff d8, then at once an Exif segment "
+             "(ff e1, its length, 45 78 69 66 00 00)",
+             Offset{imageOffset}, HexBytes{opening.data(), received});
+  }
+}
+
 }  // namespace
 
 bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
+  ReadScope const scope(*stream);
+  Journal* const journal = scope.reading().journal;
   isRaw = true;
 
   std::array<std::uint8_t, 8> magic;
   if (stream->readBuffer(magic.data(), magic.size()) != static_cast<std::int64_t>(magic.size())) {
-    return false;
+    return refuseCut(journal, 0, magic.size(), "the file's magic \"FUJIFILM\"");
   }
   if (magic != kMagic) {
-    return false;
+    return refuse(journal, QVReason::OtherKind, 0, "the file begins with {}, not with \"FUJIFILM\"",
+                  HexBytes{magic.data(), magic.size()});
   }
 
-  stream->byteOrder = ByteOrder::BigEndian;
-  stream->setOffset(kImageOffsetPosition);
   std::uint32_t imageOffset = 0;
-  if (!stream->readLong(&imageOffset)) {
+  if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
   stream->baseOffset = imageOffset + kTiffHeaderInImage;  // wraps around at 32 bits
   stream->setOffset(0);
   if (!readMainIFD(stream)) {
+    noteOtherOpening(*stream, imageOffset);
     return false;
   }
 
-  stream->byteOrder = ByteOrder::BigEndian;
   stream->baseOffset = 0;
-  stream->setOffset(kRawSectionOffsetPosition);
   std::uint32_t rawSectionOffset = 0;
-  if (!stream->readLong(&rawSectionOffset)) {
+  if (!readSectionOffset(stream, "the raw section", kRawSectionOffsetPosition, rawSectionOffset)) {
     return false;
   }
   stream->baseOffset = rawSectionOffset;
@@ -60,13 +97,15 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
-  auto const mainIFD = readFirstDirectory(stream, {tag::Orientation, tag::ExifIFDPointer});
+  ReadScope const scope(*stream);
+  auto const mainIFD = readFirstDirectory(stream, "the embedded JPEG's Exif segment",
+                                          {tag::Orientation, tag::ExifIFDPointer});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
 
   Directory exifIFD;
-  if (!followExifPointer(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                          exifIFD)) {
     return false;
   }
@@ -74,17 +113,24 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
-  auto const rawSectionIFD = readFirstDirectory(stream, {tag::RafDirectoryPointer});
+  ReadScope const scope(*stream);
+  auto const rawSectionIFD =
+      readFirstDirectory(stream, "the raw section", {tag::RafDirectoryPointer});
   if (!rawSectionIFD) {
     return false;
   }
 
   Directory vendorIFD;
-  if (!followPointer(stream, rawSectionIFD, tag::RafDirectoryPointer,
+  if (!followPointer(stream, rawSectionIFD, tag::RafDirectoryPointer, "the vendor directory",
                      {tag::RafImageWidth, tag::RafImageLength}, vendorIFD)) {
     return false;
   }
-  return vendorIFD && storeInfoFromFujiTagsIFD(vendorIFD);  // the pointer is required
+  if (!vendorIFD) {
+    return refuse(journalOf(*stream), QVReason::MissingPart, positionOf(rawSectionIFD),
+                  "no {} in {}; the raw image's size is found through it",
+                  TagName{tag::RafDirectoryPointer}, NamedDirectory{rawSectionIFD});
+  }
+  return storeInfoFromFujiTagsIFD(vendorIFD);
 }
 
 bool QVRafImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

@@ -1,11 +1,7 @@
 #include "quavel/QVTiffImage.h"
 
-#include <algorithm>
-
+#include "formats/Steps.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectory.h"
-#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "tiff/Directories.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -14,59 +10,65 @@ using namespace detail;
 
 namespace {
 
-// Files hold three SubIFDs or so, one for each preview; every one that is examined can lead to the
-// same large directory again.
-constexpr std::size_t kMostSubIFDs = 64;
+/// The entry that says whether a directory's image is a reduced one. Absent: true, `type` is null.
+/// Not a single value: false.
+bool findNewSubfileType(Directory const& directory, ValuePointer& type) {
+  auto const entry = findEntry(directory, tag::NewSubfileType);
+  type = singleValue(entry);
+  return !entry || type != nullptr ||
+         refuseContent(directory, tag::NewSubfileType, "exactly one wanted");
+}
 
-/// The first of the SubIFDs that says it is no reduced image; null when none of those examined
+/// The first of the SubIFDs that says it is not a reduced image; null on failure and when none
 /// does.
-Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Entry const& subIFDs) {
-  std::size_t const examined = std::min(subIFDs.size(), kMostSubIFDs);
-  for (std::size_t i = 0; i < examined; ++i) {
+Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
+  Journal* const journal = journalOf(*stream);
+  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
+  auto const count = static_cast<std::uint32_t>(subIFDs.size());
+  for (std::uint32_t i = 0; i < count; ++i) {
     auto subIFD =
-        readDirectoryAt(stream, subIFDs[i]->longValue(),
+        readDirectoryAt(stream, {"SubIFD", nullptr, i + 1, count}, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
-    if (!subIFD) {
+    ValuePointer type = nullptr;
+    if (!subIFD || !findNewSubfileType(subIFD, type)) {
       return nullptr;
     }
-    auto const type = findEntry(subIFD, tag::NewSubfileType);
-    if (!type) {
-      continue;  // one that does not say what it is, is never taken
-    }
-    auto const* const typeValue = singleValue(type);
-    if (!typeValue) {
-      return nullptr;
-    }
-    if (!isReducedImage(typeValue)) {
+    if (type != nullptr && !isReducedImage(type)) {
       return subIFD;
     }
+    // One that does not say what it is, is never taken.
+    noteHint(
+        journal, QVReason::PassedOver, positionOf(subIFD),
+        type == nullptr ? "{} has no 0x00fe NewSubfileType" : "{} declares a reduced image too",
+        NamedDirectory{subIFD});
   }
+  refuse(journal, QVReason::MissingPart, positionOf(mainIFD),
+         count == 0 ? "{} declares a reduced image (NewSubfileType bit 0) and names no 0x014a "
+                      "SubIFDs where the full image could be"
+                    : "{} declares a reduced image (NewSubfileType bit 0) and none of its {} "
+                      "SubIFDs says that it is the full image",
+         NamedDirectory{mainIFD}, count);
   return nullptr;
 }
 
 /// The directory of the full-size image; null on failure and when there is none.
 Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
-  auto const type = findEntry(mainIFD, tag::NewSubfileType);
-  if (!type) {
-    return mainIFD;
-  }
-  auto const* const typeValue = singleValue(type);
-  if (!typeValue) {
+  ValuePointer type = nullptr;
+  if (!findNewSubfileType(mainIFD, type)) {
     return nullptr;
   }
-  if (!isReducedImage(typeValue)) {
-    return mainIFD;
-  }
-  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
-  return readFullImageSubIFD(stream, subIFDs);
+  bool const isReduced = type != nullptr && isReducedImage(type);
+  return isReduced ? readFullImageSubIFD(stream, mainIFD) : mainIFD;
 }
 
 }  // namespace
 
 bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
-  auto const mainIFD = readFirstDirectory(
-      stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
-               tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
+  ReadScope const scope(*stream);
+  auto const mainIFD =
+      readFirstDirectory(stream, nullptr,
+                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
+                          tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
@@ -77,7 +79,7 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(*this, stream, mainIFD,
+  if (!followExifPointer(stream, mainIFD,
                          {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
                          exifIFD)) {
     return false;

@@ -1,6 +1,6 @@
 #include "quavel/QVMetadata.h"
 
-#include "tiff/Directories.h"
+#include "formats/Steps.h"
 #include "tiff/Tags.h"
 
 namespace quavel {

@@ -1,8 +1,10 @@
 #include "stream/ReadAheadStream.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <utility>
 
+#include "journal/Reading.h"
 #include "stream/Bytes.h"
 
 namespace quavel::detail {
@@ -65,6 +67,9 @@ void ReadAheadStream::moveWindow(std::size_t needed) {
     // What is broken may lie behind the bytes that are needed.
     source_->setOffset(static_cast<long>(position_));
     delivered = source_->readBuffer(window_.data(), std::min(needed, window_.size()));
+  }
+  if (delivered < 0) {
+    noteReadError(*this, errno);
   }
   windowStart_ = position_;
   windowSize_ = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));

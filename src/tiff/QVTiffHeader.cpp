@@ -1,6 +1,9 @@
 #include "quavel/QVTiffHeader.h"
 
-#include "quavel/QVStream.h"
+#include "journal/Journal.h"
+#include "journal/Reading.h"
+#include "tiff/HeaderStep.h"
+#include "tiff/TiffWords.h"
 
 namespace quavel {
 
@@ -10,25 +13,69 @@ namespace {
 constexpr unsigned short kLittleEndianMark = 0x4949;  // "II"
 constexpr unsigned short kBigEndianMark = 0x4d4d;     // "MM"
 
+constexpr unsigned short kBigTiffMagic = 43;
+
+// Where the header's numbers lie, in bytes from its start.
+constexpr std::int64_t kMagicPosition = 2;
+constexpr std::int64_t kOffsetPosition = 4;
+
+/// A number as the two bytes that it was in the file.
+struct StoredShort {
+  unsigned short value;
+  ByteOrder order;
+};
+
+void append(std::string& out, StoredShort stored) {
+  auto const high = static_cast<std::uint8_t>(stored.value >> 8U);
+  auto const low = static_cast<std::uint8_t>(stored.value);
+  bool const isLittle = stored.order == ByteOrder::LittleEndian;
+  std::uint8_t const bytes[] = {isLittle ? low : high, isLittle ? high : low};
+  append(out, detail::HexBytes{bytes, sizeof(bytes)});
+}
+
 }  // namespace
 
 QVTiffHeader::QVTiffHeader() = default;
 
 bool QVTiffHeader::read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic) {
+  return detail::readTiffHeader(*stream, expectedMagic, nullptr, *this);
+}
+
+bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
+                            QVTiffHeader& header) {
+  Journal* const journal = journalOf(stream);
+  std::int64_t const start = notedPosition(journal, stream);
+  DirectoryName const name = {"the TIFF header", structure};
+
   unsigned short mark = 0;
-  if (!stream->readShort(&mark)) {
-    return false;
+  if (!stream.readShort(&mark)) {
+    return refuseCut(journal, start, sizeof(mark), "{}", name);
   }
   if (mark != kLittleEndianMark && mark != kBigEndianMark) {
-    return false;
+    return refuse(journal, QVReason::OtherKind, start,
+                  "{} at {} begins with {}, not with 49 49 (\"II\") or 4d 4d (\"MM\")", name,
+                  Offset{start}, StoredShort{mark, stream.byteOrder});
   }
-  stream->byteOrder = mark == kLittleEndianMark ? ByteOrder::LittleEndian : ByteOrder::BigEndian;
+  bool const isLittle = mark == kLittleEndianMark;
+  stream.byteOrder = isLittle ? ByteOrder::LittleEndian : ByteOrder::BigEndian;
 
   unsigned short magic = 0;
-  if (!stream->readShort(&magic) || magic != expectedMagic) {
-    return false;
+  if (!stream.readShort(&magic)) {
+    return refuseCut(journal, start + kMagicPosition, sizeof(magic), "{} at {}", name,
+                     Offset{start});
   }
-  return stream->readLong(&firstIFDOffset);
+  if (magic != expectedMagic) {
+    return refuse(journal, QVReason::OtherKind, start, "{} at {} has magic {}, not {}{}", name,
+                  Offset{start}, int{magic}, int{expectedMagic},
+                  magic == kBigTiffMagic ? "; 43 marks a BigTIFF, which is not read" : "");
+  }
+  if (!stream.readLong(&header.firstIFDOffset)) {
+    return refuseCut(journal, start + kOffsetPosition, sizeof(header.firstIFDOffset), "{} at {}",
+                     name, Offset{start});
+  }
+  notePassed(journal, start, "{} at {}: {}-endian", name, Offset{start},
+             isLittle ? "little" : "big");
+  return true;
 }
 
 }  // namespace quavel

@@ -5,6 +5,7 @@
 #include <limits>
 
 #include "quavel/QVStream.h"
+#include "tiff/RawEntry.h"
 
 namespace quavel {
 
@@ -159,26 +160,8 @@ bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream)
 }
 
 unsigned int QVTiffImageFileDirectoryEntryValue::sizeOfValueOfType(EntryValueType const& type) {
-  switch (type) {
-    case EntryValueType::BYTE:
-    case EntryValueType::ASCII:
-    case EntryValueType::SBYTE:
-      return 1;
-    case EntryValueType::SHORT:
-    case EntryValueType::SSHORT:
-      return 2;
-    case EntryValueType::LONG:
-    case EntryValueType::SLONG:
-    case EntryValueType::FLOAT:
-      return 4;
-    case EntryValueType::RATIONAL:
-    case EntryValueType::SRATIONAL:
-    case EntryValueType::DOUBLE:
-      return 8;
-    case EntryValueType::UNDEFINED:
-      return 0;
-  }
-  return 0;  // the argument may hold what is no type
+  auto const index = static_cast<std::size_t>(type);
+  return index < detail::kValueSizes.size() ? detail::kValueSizes[index] : 0;
 }
 
 char QVTiffImageFileDirectoryEntryValue::charValue() const {

@@ -1,10 +1,7 @@
 #include "tiff/RawEntry.h"
 
-#include <algorithm>
 #include <array>
-
-#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "stream/Bytes.h"
+#include <cstring>
 
 namespace quavel::detail {
 
@@ -12,17 +9,8 @@ namespace {
 
 using Value = QVTiffImageFileDirectoryEntryValue;
 
-// The wanted entries of real files hold some hundred values at most, the longest being texts. The
-// bound keeps what a damaged count can make an entry allocate below 2 MB.
-constexpr std::uint32_t kMostValuesOfEntry = 65536;
-
 // Bytes of values read at a time: whole values of any size.
 constexpr std::size_t kPartSize = 512;
-
-/// Bytes of one value of a known type; of UNDEFINED, which has none, those of one byte.
-std::size_t sizeOfType(std::uint16_t typeCode) {
-  return typeCode == kUndefinedCode ? 1 : Value::sizeOfValueOfType(fieldTypeToValueType[typeCode]);
-}
 
 template <class Number>
 void storeNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* destination) {
@@ -52,28 +40,13 @@ void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, Va
 
 }  // namespace
 
-bool isKnown(std::uint16_t typeCode) {
-  return typeCode != 0 && typeCode < fieldTypeToValueType.size();
-}
-
-bool isAllowed(RawEntry const& entry) {
-  return isKnown(entry.typeCode) &&
-         (entry.typeCode == kUndefinedCode || entry.count <= kMostValuesOfEntry);
-}
-
-std::size_t usedFieldSize(RawEntry const& entry) {
-  return std::min(entry.count * sizeOfType(entry.typeCode), kEntryFieldSize);
-}
-
-bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
-
-bool readValues(QVStream& stream, RawEntry const& entry, ValueSink& sink) {
+bool readValues(QVStream& stream, RawEntry const& entry, std::vector<Value>& values) {
   EntryValueType const type = fieldTypeToValueType[entry.typeCode];
-  std::size_t const size = Value::sizeOfValueOfType(type);
+  std::size_t const size = kValueSizes[static_cast<std::size_t>(type)];
   bool const isReversed = detail::isReversed(stream);
   bool const isInField = entry.count * size <= kEntryFieldSize;
   if (!isInField) {
-    stream.setOffset(numberAt<std::uint32_t>(entry.field, isReversed));
+    stream.setOffset(valueOffset(entry, isReversed));
   }
 
   std::array<std::uint8_t, kPartSize> part;
@@ -83,10 +56,11 @@ bool readValues(QVStream& stream, RawEntry const& entry, ValueSink& sink) {
       return false;
     }
     std::uint8_t const* bytes = isInField ? entry.field : part.data();
-    Value* const values = sink.addValues(length);
-    for (std::size_t i = 0; i < length; ++i, bytes += size) {
-      values[i].type = type;
-      storeValue(bytes, size, isReversed, values[i]);
+    values.resize(values.size() + length);
+    Value* value = values.data() + (values.size() - length);
+    for (std::size_t i = 0; i < length; ++i, ++value, bytes += size) {
+      value->type = type;
+      storeValue(bytes, size, isReversed, *value);
     }
     left -= length;
   }

@@ -1,15 +1,16 @@
 #ifndef QUAVEL_SRC_TIFF_RAWENTRY_H
 #define QUAVEL_SRC_TIFF_RAWENTRY_H
 
+#include <algorithm>
+#include <array>
 #include <cstddef>
 #include <cstdint>
+#include <vector>
 
-namespace quavel {
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
+#include "stream/Bytes.h"
 
-class QVStream;
-class QVTiffImageFileDirectoryEntryValue;
-
-namespace detail {
+namespace quavel::detail {
 
 // Where the parts of a directory entry lie, in bytes from its start (TIFF 6.0).
 inline constexpr std::size_t kEntryTypePosition = 2;
@@ -17,6 +18,8 @@ inline constexpr std::size_t kEntryCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
+inline constexpr std::int64_t kEntryCountSize =
+    2;  // of the directory's count of entries, before it
 
 inline constexpr std::uint16_t kUndefinedCode = 7;
 
@@ -28,33 +31,48 @@ struct RawEntry {
   std::size_t fieldSize;      ///< Bytes that the data holds of it; 4 unless the data ends there.
 };
 
+// The wanted entries of real files hold some hundred values at most, the longest being texts. The
+// bound keeps what a damaged count can make an entry allocate below 2 MB.
+inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
+
+/// Bytes of one value in a file, by field types.
+inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
+
 /// Whether it is the code of a field type.
-bool isKnown(std::uint16_t typeCode);
+inline bool isKnown(std::uint16_t typeCode) {
+  return typeCode != 0 && typeCode < fieldTypeToValueType.size();
+}
 
 /// Whether the type is known and there are not too many values.
-bool isAllowed(RawEntry const& entry);
+inline bool isAllowed(RawEntry const& entry) {
+  return isKnown(entry.typeCode) &&
+         (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);
+}
+
+/// Bytes that the values of an entry of a known type take in the file; the bytes of UNDEFINED.
+inline std::uint64_t sizeOfValues(RawEntry const& entry) {
+  auto const type = static_cast<std::size_t>(fieldTypeToValueType[entry.typeCode]);
+  return std::uint64_t{entry.count} * (entry.typeCode == kUndefinedCode ? 1 : kValueSizes[type]);
+}
 
 /// How many bytes of the field an entry of a known type makes use of.
-std::size_t usedFieldSize(RawEntry const& entry);
+inline std::size_t usedFieldSize(RawEntry const& entry) {
+  return static_cast<std::size_t>(std::min<std::uint64_t>(sizeOfValues(entry), kEntryFieldSize));
+}
 
 /// Whether all that it uses of the field is in the data.
-bool isWhole(RawEntry const& entry);
+inline bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
-/// Where an entry's values go.
-class ValueSink {
- public:
-  /// `count` more values, side by side, to be filled before the next call.
-  virtual QVTiffImageFileDirectoryEntryValue* addValues(std::size_t count) = 0;
+/// The offset in the field of an entry that is whole.
+inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
+  return numberAt<std::uint32_t>(entry.field, isReversed);
+}
 
- protected:
-  ~ValueSink() = default;
-};
+/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: they are not all in
+/// the data.
+bool readValues(QVStream& stream, RawEntry const& entry,
+                std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 
-/// Reads the values of a whole, allowed entry that is not UNDEFINED. False: they are not all in the
-/// data.
-bool readValues(QVStream& stream, RawEntry const& entry, ValueSink& sink);
-
-}  // namespace detail
-}  // namespace quavel
+}  // namespace quavel::detail
 
 #endif  // QUAVEL_SRC_TIFF_RAWENTRY_H

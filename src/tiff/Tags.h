@@ -34,6 +34,43 @@ inline constexpr unsigned short RafDirectoryPointer = 0xf000;
 inline constexpr unsigned short RafImageWidth = 0xf001;
 inline constexpr unsigned short RafImageLength = 0xf002;
 
+/// A tag's name, and the record's field that an entry under it gives, if any.
+struct Name {
+  unsigned short tag;
+  char const* name;
+  char const* field = nullptr;
+};
+
+inline constexpr Name kNames[] = {
+    {NewSubfileType, "NewSubfileType"},
+    {ImageWidth, "ImageWidth", "width"},
+    {ImageLength, "ImageLength", "height"},
+    {Model, "Model", "model"},
+    {Orientation, "Orientation", "orientation"},
+    {DateTime, "DateTime", "dateTime"},
+    {SubIFDs, "SubIFDs"},
+    {ExposureTime, "ExposureTime", "exposureTime"},
+    {FNumber, "FNumber", "fNumber"},
+    {ExifIFDPointer, "ExifIFDPointer"},
+    {ISOSpeedRatings, "ISOSpeedRatings", "iso"},
+    {DateTimeOriginal, "DateTimeOriginal", "dateTimeOriginal"},
+    {DateTimeDigitized, "DateTimeDigitized", "dateTimeDigitized"},
+    {OffsetTimeOriginal, "OffsetTimeOriginal"},
+    {ShutterSpeedValue, "ShutterSpeedValue", "shutterSpeedValue"},
+    {ApertureValue, "ApertureValue", "apertureValue"},
+    {ExposureBiasValue, "ExposureBiasValue", "exposureBiasValue"},
+    {MeteringMode, "MeteringMode", "meteringMode"},
+    {FocalLength, "FocalLength", "focalLength"},
+    {PixelXDimension, "PixelXDimension", "width"},
+    {PixelYDimension, "PixelYDimension", "height"},
+    {WhiteBalance, "WhiteBalance", "whiteBalance"},
+    {FocalLengthIn35mmFilm, "FocalLengthIn35mmFilm", "focalLengthIn35mmFilm"},
+    {LensModel, "LensModel", "lensModel"},
+    {RafDirectoryPointer, "(the vendor directory)"},
+    {RafImageWidth, "(the raw image's width)", "width"},
+    {RafImageLength, "(the raw image's height)", "height"},
+};
+
 }  // namespace quavel::tag
 
 #endif  // QUAVEL_SRC_TIFF_TAGS_H

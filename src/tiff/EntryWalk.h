@@ -1,17 +1,13 @@
-#include "tiff/DirectoryWalk.h"
+#ifndef QUAVEL_SRC_TIFF_ENTRYWALK_H
+#define QUAVEL_SRC_TIFF_ENTRYWALK_H
 
 #include <algorithm>
 #include <array>
 
 #include "stream/Bytes.h"
+#include "tiff/RawEntry.h"
 
 namespace quavel::detail {
-
-namespace {
-
-// Sixteen full lists: more than any reader's tags can hold, and far more than a real directory
-// does. It bounds what the same few bytes, listed by each of 65535 entries, cost one who wants all.
-constexpr std::size_t kMostValuesOfDirectory = std::size_t{1} << 20U;
 
 /// A walk over a directory's entries, which takes from the stream as many at a time as its buffer
 /// holds.
@@ -22,6 +18,7 @@ class EntryWalk {
       : stream_(stream),
         isReversed_(isReversed(stream)),
         bufferOffset_(stream.getOffset()),
+        count_(count),
         left_(count) {}
 
   bool isAtEnd() const { return left_ == 0; }
@@ -31,18 +28,21 @@ class EntryWalk {
     --left_;
   }
 
+  /// The current entry's number, from 1 on.
+  std::uint32_t number() const { return count_ - left_ + 1; }
+
   /// Whether the data holds the current entry's tag. May move the stream.
   bool hasTag() { return isBuffered(kEntryTypePosition) || fillBuffer(); }
 
-  unsigned short tag() const { return number<std::uint16_t>(0); }
+  unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
   /// What follows the tag. False: the type or the count is not in the data.
   bool readRest(RawEntry* entry) const {
     if (!isBuffered(kEntryFieldPosition)) {
       return false;
     }
-    entry->typeCode = number<std::uint16_t>(kEntryTypePosition);
-    entry->count = number<std::uint32_t>(kEntryCountPosition);
+    entry->typeCode = numberIn<std::uint16_t>(kEntryTypePosition);
+    entry->count = numberIn<std::uint32_t>(kEntryCountPosition);
     entry->field = entry_ + kEntryFieldPosition;
     auto const left = static_cast<std::size_t>(bufferEnd_ - entry->field);
     entry->fieldSize = std::min(left, kEntryFieldSize);
@@ -64,11 +64,11 @@ class EntryWalk {
   }
 
   template <class Number>
-  Number number(std::size_t position) const {
+  Number numberIn(std::size_t position) const {
     return numberAt<Number>(entry_ + position, isReversed_);
   }
 
-  /// Buffers the current entry and those behind it. False: its tag is not in the data.
+  /// Buffers the current entry and those after it. False: its tag is not in the data.
   bool fillBuffer() {
     bufferOffset_ = offset();
     stream_.setOffset(bufferOffset_);
@@ -81,44 +81,13 @@ class EntryWalk {
   QVStream& stream_;
   bool const isReversed_;
   long bufferOffset_;  // of the buffer's first byte in the stream
-  unsigned int left_;  // entries from the current one on
+  std::uint32_t const count_;
+  std::uint32_t left_;  // entries from the current one on
   std::array<std::uint8_t, 64 * kEntrySize> buffer_;
   std::uint8_t const* entry_ = buffer_.data();
   std::uint8_t const* bufferEnd_ = buffer_.data();
 };
 
-}  // namespace
-
-bool walkDirectory(QVStream& stream, WantedTags& wanted, EntrySink& sink) {
-  unsigned short count = 0;
-  if (!stream.readShort(&count)) {
-    return false;
-  }
-  std::size_t valuesRead = 0;
-  EntryWalk walk(stream, count);
-  for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
-    if (!walk.hasTag()) {
-      return false;
-    }
-    unsigned short const tag = walk.tag();
-    if (!wanted.take(tag)) {
-      continue;
-    }
-    // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
-    stream.setOffset(walk.nextOffset());
-    RawEntry entry;
-    if (!walk.readRest(&entry) || !sink.addEntry(tag, entry, stream)) {
-      return false;
-    }
-    valuesRead += entry.typeCode == kUndefinedCode ? 0 : entry.count;
-    if (valuesRead > kMostValuesOfDirectory) {
-      return false;
-    }
-  }
-
-  // The entries may have left the stream anywhere.
-  stream.setOffset(walk.end());
-  return true;
-}
-
 }  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_TIFF_ENTRYWALK_H

@@ -1,0 +1,104 @@
+#ifndef QUAVEL_QVJOURNAL_H
+#define QUAVEL_QVJOURNAL_H
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "quavel/QVMetadata.h"
+#include "quavel/QVStream.h"
+#include "quavel/export.h"
+
+namespace quavel {
+
+namespace detail {
+class Journal;
+}  // namespace detail
+
+/// What a note tells.
+enum class QVNoteKind : std::uint8_t {
+  Refusal,  ///< Why there is no record.
+  Limit,    ///< The same: the read asked for more work or memory than the library spends on a file.
+  Step,     ///< A part of the file that was read without trouble.
+  Absence,  ///< Why a field of the record is absent.
+  Hint,     ///< What else may explain the outcome.
+};
+
+/// The reason behind a note, for programs to switch on. Later versions may add reasons at the end.
+enum class QVReason : std::uint8_t {
+  None,              ///< Steps have none.
+  UnknownExtension,  ///< The extension names no format.
+  CannotOpen,        ///< The system cannot open the file.
+  ReadError,         ///< The system or the stream cannot read on.
+  Empty,             ///< There is not a single byte.
+  CutShort,          ///< The data ends before a part that is needed.
+  OtherKind,         ///< The data does not begin as a file or structure of this kind does.
+  MalformedEntry,    ///< A directory entry has a wrong type or a wrong number of values.
+  MalformedBox,      ///< A box has a size that cannot be.
+  MissingPart,       ///< An entry, a box or a directory that the format needs is not there.
+  WrongImage,        ///< A directory describes an image of another size or purpose than it must.
+  TooManyValues,     ///< One entry declares more than 65536 values.
+  TooMuchWork,       ///< The whole read exceeds one of the other limits.
+  NotInFile,         ///< A field is absent: the file does not give it.
+  NotInFormat,       ///< A field is absent: the library never takes it from this format.
+  NoValue,           ///< A field is absent: what the file gives amounts to no value.
+  OtherContent,      ///< The content looks like another format than the extension names.
+  NotBaseline,       ///< A JPEG frame that is not baseline, so its size is not read.
+  PictureData,       ///< A JPEG was read on through its picture data.
+  OtherOpening,      ///< An embedded image does not begin as the format has it.
+  PassedOver,        ///< A directory was examined and is not the one looked for.
+};
+
+/// One thing that happened while a file was read.
+struct QVNote {
+  QVNoteKind kind = QVNoteKind::Step;
+  QVReason reason = QVReason::None;
+  std::int64_t position =
+      -1;             ///< In bytes from the file's first one; -1: of no place in particular.
+  std::string field;  ///< An absence: the name of the record's member, "fNumber" say; else empty.
+  std::string text;   ///< In English: what the file holds, and where, then the rule. Printable
+                     ///< ASCII, but for a system's own message; no full stop; at most 500 bytes.
+};
+
+/// Reads files like a `QVReader`, giving the same records, and keeps notes of what happened. One
+/// read at a time; distinct journals may be used on distinct threads.
+class QUAVEL_EXPORT QVJournal {
+ public:
+  /// How much is noted. Refusals alone cost no time unless there is one.
+  enum class Detail : std::uint8_t { Refusals, All };
+
+  explicit QVJournal(Detail detail = Detail::All);
+
+  /// Each reads a file as the `QVReader` constructor with the same arguments does, replacing all
+  /// notes. Null: there is no record, and the notes hold one refusal or limit, which is last among
+  /// the steps' and the refusals' notes.
+  std::shared_ptr<QVMetadata> read(std::string const& path);
+  std::shared_ptr<QVMetadata> read(unsigned char* buffer, std::size_t length,
+                                   std::string const& extension);
+  /// The same from a stream of the host's own, which must stand at the file's first byte.
+  std::shared_ptr<QVMetadata> read(std::shared_ptr<QVStream> stream, std::string const& extension);
+
+  /// What the last read left, in the order in which it happened: steps, a refusal or limit, hints,
+  /// and, after a success, one absence for each absent field, in the order of the record's members.
+  std::vector<QVNote> const& notes() const { return notes_; }
+  /// Steps beyond the first few, which were counted only.
+  std::uint64_t furtherSteps() const { return furtherSteps_; }
+  /// The note that says why there is no record; null after a success and before any read.
+  QVNote const* refusal() const;
+
+  /// A reason's name, in lower case with hyphens ("cut-short"); empty for what is not a reason.
+  static char const* reasonName(QVReason reason);
+
+ private:
+  void keep(detail::Journal& journal);
+
+  Detail detail_;
+  std::vector<QVNote> notes_;
+  std::uint64_t furtherSteps_ = 0;
+};
+
+}  // namespace quavel
+
+#endif  // QUAVEL_QVJOURNAL_H

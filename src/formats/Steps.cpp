@@ -1,0 +1,228 @@
+#include "formats/Steps.h"
+
+#include "quavel/QVStream.h"
+#include "quavel/QVTiffHeader.h"
+#include "quavel/QVTiffImageFileDirectoryEntry.h"
+#include "tiff/HeaderStep.h"
+#include "tiff/Tags.h"
+
+namespace quavel::detail {
+
+namespace {
+
+constexpr unsigned short kTiffMagic = 42;
+
+// Stored in a record, it cannot be told from a number that is not there.
+constexpr std::int32_t kAbsentNumber = -1;
+
+/// An entry that a reader has found in a directory of its own: "0x0132 DateTime at 0xe6 (230) in
+/// IFD0".
+struct FoundEntry {
+  Directory const& directory;
+  unsigned short tag;
+};
+
+EntryTable::Row const* rowOf(Directory const& directory, unsigned short tag) {
+  auto const* const own = ReaderDirectory::of(*directory);
+  return own == nullptr ? nullptr : own->table.find(tag);
+}
+
+void append(std::string& out, FoundEntry entry) {
+  if (auto const* const row = rowOf(entry.directory, entry.tag)) {
+    append(out, PlacedEntry{ReaderDirectory::of(*entry.directory)->table, *row});
+  }
+}
+
+/// What such an entry holds: "2 SHORT values".
+struct EntryContent {
+  Directory const& directory;
+  unsigned short tag;
+};
+
+void append(std::string& out, EntryContent content) {
+  if (auto const* const row = rowOf(content.directory, content.tag)) {
+    append(out, TypedCount{row->count, row->typeCode});
+  }
+}
+
+bool storeNumberOf(Entry const& entry, Directory const& directory, unsigned short tag,
+                   std::int32_t& field) {
+  auto const* const value = singleValue(entry);
+  if (value == nullptr) {
+    return refuseContent(directory, tag, "exactly one wanted");
+  }
+  field = static_cast<std::int32_t>(value->longValue());
+  if (field == kAbsentNumber) {
+    noteNoValue(directory, tag, "{} is -1, which counts as absent");
+  }
+  return true;
+}
+
+}  // namespace
+
+ValuePointer singleValue(Entry const& entry) { return entry.size() == 1 ? entry[0] : nullptr; }
+
+bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
+  auto const entry = findEntry(directory, tag);
+  if (!entry) {
+    noteNoEntry(directory, tag);
+    return true;
+  }
+  return storeNumberOf(entry, directory, tag, field);
+}
+
+bool storeRequiredNumber(Directory const& directory, unsigned short tag, char const* rule,
+                         std::int32_t& field) {
+  auto const entry = findEntry(directory, tag);
+  if (!entry) {
+    return refuse(journalOf(directory), QVReason::MissingPart, positionOf(directory),
+                  "no {} in {}; {}", TagName{tag}, NamedDirectory{directory}, rule);
+  }
+  return storeNumberOf(entry, directory, tag, field);
+}
+
+bool storeText(Directory const& directory, unsigned short tag, std::string& field) {
+  auto const entry = findEntry(directory, tag);
+  if (!entry) {
+    noteNoEntry(directory, tag);
+    return true;
+  }
+  if (!entry.convertToString(field)) {
+    return refuseContent(directory, tag, "ASCII text wanted");
+  }
+  if (field.empty()) {
+    noteNoValue(directory, tag, "{} holds no text ({})");
+  }
+  return true;
+}
+
+Directory readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
+                          std::uint32_t offset, Tags tags) {
+  stream->setOffset(offset);
+  auto directory = std::make_shared<ReaderDirectory>(name, stream->baseOffset + offset);
+  if (!directory->table.readWithNext(*stream, tags, &directory->nextIFDOffset)) {
+    return nullptr;
+  }
+  return directory;
+}
+
+Directory readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure, Tags tags) {
+  QVTiffHeader header;
+  if (!readTiffHeader(*stream, kTiffMagic, structure, header)) {
+    return nullptr;
+  }
+  return readDirectoryAt(stream, {"IFD0", structure}, header.firstIFDOffset, tags);
+}
+
+bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory,
+                   unsigned short pointer, char const* name, Tags tags, Directory& result) {
+  result = nullptr;
+  auto const entry = findEntry(directory, pointer);
+  if (!entry) {
+    return true;
+  }
+  auto const* const offset = singleValue(entry);
+  if (offset == nullptr) {
+    return refuseContent(directory, pointer, "exactly one wanted");
+  }
+  result = readDirectoryAt(stream, {name}, offset->longValue(), tags);
+  return result != nullptr;
+}
+
+bool followExifPointer(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, Tags tags,
+                       Directory& exifIFD) {
+  if (!followPointer(stream, mainIFD, tag::ExifIFDPointer, "the Exif IFD", tags, exifIFD)) {
+    return false;
+  }
+  if (!exifIFD) {
+    noteAbsent(journalOf(mainIFD), {"dateTimeOriginal", "dateTimeDigitized"}, QVReason::NotInFile,
+               "no {} in {}", TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
+    return true;
+  }
+  if (!readingOf(*stream).isOwnRecord) {
+    exifIFD = static_cast<ReaderDirectory&>(*exifIFD).forHost();
+  }
+  return true;
+}
+
+bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std::uint32_t index,
+                Tags tags, Directory& rawIFD) {
+  auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
+  auto const count = static_cast<std::uint32_t>(subIFDs.size());
+  if (count <= index) {
+    noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
+               "{} names {} {} (0x014a); the raw image is in number {}", NamedDirectory{mainIFD},
+               count, count == 1 ? "SubIFD" : "SubIFDs", index + 1);
+    return true;
+  }
+  rawIFD = readDirectoryAt(stream, {"SubIFD", nullptr, index + 1, count},
+                           subIFDs[index]->longValue(), tags);
+  return rawIFD != nullptr;
+}
+
+void noteNoEntry(Directory const& directory, unsigned short tag) {
+  Journal* const journal = journalOf(directory);
+  if (journal != nullptr && fieldOf(tag) != nullptr) {
+    noteAbsent(journal, {fieldOf(tag)}, QVReason::NotInFile, "no {} in {}", TagName{tag},
+               NamedDirectory{directory});
+  }
+}
+
+void noteNoValue(Directory const& directory, unsigned short tag, char const* pattern) {
+  Journal* const journal = journalOf(directory);
+  if (journal != nullptr && fieldOf(tag) != nullptr) {
+    noteAbsent(journal, {fieldOf(tag)}, QVReason::NoValue, pattern, FoundEntry{directory, tag},
+               EntryContent{directory, tag});
+  }
+}
+
+bool refuseContent(Directory const& directory, unsigned short tag, char const* wanted) {
+  auto const* const row = rowOf(directory, tag);
+  bool const isUndefined = row != nullptr && row->typeCode == kUndefinedCode;
+  if (isUndefined) {
+    return refuse(journalOf(directory), QVReason::MalformedEntry, row->position,
+                  "{} is of type UNDEFINED; one number wanted", FoundEntry{directory, tag});
+  }
+  return refuse(journalOf(directory), QVReason::MalformedEntry, positionOf(directory, tag),
+                "{} holds {}; {}", FoundEntry{directory, tag}, EntryContent{directory, tag},
+                wanted);
+}
+
+bool isReducedImage(ValuePointer newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
+
+bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::int32_t& height) {
+  std::int32_t newSubfileType = 0;
+  if (!storeRequiredNumber(directory, tag::NewSubfileType,
+                           "the raw image must say that it is of full size", newSubfileType)) {
+    return false;
+  }
+  if ((newSubfileType & 1) != 0) {
+    return refuse(journalOf(directory), QVReason::WrongImage, positionOf(directory),
+                  "{} declares a reduced image (NewSubfileType {}); the raw image of full size is "
+                  "wanted there",
+                  NamedDirectory{directory}, newSubfileType);
+  }
+  char const* const rule = "the raw image's size is wanted there";
+  return storeRequiredNumber(directory, tag::ImageWidth, rule, width) &&
+         storeRequiredNumber(directory, tag::ImageLength, rule, height);
+}
+
+void append(std::string& out, NamedDirectory named) {
+  if (auto const* const own = ReaderDirectory::of(*named.directory)) {
+    append(out, PlacedDirectory{own->table});
+  } else {
+    out += "the directory";
+  }
+}
+
+std::int64_t positionOf(Directory const& directory) {
+  auto const* const own = ReaderDirectory::of(*directory);
+  return own == nullptr ? -1 : own->table.position();
+}
+
+std::int64_t positionOf(Directory const& directory, unsigned short tag) {
+  auto const* const row = rowOf(directory, tag);
+  return row == nullptr ? -1 : row->position;
+}
+
+}  // namespace quavel::detail

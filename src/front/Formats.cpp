@@ -1,0 +1,119 @@
+#include "front/Formats.h"
+
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <system_error>
+#include <utility>
+
+#include "front/Explain.h"
+#include "journal/Journal.h"
+#include "journal/Reading.h"
+#include "quavel/QV3FRImage.h"
+#include "quavel/QVARWImage.h"
+#include "quavel/QVCR2Image.h"
+#include "quavel/QVCR3Image.h"
+#include "quavel/QVDNGImage.h"
+#include "quavel/QVFStream.h"
+#include "quavel/QVJPEGImage.h"
+#include "quavel/QVNRWImage.h"
+#include "quavel/QVNefImage.h"
+#include "quavel/QVRafImage.h"
+#include "quavel/QVTiffImage.h"
+#include "stream/ReadAheadStream.h"
+
+namespace quavel::detail {
+
+namespace {
+
+template <class Image>
+std::shared_ptr<QVMetadata> make() {
+  return std::make_shared<Image>();
+}
+
+constexpr Format kFormats[] = {
+    {"tiff", "TIFF", kTiff, make<QVTiffImage>}, {"tif", "TIFF", kTiff, make<QVTiffImage>},
+    {"dng", "DNG", kTiff, make<QVDNGImage>},    {"nef", "NEF", kNef, make<QVNefImage>},
+    {"cr2", "CR2", kTiff, make<QVCR2Image>},    {"raf", "RAF", kRaf, make<QVRafImage>},
+    {"arw", "ARW", kArw, make<QVARWImage>},     {"jpeg", "JPEG", kJpeg, make<QVJPEGImage>},
+    {"jpg", "JPEG", kJpeg, make<QVJPEGImage>},  {"nrw", "NRW", kTiff, make<QVNRWImage>},
+    {"3fr", "3FR", kTiff, make<QV3FRImage>},    {"cr3", "CR3", kCr3, make<QVCR3Image>},
+};
+
+/// ASCII alone: in a Turkish locale the C library would not make "tif" of "TIF".
+char lowerCase(char letter) {
+  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
+}
+
+bool refuseExtension(Journal* journal, std::string const& extension) {
+  std::string known;
+  for (auto const& format : kFormats) {
+    known.append(known.empty() ? "" : " ").append(format.extension);
+  }
+  auto const* const bytes = reinterpret_cast<std::uint8_t const*>(extension.data());
+  QuotedBytes const quoted = {bytes, std::min<std::size_t>(extension.size(), 16)};
+  return refuse(journal, QVReason::UnknownExtension, -1,
+                "the extension \"{}\" names no format; these do: {}", quoted, known);
+}
+
+/// Learns what notes tell of an open file; or why it is not open.
+bool examine(QVFStream const& file, Journal& journal) {
+  int const error = errno;
+  if (file.fd == -1) {
+    return refuse(&journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
+                  std::generic_category().message(error));
+  }
+  struct stat status = {};
+  if (::fstat(file.fd, &status) == 0 && S_ISREG(status.st_mode)) {
+    journal.dataSize = status.st_size;
+  }
+  return true;
+}
+
+}  // namespace
+
+std::string extensionOf(std::string const& path) {
+  // A "." in a folder's name counts too when the file's has none; no format is named so.
+  auto const dot = path.rfind('.');
+  return dot == std::string::npos ? std::string() : path.substr(dot + 1);
+}
+
+Format const* formatOf(std::string_view extension) {
+  for (auto const& format : kFormats) {
+    if (extension == format.extension) {
+      return &format;
+    }
+  }
+  return nullptr;
+}
+
+std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) {
+  std::string extension = extensionOf(path);
+  std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
+  auto file = std::make_shared<QVFStream>(path);
+  if (journal != nullptr && !examine(*file, *journal)) {
+    return nullptr;
+  }
+  return readStream(std::make_shared<ReadAheadStream>(std::move(file)), extension, journal);
+}
+
+std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
+                                       std::string const& extension, Journal* journal) {
+  auto const* const format = formatOf(extension);
+  if (format == nullptr) {
+    refuseExtension(journal, extension);
+    return nullptr;
+  }
+  ReadScope const scope(*stream);
+  scope.reading().journal = journal;
+  scope.reading().isOwnRecord = true;
+  auto record = format->makeRecord();
+  bool const isRead = record->read(stream);
+  if (journal != nullptr) {
+    explain(*format, *stream, isRead ? record.get() : nullptr, *journal);
+  }
+  return isRead ? record : nullptr;
+}
+
+}  // namespace quavel::detail

@@ -1,0 +1,69 @@
+#include "quavel/QVJournal.h"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+#include "front/Formats.h"
+#include "journal/Journal.h"
+#include "quavel/QVMStream.h"
+
+namespace quavel {
+
+namespace {
+
+// In the order of the enumerators.
+constexpr std::array<char const*, 21> kReasonNames = {
+    "none",        "unknown-extension", "cannot-open",     "read-error",    "empty",
+    "cut-short",   "other-kind",        "malformed-entry", "malformed-box", "missing-part",
+    "wrong-image", "too-many-values",   "too-much-work",   "not-in-file",   "not-in-format",
+    "no-value",    "other-content",     "not-baseline",    "picture-data",  "other-opening",
+    "passed-over"};
+
+}  // namespace
+
+char const* QVJournal::reasonName(QVReason reason) {
+  auto const index = static_cast<std::size_t>(reason);
+  return index < kReasonNames.size() ? kReasonNames[index] : "";
+}
+
+QVJournal::QVJournal(Detail detail) : detail_(detail) {}
+
+std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
+  detail::Journal journal(detail_);
+  auto record = detail::readPath(path, &journal);
+  keep(journal);
+  return record;
+}
+
+std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t length,
+                                            std::string const& extension) {
+  detail::Journal journal(detail_);
+  journal.dataSize = static_cast<std::int64_t>(length);
+  auto record =
+      detail::readStream(std::make_shared<QVMStream>(buffer, length), extension, &journal);
+  keep(journal);
+  return record;
+}
+
+std::shared_ptr<QVMetadata> QVJournal::read(std::shared_ptr<QVStream> stream,
+                                            std::string const& extension) {
+  detail::Journal journal(detail_);
+  auto record = detail::readStream(std::move(stream), extension, &journal);
+  keep(journal);
+  return record;
+}
+
+QVNote const* QVJournal::refusal() const {
+  auto const found = std::find_if(notes_.begin(), notes_.end(), [](QVNote const& note) {
+    return note.kind == QVNoteKind::Refusal || note.kind == QVNoteKind::Limit;
+  });
+  return found == notes_.end() ? nullptr : &*found;
+}
+
+void QVJournal::keep(detail::Journal& journal) {
+  notes_ = std::move(journal.notes);
+  furtherSteps_ = journal.furtherSteps;
+}
+
+}  // namespace quavel

@@ -1,0 +1,92 @@
+#include "journal/Journal.h"
+
+#include <algorithm>
+#include <system_error>
+#include <utility>
+
+namespace quavel::detail {
+
+namespace {
+
+// A screenful of each, whatever a file holds.
+constexpr std::size_t kMaxSteps = 8;
+constexpr std::size_t kMaxHints = 8;
+
+bool isLimit(QVReason reason) {
+  return reason == QVReason::TooManyValues || reason == QVReason::TooMuchWork;
+}
+
+}  // namespace
+
+void Journal::add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text) {
+  notes.push_back({kind, reason, position, "", std::move(text)});
+}
+
+void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern, Words words) {
+  if (isRefused_) {
+    return;
+  }
+  isRefused_ = true;
+  QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
+  add(kind, reason, position, composed(pattern, words));
+}
+
+void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
+                        Words words) {
+  if (dataSize == 0) {
+    refuse(QVReason::Empty, -1, "the file is empty", {});
+    return;
+  }
+  refuse(cutReason(), position, "{}: {} {} wanted at {}, but {}",
+         {composed(pattern, words), count, count == 1 ? "byte" : "bytes", Offset{position},
+          cutText(position + count)});
+}
+
+QVReason Journal::cutReason() const {
+  return readError != 0 ? QVReason::ReadError : QVReason::CutShort;
+}
+
+std::string Journal::cutText(std::int64_t end) const {
+  if (readError != 0) {
+    return "reading fails: " + std::generic_category().message(readError);
+  }
+  if (dataSize < 0) {
+    return "the data ends before that";
+  }
+  return end <= dataSize ? "reading there fails"
+                         : composed("the file ends at {}", {Offset{dataSize}});
+}
+
+void Journal::passed(std::int64_t position, char const* pattern, Words words) {
+  if (steps_ == kMaxSteps) {
+    ++furtherSteps;
+    return;
+  }
+  ++steps_;
+  add(QVNoteKind::Step, QVReason::None, position, composed(pattern, words));
+}
+
+void Journal::hint(QVReason reason, std::int64_t position, char const* pattern, Words words) {
+  if (hints_ < kMaxHints) {
+    ++hints_;
+    add(QVNoteKind::Hint, reason, position, composed(pattern, words));
+  }
+}
+
+void Journal::absent(char const* field, QVReason reason, char const* pattern, Words words) {
+  auto found = std::find_if(absences_.begin(), absences_.end(),
+                            [field](QVNote const& note) { return note.field == field; });
+  if (found == absences_.end()) {
+    found = absences_.insert(found, {QVNoteKind::Absence, reason, -1, field, ""});
+  }
+  found->reason = reason;
+  found->text = composed(pattern, words);
+}
+
+QVNote const* Journal::absenceOf(char const* field) const {
+  auto const found = std::find_if(absences_.begin(), absences_.end(),
+                                  [field](QVNote const& note) { return note.field == field; });
+  return found == absences_.end() ? nullptr : &*found;
+}
+
+}  // namespace quavel::detail

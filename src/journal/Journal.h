@@ -1,0 +1,109 @@
+#ifndef QUAVEL_SRC_JOURNAL_JOURNAL_H
+#define QUAVEL_SRC_JOURNAL_JOURNAL_H
+
+#include <cstdint>
+#include <initializer_list>
+#include <string>
+#include <vector>
+
+#include "journal/Words.h"
+#include "quavel/QVJournal.h"
+
+namespace quavel::detail {
+
+/// Collects the notes of one read. The readers state theirs through the functions below, to which
+/// a null journal means that nobody listens: then no text is made.
+class Journal {
+ public:
+  explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
+
+  /// Whether it takes more than the refusal.
+  bool wantsAll() const { return wantsAll_; }
+
+  using Words = std::initializer_list<Word>;
+
+  /// The first refusal counts: one that follows from it says nothing new.
+  void refuse(QVReason reason, std::int64_t position, char const* pattern, Words words);
+  /// Refuses for want of `count` bytes at `position`: those of what the pattern names.
+  void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
+  /// Counts steps beyond the first few instead of keeping them.
+  void passed(std::int64_t position, char const* pattern, Words words);
+  void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
+  /// Tells why a field stays absent, if it does; the last reason counts.
+  void absent(char const* field, QVReason reason, char const* pattern, Words words);
+
+  /// The reason given for a field's absence by now, or null.
+  QVNote const* absenceOf(char const* field) const;
+  /// Whether a refusal was stated.
+  bool isRefused() const { return isRefused_; }
+
+  /// Why bytes that end at a position cannot be read: as a reason, and in words.
+  QVReason cutReason() const;
+  std::string cutText(std::int64_t end) const;
+
+  std::vector<QVNote> notes;
+  std::uint64_t furtherSteps = 0;
+  std::int64_t dataSize = -1;  ///< In bytes; -1: not known.
+  int readError = 0;           ///< The `errno` of a read that failed; 0: none did.
+
+ private:
+  void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);
+
+  bool wantsAll_;
+  bool isRefused_ = false;
+  std::size_t steps_ = 0;
+  std::size_t hints_ = 0;
+  std::vector<QVNote> absences_;  // by field, one for each
+};
+
+/// States why the read ends. False, for the step to return on the spot.
+template <class... Words>
+[[gnu::cold, gnu::noinline]] bool refuse(Journal* journal, QVReason reason, std::int64_t position,
+                                         char const* pattern, Words... words) {
+  if (journal != nullptr) {
+    journal->refuse(reason, position, pattern, {words...});
+  }
+  return false;
+}
+
+/// The same when `count` bytes at `position` are not in the data; the pattern names what they are.
+template <class... Words>
+[[gnu::cold, gnu::noinline]] bool refuseCut(Journal* journal, std::int64_t position,
+                                            std::int64_t count, char const* pattern,
+                                            Words... words) {
+  if (journal != nullptr) {
+    journal->refuseCut(position, count, pattern, {words...});
+  }
+  return false;
+}
+
+template <class... Words>
+void notePassed(Journal* journal, std::int64_t position, char const* pattern, Words... words) {
+  if (journal != nullptr && journal->wantsAll()) {
+    journal->passed(position, pattern, {words...});
+  }
+}
+
+template <class... Words>
+void noteHint(Journal* journal, QVReason reason, std::int64_t position, char const* pattern,
+              Words... words) {
+  if (journal != nullptr && journal->wantsAll()) {
+    journal->hint(reason, position, pattern, {words...});
+  }
+}
+
+using Fields = std::initializer_list<char const*>;
+
+template <class... Words>
+void noteAbsent(Journal* journal, Fields fields, QVReason reason, char const* pattern,
+                Words... words) {
+  if (journal != nullptr && journal->wantsAll()) {
+    for (char const* const field : fields) {
+      journal->absent(field, reason, pattern, {words...});
+    }
+  }
+}
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_JOURNAL_JOURNAL_H

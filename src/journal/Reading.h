@@ -1,0 +1,94 @@
+#ifndef QUAVEL_SRC_JOURNAL_READING_H
+#define QUAVEL_SRC_JOURNAL_READING_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+
+#include "quavel/QVStream.h"
+
+namespace quavel::detail {
+
+class Journal;
+
+/// What a read does as often as the file has it done.
+enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
+
+/// How much of it one read may do. Nothing in the formats limits how many directories, segments or
+/// boxes come before the wanted one; but a file can lead to the same large directory again and
+/// again. The bounds lie far above what cameras write.
+inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
+    std::uint64_t{1} << 16U,  // directories opened
+    std::uint64_t{1} << 24U,  // entries walked over
+    std::uint64_t{1} << 20U,  // values taken: with the directories that hold them, below 32 MB
+    std::uint64_t{1} << 24U,  // segments or boxes: 32 MB of zeros in a JPEG stay below
+};
+
+/// One read of a file: the work that it has done, and who listens.
+class Reading {
+ public:
+  /// Counts work. False, the refusal stated: that was too much.
+  bool spend(Work work, std::uint64_t amount) {
+    std::uint64_t& done = done_[static_cast<std::size_t>(work)];
+    done += amount;
+    return done <= kMaxWork[static_cast<std::size_t>(work)] || refuseWork(work);
+  }
+
+  Journal* journal = nullptr;  ///< Null: nobody listens.
+
+  /// The library has made the record itself, so no class of a host's sees the directories.
+  bool isOwnRecord = false;
+
+ private:
+  bool refuseWork(Work work) const;
+
+  std::array<std::uint64_t, 4> done_ = {};
+};
+
+/// The time during which a stream serves a read. What is called on the way, by readers or by a
+/// host's own code, joins the read instead of beginning another.
+class ReadScope {
+ public:
+  explicit ReadScope(QVStream& stream) : stream_(stream) {
+    if (stream_.reading_.current == nullptr) {
+      stream_.reading_.current = &own_;
+    }
+  }
+  ~ReadScope() {
+    if (stream_.reading_.current == &own_) {
+      stream_.reading_.current = nullptr;
+    }
+  }
+  ReadScope(ReadScope const&) = delete;
+  ReadScope& operator=(ReadScope const&) = delete;
+
+  Reading& reading() const { return *stream_.reading_.current; }
+
+ private:
+  QVStream& stream_;
+  Reading own_;
+};
+
+/// The read that the stream serves. Every public operation that can lead to here opens a scope.
+inline Reading& readingOf(QVStream const& stream) { return *stream.reading_.current; }
+
+/// The journal of the read that the stream serves, or null.
+inline Journal* journalOf(QVStream const& stream) {
+  Reading const* const reading = stream.reading_.current;
+  return reading == nullptr ? nullptr : reading->journal;
+}
+
+/// Remembers the `errno` of a read of the system's that failed, for the refusal that follows.
+void noteReadError(QVStream const& stream, int error);
+
+/// Where the stream stands in the file.
+inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }
+
+/// The same for a note; 0 when nobody listens.
+inline std::int64_t notedPosition(Journal const* journal, QVStream& stream) {
+  return journal == nullptr ? 0 : positionOf(stream);
+}
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_JOURNAL_READING_H

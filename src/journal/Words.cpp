@@ -1,0 +1,82 @@
+#include "journal/Words.h"
+
+namespace quavel::detail {
+
+namespace {
+
+constexpr std::size_t kMaxTextLength = 500;
+
+// Offsets below it read the same in both notations.
+constexpr std::int64_t kFirstHexadecimal = 10;
+
+void appendHex(std::string& out, std::uint64_t number, int minDigits) {
+  int digits = minDigits;
+  while (digits < 16 && number >> (4 * digits) != 0) {
+    ++digits;
+  }
+  while (digits-- > 0) {
+    out += "0123456789abcdef"[number >> (4 * digits) & 0xfU];
+  }
+}
+
+}  // namespace
+
+void append(std::string& out, char const* text) { out += text; }
+
+void append(std::string& out, std::string const& text) { out += text; }
+
+void append(std::string& out, std::int64_t number) { out += std::to_string(number); }
+
+void append(std::string& out, Offset offset) {
+  if (offset.value < kFirstHexadecimal) {
+    append(out, offset.value);
+    return;
+  }
+  out += "0x";
+  appendHex(out, static_cast<std::uint64_t>(offset.value), 1);
+  out += " (";
+  append(out, offset.value);
+  out += ')';
+}
+
+void append(std::string& out, HexBytes bytes) {
+  for (std::size_t i = 0; i < bytes.count; ++i) {
+    out += i == 0 ? "" : " ";
+    appendHex(out, bytes.bytes[i], 2);
+  }
+}
+
+void append(std::string& out, HexCode code) {
+  out += "0x";
+  appendHex(out, code.value, 4);
+}
+
+void append(std::string& out, QuotedBytes bytes) {
+  for (std::size_t i = 0; i < bytes.count; ++i) {
+    std::uint8_t const byte = bytes.bytes[i];
+    if (byte >= ' ' && byte <= '~') {
+      out += static_cast<char>(byte);
+    } else {
+      out += "\\x";
+      appendHex(out, byte, 2);
+    }
+  }
+}
+
+std::string composed(char const* pattern, std::initializer_list<Word> words) {
+  std::string text;
+  auto const* word = words.begin();
+  for (char const* at = pattern; *at != '\0'; ++at) {
+    if (at[0] == '{' && at[1] == '}' && word != words.end()) {
+      word->appendTo(text);
+      ++word;
+      ++at;
+    } else {
+      text += *at;
+    }
+  }
+  text.resize(text.size() < kMaxTextLength ? text.size() : kMaxTextLength);
+  return text;
+}
+
+}  // namespace quavel::detail

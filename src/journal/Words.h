@@ -1,0 +1,65 @@
+#ifndef QUAVEL_SRC_JOURNAL_WORDS_H
+#define QUAVEL_SRC_JOURNAL_WORDS_H
+
+#include <cstddef>
+#include <cstdint>
+#include <initializer_list>
+#include <string>
+
+namespace quavel::detail {
+
+/// An offset in the file: "0x1f2 (498)".
+struct Offset {
+  std::int64_t value;
+};
+
+/// Bytes of the file: "ff d8 ff e0".
+struct HexBytes {
+  std::uint8_t const* bytes;
+  std::size_t count;
+};
+
+/// A 16-bit code of the file: "0xffe1".
+struct HexCode {
+  std::uint16_t value;
+};
+
+/// Text of the file, shown as printable ASCII with the rest as "\x1b".
+struct QuotedBytes {
+  std::uint8_t const* bytes;
+  std::size_t count;
+};
+
+void append(std::string& out, char const* text);
+void append(std::string& out, std::string const& text);
+void append(std::string& out, std::int64_t number);
+inline void append(std::string& out, int number) { append(out, std::int64_t{number}); }
+inline void append(std::string& out, std::uint32_t number) { append(out, std::int64_t{number}); }
+void append(std::string& out, Offset offset);
+void append(std::string& out, HexBytes bytes);
+void append(std::string& out, HexCode code);
+void append(std::string& out, QuotedBytes bytes);
+
+/// A part of a note's text. It refers to a value of a type that an `append` above, or one beside
+/// the type itself, puts into words; that is done only for a note that is kept.
+class Word {
+ public:
+  template <class Value>
+  Word(Value const& value)
+      : value_(&value), append_([](std::string& out, void const* word) {
+          append(out, *static_cast<Value const*>(word));
+        }) {}
+
+  void appendTo(std::string& out) const { append_(out, value_); }
+
+ private:
+  void const* value_;
+  void (*append_)(std::string& out, void const* word);
+};
+
+/// The pattern with each "{}" replaced by a word, cut to the length that a note may have.
+std::string composed(char const* pattern, std::initializer_list<Word> words);
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_JOURNAL_WORDS_H

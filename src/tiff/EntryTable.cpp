@@ -1,0 +1,140 @@
+#include "tiff/EntryTable.h"
+
+#include "journal/Journal.h"
+#include "journal/Reading.h"
+#include "stream/Bytes.h"
+#include "tiff/EntryWalk.h"
+#include "tiff/HostEntry.h"
+
+namespace quavel::detail {
+
+namespace {
+
+// Values, of 9 bytes. The wanted ones of most files are fewer, and allocators keep blocks of up to
+// 1 KB at hand.
+constexpr std::size_t kFirstCapacity = 112;
+
+}  // namespace
+
+bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
+  Reading& reading = readingOf(stream);
+  journal_ = reading.journal;
+  if (!stream.readShort(&entryCount_)) {
+    return refuseCut(journal_, position_, kEntryCountSize, "the entry count of {}",
+                     PlacedDirectory{*this});
+  }
+  if (!reading.spend(Work::Directories, 1) || !reading.spend(Work::Entries, entryCount_)) {
+    return false;
+  }
+
+  values_.reserve(kFirstCapacity);
+  EntryWalk walk(stream, entryCount_);
+  for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
+    if (!walk.hasTag()) {
+      return refuseCut(journal_, positionOf(walk), kEntryTypePosition, "entry {} of {} of {}",
+                       walk.number(), std::uint32_t{entryCount_}, PlacedDirectory{*this});
+    }
+    unsigned short const tag = walk.tag();
+    if (!wanted.take(tag)) {
+      continue;
+    }
+    // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
+    stream.setOffset(walk.nextOffset());
+    RawEntry entry;
+    if (!walk.readRest(&entry)) {
+      return refuseCut(journal_, positionOf(walk) + std::int64_t{kEntryTypePosition},
+                       kEntryFieldPosition - kEntryTypePosition, "{}",
+                       PlacedEntry{*this, Row{tag, 0, 0, positionOf(walk), 0, 0}});
+    }
+    if (!readEntry(stream, tag, positionOf(walk), entry)) {
+      return false;
+    }
+  }
+
+  // The entries may have left the stream anywhere.
+  stream.setOffset(walk.end());
+  return true;
+}
+
+std::int64_t EntryTable::positionOf(EntryWalk const& walk) const {
+  return position_ + kEntryCountSize + std::int64_t{kEntrySize} * (walk.number() - 1);
+}
+
+bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
+                           RawEntry const& entry) {
+  Row row = {
+      tag, entry.typeCode, entry.count, position, 0, static_cast<std::uint32_t>(values_.size())};
+  if (!isAllowed(entry) || !isWhole(entry)) {
+    return refuseEntry(row, entry);
+  }
+  if (entry.typeCode == kUndefinedCode) {
+    row.field = undefinedField(entry, isReversed(stream));
+  } else if (!readingOf(stream).spend(Work::Values, entry.count)) {
+    return false;
+  } else if (!readValues(stream, entry, values_)) {
+    return refuseValues(row, entry, stream);
+  }
+  rows_.push_back(row);
+  return true;
+}
+
+bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIFDOffset) {
+  rows_.reserve(tags.size());
+  WantedTags wanted(tags.begin(), tags.size());
+  if (!read(stream, wanted)) {
+    return false;
+  }
+  if (!stream.readLong(nextIFDOffset)) {
+    return refuseCut(journal_, position_ + kEntryCountSize + kEntrySize * entryCount_,
+                     sizeof(*nextIFDOffset),
+                     "the offset of the next directory, behind the {} entries of {}",
+                     std::uint32_t{entryCount_}, PlacedDirectory{*this});
+  }
+  notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{*this},
+             static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
+  return true;
+}
+
+bool EntryTable::refuseEntry(Row const& row, RawEntry const& entry) const {
+  PlacedEntry const place = {*this, row};
+  if (!isKnown(row.typeCode)) {
+    return refuse(journal_, QVReason::MalformedEntry, row.position,
+                  "{}: field type {} is neither one of TIFF's 12 nor 13 (IFD)", place,
+                  std::uint32_t{row.typeCode});
+  }
+  if (!isAllowed(entry)) {
+    return refuse(journal_, QVReason::TooManyValues, row.position,
+                  "{}: it declares {}; more than {} are refused", place,
+                  TypedCount{row.count, row.typeCode}, kMaxValuesOfEntry);
+  }
+  return refuseCut(journal_, row.position + std::int64_t{kEntryFieldPosition},
+                   static_cast<std::int64_t>(usedFieldSize(entry)), "{}", place);
+}
+
+bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& stream) const {
+  if (journal_ == nullptr) {
+    return false;
+  }
+  std::int64_t const begin = stream.baseOffset + valueOffset(entry, isReversed(stream));
+  std::int64_t const end = begin + static_cast<std::int64_t>(sizeOfValues(entry));
+  return refuse(journal_, journal_->cutReason(), begin,
+                "{}: its {} would begin at {} and end at {}, but {}", PlacedEntry{*this, row},
+                TypedCount{row.count, row.typeCode}, Offset{begin}, Offset{end},
+                journal_->cutText(end));
+}
+
+void append(std::string& out, PlacedDirectory directory) {
+  append(out, directory.table.name());
+  out += " at ";
+  append(out, Offset{directory.table.position()});
+}
+
+void append(std::string& out, PlacedEntry entry) {
+  append(out, TagName{entry.row.tag});
+  out += " at ";
+  append(out, Offset{entry.row.position});
+  out += " in ";
+  append(out, entry.table.name());
+}
+
+}  // namespace quavel::detail

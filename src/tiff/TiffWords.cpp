@@ -1,0 +1,64 @@
+#include "tiff/TiffWords.h"
+
+#include <array>
+
+#include "tiff/Tags.h"
+
+namespace quavel::detail {
+
+namespace {
+
+constexpr std::array<char const*, 14> kTypeNames = {
+    nullptr,     "BYTE",   "ASCII", "SHORT",     "LONG",  "RATIONAL", "SBYTE",
+    "UNDEFINED", "SSHORT", "SLONG", "SRATIONAL", "FLOAT", "DOUBLE",   "IFD"};
+
+tag::Name const* nameOf(unsigned short tag) {
+  for (auto const& row : tag::kNames) {
+    if (row.tag == tag) {
+      return &row;
+    }
+  }
+  return nullptr;
+}
+
+}  // namespace
+
+void append(std::string& out, TagName tag) {
+  append(out, HexCode{tag.tag});
+  if (auto const* const row = nameOf(tag.tag)) {
+    out.append(" ").append(row->name);
+  }
+}
+
+void append(std::string& out, TypedCount values) {
+  append(out, values.count);
+  out += ' ';
+  appendType(out, values.typeCode);
+  out += values.count == 1 ? " value" : " values";
+}
+
+void append(std::string& out, DirectoryName const& directory) {
+  out += directory.name;
+  if (directory.number != 0) {
+    out.append(" ").append(std::to_string(directory.number));
+    out.append(" of ").append(std::to_string(directory.count));
+  }
+  if (directory.structure != nullptr) {
+    out.append(" of ").append(directory.structure);
+  }
+}
+
+void appendType(std::string& out, std::uint16_t typeCode) {
+  if (typeCode == 0 || typeCode >= kTypeNames.size()) {
+    out.append("type ").append(std::to_string(typeCode));
+  } else {
+    out += kTypeNames[typeCode];
+  }
+}
+
+char const* fieldOf(unsigned short tag) {
+  auto const* const row = nameOf(tag);
+  return row == nullptr ? nullptr : row->field;
+}
+
+}  // namespace quavel::detail

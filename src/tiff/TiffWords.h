@@ -1,0 +1,43 @@
+#ifndef QUAVEL_SRC_TIFF_TIFFWORDS_H
+#define QUAVEL_SRC_TIFF_TIFFWORDS_H
+
+#include <cstdint>
+#include <string>
+
+#include "journal/Words.h"
+
+// How notes speak of TIFF structures.
+namespace quavel::detail {
+
+/// "0x0132 DateTime"
+struct TagName {
+  unsigned short tag;
+};
+
+/// "2 SHORT values"
+struct TypedCount {
+  std::uint32_t count;
+  std::uint16_t typeCode;
+};
+
+/// "IFD0 of the Exif segment" or "SubIFD 2 of 3".
+struct DirectoryName {
+  char const* name = "the directory";
+  char const* structure = nullptr;  ///< Null for the structure that is the whole file.
+  std::uint32_t number = 0;         ///< Of so many like it; 0: it is the only one.
+  std::uint32_t count = 0;
+};
+
+void append(std::string& out, TagName tag);
+void append(std::string& out, TypedCount values);
+void append(std::string& out, DirectoryName const& directory);
+
+/// "SHORT", or "type 99" for the code of no type.
+void appendType(std::string& out, std::uint16_t typeCode);
+
+/// The record's field that an entry under the tag gives; null for none.
+char const* fieldOf(unsigned short tag);
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_TIFF_TIFFWORDS_H
