@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <new>
 #include <system_error>
 #include <utility>
 
@@ -27,9 +28,34 @@ namespace quavel::detail {
 
 namespace {
 
+/// Room for an image of any class: as none adds members to the record, one kind of room serves all,
+/// which keeps ten kinds of shared owner out of the library.
+class ImageRoom {
+ public:
+  ImageRoom() {}  // leaves the bytes as they are
+  ~ImageRoom() {
+    if (image_ != nullptr) {
+      image_->~QVMetadata();
+    }
+  }
+  ImageRoom(ImageRoom const&) = delete;
+  ImageRoom& operator=(ImageRoom const&) = delete;
+
+  template <class Image>
+  QVMetadata* make() {
+    static_assert(sizeof(Image) == sizeof(QVMetadata));
+    return image_ = new (bytes_) Image;
+  }
+
+ private:
+  QVMetadata* image_ = nullptr;
+  alignas(QVMetadata) unsigned char bytes_[sizeof(QVMetadata)];
+};
+
 template <class Image>
 std::shared_ptr<QVMetadata> make() {
-  return std::make_shared<Image>();
+  auto const room = std::make_shared<ImageRoom>();
+  return {room, room->make<Image>()};
 }
 
 constexpr Format kFormats[] = {
