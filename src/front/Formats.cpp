@@ -85,10 +85,10 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
 
 /// Learns what notes tell of an open file; or why it is not open.
 bool examine(QVFStream const& file, Journal& journal) {
-  int const error = errno;
   if (file.fd == -1) {
+    journal.systemError = errno;
     return refuse(&journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
-                  std::generic_category().message(error));
+                  std::generic_category().message(journal.systemError));
   }
   struct stat status = {};
   if (::fstat(file.fd, &status) == 0 && S_ISREG(status.st_mode)) {
