@@ -3,6 +3,7 @@
 #include <cmath>
 #include <cstring>
 #include <limits>
+#include <type_traits>
 
 #include "quavel/QVStream.h"
 #include "tiff/RawEntry.h"
@@ -58,69 +59,63 @@ Integer truncated(double number) {
   return static_cast<Integer>(number);
 }
 
-/// The value's low 32 bits; floats saturate at the limits of `Integer`, of 32 bits too.
-template <class Integer>
-std::uint32_t to32Bits(Value const& value) {
+/// Gives what the value holds, as what it is, to a conversion. UNDEFINED and what is not a type,
+/// for `type` is public, hold nothing: the result is 0.
+template <class Convert>
+auto converted(Value const& value, Convert const& convert) -> decltype(convert(0)) {
   switch (value.type) {
     case EntryValueType::BYTE:
-      return stored<std::uint8_t>(value);
+      return convert(stored<std::uint8_t>(value));
     case EntryValueType::ASCII:
     case EntryValueType::SBYTE:
-      return static_cast<std::uint32_t>(stored<std::int8_t>(value));
+      return convert(stored<std::int8_t>(value));
     case EntryValueType::SHORT:
-      return stored<std::uint16_t>(value);
+      return convert(stored<std::uint16_t>(value));
     case EntryValueType::SSHORT:
-      return static_cast<std::uint32_t>(stored<std::int16_t>(value));
+      return convert(stored<std::int16_t>(value));
     case EntryValueType::LONG:
+      return convert(stored<std::uint32_t>(value));
     case EntryValueType::SLONG:
-      return stored<std::uint32_t>(value);
+      return convert(stored<std::int32_t>(value));
     case EntryValueType::RATIONAL:
-      return quotient(stored<Rational>(value));
+      return convert(stored<Rational>(value));
     case EntryValueType::SRATIONAL:
-      return static_cast<std::uint32_t>(quotient(stored<SRational>(value)));
+      return convert(stored<SRational>(value));
     case EntryValueType::FLOAT:
-      return static_cast<std::uint32_t>(truncated<Integer>(stored<float>(value)));
+      return convert(stored<float>(value));
     case EntryValueType::DOUBLE:
-      return static_cast<std::uint32_t>(truncated<Integer>(stored<double>(value)));
+      return convert(stored<double>(value));
     case EntryValueType::UNDEFINED:
       return 0;
   }
-  return 0;  // `type` is public: it may hold what is no type
+  return 0;
 }
 
-template <class Float, class Fraction>
-Float divided(Fraction const& fraction) {
-  return static_cast<Float>(fraction.numerator) / static_cast<Float>(fraction.denominator);
+/// The value's low 32 bits, integers widened by their own sign; floats saturate at the limits of
+/// `Integer`, of 32 bits too.
+template <class Integer>
+std::uint32_t to32Bits(Value const& value) {
+  return converted(value, [](auto number) {
+    using Number = decltype(number);
+    if constexpr (std::is_integral_v<Number>) {
+      return static_cast<std::uint32_t>(number);
+    } else if constexpr (std::is_floating_point_v<Number>) {
+      return static_cast<std::uint32_t>(truncated<Integer>(number));
+    } else {
+      return static_cast<std::uint32_t>(quotient(number));
+    }
+  });
 }
 
 template <class Float>
 Float toFloat(Value const& value) {
-  switch (value.type) {
-    case EntryValueType::BYTE:
-      return stored<std::uint8_t>(value);
-    case EntryValueType::ASCII:
-    case EntryValueType::SBYTE:
-      return stored<std::int8_t>(value);
-    case EntryValueType::SHORT:
-      return stored<std::uint16_t>(value);
-    case EntryValueType::SSHORT:
-      return stored<std::int16_t>(value);
-    case EntryValueType::LONG:
-      return static_cast<Float>(stored<std::uint32_t>(value));
-    case EntryValueType::SLONG:
-      return static_cast<Float>(stored<std::int32_t>(value));
-    case EntryValueType::RATIONAL:
-      return divided<Float>(stored<Rational>(value));
-    case EntryValueType::SRATIONAL:
-      return divided<Float>(stored<SRational>(value));
-    case EntryValueType::FLOAT:
-      return stored<float>(value);
-    case EntryValueType::DOUBLE:
-      return static_cast<Float>(stored<double>(value));
-    case EntryValueType::UNDEFINED:
-      return 0;
-  }
-  return 0;  // `type` is public: it may hold what is no type
+  return converted(value, [](auto number) {
+    if constexpr (std::is_arithmetic_v<decltype(number)>) {
+      return static_cast<Float>(number);
+    } else {
+      return static_cast<Float>(number.numerator) / static_cast<Float>(number.denominator);
+    }
+  });
 }
 
 std::uint32_t bitsOf(Value const& value) { return to32Bits<std::int32_t>(value); }
