@@ -4,8 +4,8 @@
 #include <algorithm>
 #include <thread>
 
-#include "Escape.h"
-#include "Photo.h"
+#include "photo/Photo.h"
+#include "terminal/Escape.h"
 
 namespace app {
 
@@ -80,11 +80,11 @@ std::string refuseEmpty(std::string const& argument) {
 }
 
 void addInputs(CLI::App& command, Options& options) {
-  command.add_option("PATH", options.paths, "Photos and folders of photos")->type_name("");
-  auto* const list = command.add_option("--files-from", options.filesFrom,
+  command.add_option("PATH", options.inputs.paths, "Photos and folders of photos")->type_name("");
+  auto* const list = command.add_option("--files-from", options.inputs.list,
                                         "Read the photos' paths from a file; -: standard input");
   list->type_name("FILE")->check(refuseEmpty);
-  command.add_flag("-0,--null", options.isNulSeparated, "Paths in that file end with a NUL")
+  command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
       ->needs(list);
   auto* const standardInput =
       command.add_flag("--stdin", options.fromStdin, "Read one image from standard input");
@@ -135,16 +135,16 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
 
 void check(Options& options, Texts const& texts) {
   for (auto const& list : texts.fields) {
-    addFields(list, options.fields);
+    addFields(list, options.form.fields);
   }
   if (texts.sort) {
-    options.sort = wantedField("--sort", *texts.sort);
+    options.form.sort = wantedField("--sort", *texts.sort);
   }
   if (texts.absent && texts.absent != "skip" && texts.absent != "show") {
     throw CLI::ValidationError("--absent: give skip or show");
   }
   if (texts.absent) {
-    options.showAbsent = texts.absent == "show";
+    options.form.showAbsent = texts.absent == "show";
   }
   if (options.fromStdin) {
     options.extension = extensionOf("." + options.extension);
@@ -152,9 +152,9 @@ void check(Options& options, Texts const& texts) {
       throw CLI::ValidationError("--extension: give one of: " + extensionList());
     }
   }
-  bool const hasPaths = !options.paths.empty() || !options.filesFrom.empty();
+  bool const hasPaths = !options.inputs.paths.empty() || !options.inputs.list.empty();
   if (!options.why.empty()) {
-    if (hasPaths || options.fromStdin || options.form != FormKind::Automatic) {
+    if (hasPaths || options.fromStdin || options.form.kind != FormKind::Automatic) {
       throw CLI::ValidationError("--why explains one file in words: give no other and no form");
     }
     return;
@@ -188,7 +188,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.get_formatter()->column_width(26);
   options.jobs = std::clamp(std::thread::hardware_concurrency(), 1U, kMostJobs);
   addInputs(command, options);
-  addForms(command, options.form);
+  addForms(command, options.form.kind);
   addChoices(command, options, texts);
   try {
     command.parse(argc, argv);

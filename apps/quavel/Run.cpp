@@ -6,11 +6,11 @@
 #include <optional>
 #include <system_error>
 
-#include "Photo.h"
 #include "Pipeline.h"
 #include "Progress.h"
-#include "Source.h"
-#include "Writer.h"
+#include "input/Source.h"
+#include "output/Writer.h"
+#include "photo/Photo.h"
 
 namespace app {
 
@@ -52,7 +52,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
     : options_(options),
       output_(output),
       console_(console),
-      writer_(makeWriter(options, output)),
+      writer_(makeWriter(options.form, output)),
       progress_(console, options),
       pipeline_(options.jobs, [this](Batch& batch) { work(batch); }) {}
 
@@ -65,10 +65,10 @@ int Runner::run() {
   }
   std::optional<Source> source;
   try {
-    source.emplace(options_, [this](std::string const& path, std::string const& problem,
-                                    bool isFailure) { report(path, problem, isFailure); });
+    source.emplace(options_.inputs, [this](std::string const& path, std::string const& problem,
+                                           bool isFailure) { report(path, problem, isFailure); });
   } catch (std::system_error const& error) {
-    console_.sayOf(options_.filesFrom, "the list cannot be opened: " + error.code().message());
+    console_.sayOf(options_.inputs.list, "the list cannot be opened: " + error.code().message());
     return kWrongUsage;
   }
   return runSource(*source);
@@ -136,7 +136,7 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   progress_.count(outcome.error.empty());
-  if (!outcome.error.empty() && !(options_.isQuiet && options_.isMachineForm())) {
+  if (!outcome.error.empty() && !(options_.isQuiet && options_.form.isForMachines())) {
     console_.sayOf(outcome.path, outcome.error);
   }
   writer_->add(std::move(outcome));

@@ -4,12 +4,12 @@
 #include <string_view>
 #include <system_error>
 
-#include "Escape.h"
-#include "Photo.h"
 #include "WhyContent.h"
 #include "WhyFields.h"
 #include "WhyFormats.h"
 #include "WhyWalk.h"
+#include "photo/Photo.h"
+#include "terminal/Escape.h"
 
 namespace app {
 

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <string_view>
 
-#include "Escape.h"
+#include "terminal/Escape.h"
 
 namespace app::why {
 

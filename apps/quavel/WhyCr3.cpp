@@ -5,9 +5,9 @@
 #include <array>
 #include <string>
 
-#include "Escape.h"
 #include "WhyCmt.h"
 #include "WhyFormats.h"
+#include "terminal/Escape.h"
 
 namespace app::why {
 

@@ -6,7 +6,7 @@
 #include <variant>
 #include <vector>
 
-#include "Field.h"
+#include "photo/Field.h"
 
 namespace app::why {
 

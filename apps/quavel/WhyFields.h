@@ -4,8 +4,8 @@
 #include <ostream>
 #include <string>
 
-#include "Outcome.h"
 #include "WhyWalk.h"
+#include "photo/Outcome.h"
 
 namespace app::why {
 

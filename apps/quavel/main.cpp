@@ -8,12 +8,12 @@
 #include <string>
 #include <system_error>
 
-#include "Console.h"
-#include "Interrupt.h"
 #include "Options.h"
-#include "Output.h"
 #include "Run.h"
 #include "Why.h"
+#include "output/Output.h"
+#include "terminal/Console.h"
+#include "terminal/Interrupt.h"
 
 namespace {
 

@@ -1,8 +1,8 @@
-#include "CardWriter.h"
+#include "output/CardWriter.h"
 
 #include <algorithm>
 
-#include "Escape.h"
+#include "terminal/Escape.h"
 
 namespace app {
 
@@ -43,18 +43,18 @@ Fields cardFields() {
 
 }  // namespace
 
-std::string cardOf(Options const& options, Outcome const& outcome) {
+std::string cardOf(Form const& form, Outcome const& outcome) {
   if (!outcome.record) {
     return {};
   }
   static Fields const all = cardFields();
   std::string card;
-  if (options.fields.empty()) {
+  if (form.fields.empty()) {
     card = escaped(outcome.path) + "\n";
   }
-  for (auto const* field : options.fields.empty() ? all : options.fields) {
+  for (auto const* field : form.fields.empty() ? all : form.fields) {
     std::string const text = inWords(*field, outcome);
-    if (text.empty() && !options.showAbsent.value_or(!options.fields.empty())) {
+    if (text.empty() && !form.showAbsent.value_or(!form.fields.empty())) {
       continue;
     }
     std::string label = field->label;
@@ -64,11 +64,10 @@ std::string cardOf(Options const& options, Outcome const& outcome) {
   return card;
 }
 
-CardWriter::CardWriter(Options const& options, Output& output)
-    : options_(options), output_(output) {}
+CardWriter::CardWriter(Form const& form, Output& output) : form_(form), output_(output) {}
 
 void CardWriter::prepare(Outcome& outcome) const {
-  outcome.text = cardOf(options_, outcome);
+  outcome.text = cardOf(form_, outcome);
   outcome.record.reset();
 }
 

@@ -1,4 +1,4 @@
-#include "PathList.h"
+#include "input/PathList.h"
 
 #include <fcntl.h>
 #include <poll.h>

@@ -7,7 +7,7 @@
 #include <variant>
 #include <vector>
 
-#include "Outcome.h"
+#include "photo/Outcome.h"
 
 namespace app {
 

@@ -1,8 +1,8 @@
-#include "Layout.h"
+#include "output/Layout.h"
 
 #include <algorithm>
 
-#include "Text.h"
+#include "terminal/Text.h"
 
 namespace app {
 

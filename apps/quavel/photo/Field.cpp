@@ -1,13 +1,13 @@
-#include "Field.h"
+#include "photo/Field.h"
 
 #include <charconv>
 #include <cmath>
 #include <type_traits>
 #include <utility>
 
-#include "Escape.h"
-#include "Text.h"
-#include "Words.h"
+#include "photo/Words.h"
+#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 

@@ -1,12 +1,12 @@
-#include "Writer.h"
+#include "output/Writer.h"
 
 #include <algorithm>
 #include <exception>
 
-#include "CardWriter.h"
-#include "CsvWriter.h"
-#include "JsonWriter.h"
-#include "TableWriter.h"
+#include "output/CardWriter.h"
+#include "output/CsvWriter.h"
+#include "output/JsonWriter.h"
+#include "output/TableWriter.h"
 
 namespace app {
 
@@ -48,17 +48,17 @@ void SortingWriter::end() {
   next_->end();
 }
 
-std::unique_ptr<Writer> makeForm(Options const& options, Output& output) {
-  switch (options.form) {
+std::unique_ptr<Writer> makeUnsorted(Form const& form, Output& output) {
+  switch (form.kind) {
     case FormKind::Json:
     case FormKind::Jsonl:
-      return std::make_unique<JsonWriter>(options, output);
+      return std::make_unique<JsonWriter>(form, output);
     case FormKind::Csv:
-      return std::make_unique<CsvWriter>(options, output);
+      return std::make_unique<CsvWriter>(form, output);
     case FormKind::Card:
-      return std::make_unique<CardWriter>(options, output);
+      return std::make_unique<CardWriter>(form, output);
     default:
-      return std::make_unique<TableWriter>(options, output);
+      return std::make_unique<TableWriter>(form, output);
   }
 }
 
@@ -78,12 +78,12 @@ void Writer::prepareSafely(Outcome& outcome) const {
   }
 }
 
-std::unique_ptr<Writer> makeWriter(Options const& options, Output& output) {
-  auto form = makeForm(options, output);
-  if (options.sort == nullptr) {
-    return form;
+std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
+  auto writer = makeUnsorted(form, output);
+  if (form.sort == nullptr) {
+    return writer;
   }
-  return std::make_unique<SortingWriter>(*options.sort, std::move(form));
+  return std::make_unique<SortingWriter>(*form.sort, std::move(writer));
 }
 
 }  // namespace app

@@ -1,4 +1,4 @@
-#include "Words.h"
+#include "photo/Words.h"
 
 #include <cmath>
 #include <cstddef>

@@ -1,4 +1,4 @@
-#include "Text.h"
+#include "terminal/Text.h"
 
 #include <locale.h>
 #include <wchar.h>

@@ -1,7 +1,7 @@
 #ifndef QUAVEL_APPS_CSVWRITER_H
 #define QUAVEL_APPS_CSVWRITER_H
 
-#include "Writer.h"
+#include "output/Writer.h"
 
 namespace app {
 
@@ -9,7 +9,7 @@ namespace app {
 class CsvWriter : public Writer {
  public:
   /// Adds the header row.
-  CsvWriter(Options const& options, Output& output);
+  CsvWriter(Form const& form, Output& output);
 
   void prepare(Outcome& outcome) const override;
   void add(Outcome&& outcome) override;

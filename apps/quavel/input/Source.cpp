@@ -1,28 +1,27 @@
-#include "Source.h"
+#include "input/Source.h"
 
 #include <sys/stat.h>
 
 #include <system_error>
 
-#include "Photo.h"
+#include "photo/Photo.h"
 
 namespace app {
 
-Source::Source(Options const& options, Report report)
-    : options_(options), report_(std::move(report)) {
-  if (!options.filesFrom.empty()) {
-    list_.emplace(options.filesFrom, options.isNulSeparated ? '\0' : '\n');
+Source::Source(Inputs const& inputs, Report report) : inputs_(inputs), report_(std::move(report)) {
+  if (!inputs.list.empty()) {
+    list_.emplace(inputs.list, inputs.isNulSeparated ? '\0' : '\n');
   }
 }
 
 bool Source::isReady() {
-  return walk_ || nextPath_ < options_.paths.size() || !list_ || list_->isReady();
+  return walk_ || nextPath_ < inputs_.paths.size() || !list_ || list_->isReady();
 }
 
 bool Source::next(Input& input) { return nextOfPaths(input) || nextOfList(input); }
 
 bool Source::nextOfPaths(Input& input) {
-  while (walk_ || nextPath_ < options_.paths.size()) {
+  while (walk_ || nextPath_ < inputs_.paths.size()) {
     if (walk_) {
       if (walk_->next(input)) {
         return true;
@@ -30,7 +29,7 @@ bool Source::nextOfPaths(Input& input) {
       walk_.reset();
       continue;
     }
-    std::string const& path = options_.paths[nextPath_++];
+    std::string const& path = inputs_.paths[nextPath_++];
     struct stat status = {};
     bool const exists = ::stat(path.c_str(), &status) == 0;
     if (exists && S_ISDIR(status.st_mode)) {
@@ -52,7 +51,7 @@ bool Source::nextOfList(Input& input) {
     return true;
   }
   if (list_->error != 0) {
-    report_(options_.filesFrom,
+    report_(inputs_.list,
             "the list cannot be read on: " + std::generic_category().message(list_->error), true);
   }
   list_.reset();

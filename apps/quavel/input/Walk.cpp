@@ -1,4 +1,4 @@
-#include "Walk.h"
+#include "input/Walk.h"
 
 #include <dirent.h>
 #include <sys/stat.h>
@@ -9,7 +9,7 @@
 #include <memory>
 #include <system_error>
 
-#include "Photo.h"
+#include "photo/Photo.h"
 
 namespace app {
 

@@ -4,8 +4,8 @@
 #include <atomic>
 #include <chrono>
 
-#include "Layout.h"
-#include "Writer.h"
+#include "output/Layout.h"
+#include "output/Writer.h"
 
 namespace app {
 
@@ -13,7 +13,7 @@ namespace app {
 /// terminal it fits the width; elsewhere nothing is cut. A single file becomes a card.
 class TableWriter : public Writer {
  public:
-  TableWriter(Options const& options, Output& output);
+  TableWriter(Form const& form, Output& output);
 
   void prepare(Outcome& outcome) const override;
   void add(Outcome&& outcome) override;
@@ -26,7 +26,7 @@ class TableWriter : public Writer {
   Widths naturalWidths() const;
   void useLayout(Widths const& natural);
 
-  Options const& options_;
+  Form const& form_;
   Output& output_;
   std::vector<Column> columns_;
   std::vector<std::vector<std::string>> page_;

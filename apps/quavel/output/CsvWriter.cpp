@@ -1,4 +1,4 @@
-#include "CsvWriter.h"
+#include "output/CsvWriter.h"
 
 namespace app {
 
@@ -33,8 +33,8 @@ Fields everyField() {
 
 }  // namespace
 
-CsvWriter::CsvWriter(Options const& options, Output& output)
-    : fields_(options.fields.empty() ? everyField() : options.fields), output_(output) {
+CsvWriter::CsvWriter(Form const& form, Output& output)
+    : fields_(form.fields.empty() ? everyField() : form.fields), output_(output) {
   std::string header;
   for (auto const* field : fields_) {
     header.append(header.empty() ? "" : ",").append(field->name);

@@ -1,10 +1,10 @@
-#include "Escape.h"
+#include "terminal/Escape.h"
 
 #include <algorithm>
 #include <cstdio>
 #include <string_view>
 
-#include "Text.h"
+#include "terminal/Text.h"
 
 namespace app {
 

@@ -1,4 +1,4 @@
-#include "Interrupt.h"
+#include "terminal/Interrupt.h"
 
 #include <signal.h>
 #include <unistd.h>

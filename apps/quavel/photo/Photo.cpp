@@ -1,4 +1,4 @@
-#include "Photo.h"
+#include "photo/Photo.h"
 
 #include <fcntl.h>
 #include <quavel/QVReader.h>

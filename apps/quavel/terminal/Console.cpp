@@ -1,4 +1,4 @@
-#include "Console.h"
+#include "terminal/Console.h"
 
 #include <sys/ioctl.h>
 #include <unistd.h>
@@ -6,9 +6,9 @@
 #include <cerrno>
 #include <string_view>
 
-#include "Escape.h"
-#include "Interrupt.h"
-#include "Text.h"
+#include "terminal/Escape.h"
+#include "terminal/Interrupt.h"
+#include "terminal/Text.h"
 
 namespace app {
 

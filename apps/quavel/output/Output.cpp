@@ -1,4 +1,4 @@
-#include "Output.h"
+#include "output/Output.h"
 
 #include <limits.h>
 #include <poll.h>
@@ -10,8 +10,8 @@
 #include <system_error>
 #include <utility>
 
-#include "Console.h"
-#include "Interrupt.h"
+#include "terminal/Console.h"
+#include "terminal/Interrupt.h"
 
 namespace app {
 

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include "Outcome.h"
+#include "photo/Outcome.h"
 
 namespace app {
 

@@ -1,11 +1,11 @@
-#include "TableWriter.h"
+#include "output/TableWriter.h"
 
 #include <algorithm>
 
-#include "CardWriter.h"
-#include "Escape.h"
-#include "Text.h"
-#include "Words.h"
+#include "output/CardWriter.h"
+#include "photo/Words.h"
+#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 
@@ -67,10 +67,10 @@ bool isWithin(Widths const& inner, Widths const& outer) {
 
 }  // namespace
 
-TableWriter::TableWriter(Options const& options, Output& output)
-    : options_(options),
+TableWriter::TableWriter(Form const& form, Output& output)
+    : form_(form),
       output_(output),
-      columns_(options.fields.empty() ? defaultColumns() : columnsOf(options.fields)) {}
+      columns_(form.fields.empty() ? defaultColumns() : columnsOf(form.fields)) {}
 
 void TableWriter::prepare(Outcome& outcome) const {
   if (outcome.record) {
@@ -82,11 +82,11 @@ void TableWriter::prepare(Outcome& outcome) const {
 }
 
 std::vector<std::string> TableWriter::cellsOf(Outcome const& outcome) const {
-  if (options_.fields.empty()) {
+  if (form_.fields.empty()) {
     return defaultCells(outcome);
   }
   std::vector<std::string> cells;
-  for (auto const* field : options_.fields) {
+  for (auto const* field : form_.fields) {
     cells.push_back(inWords(*field, outcome));
   }
   return cells;
@@ -118,7 +118,7 @@ void TableWriter::pause() {
 
 void TableWriter::end() {
   if (files_ == 1) {
-    output_.add(cardOf(options_, first_));
+    output_.add(cardOf(form_, first_));
   } else {
     writePage();
   }
@@ -142,7 +142,7 @@ Widths TableWriter::naturalWidths() const {
     for (auto const& cells : page_) {
       natural[i] = std::max(natural[i], app::cells(cells[i]));
     }
-    if (natural[i] > 0 || options_.showAbsent.value_or(!options_.fields.empty())) {
+    if (natural[i] > 0 || form_.showAbsent.value_or(!form_.fields.empty())) {
       natural[i] = std::max(natural[i], columns_[i].label.size());
     }
   }

@@ -4,7 +4,7 @@
 #include <string>
 #include <string_view>
 
-#include "Outcome.h"
+#include "photo/Outcome.h"
 
 namespace app {
 

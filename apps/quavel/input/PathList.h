@@ -3,7 +3,7 @@
 
 #include <string>
 
-#include "Outcome.h"
+#include "photo/Outcome.h"
 
 namespace app {
 

@@ -1,4 +1,4 @@
-#include "JsonWriter.h"
+#include "output/JsonWriter.h"
 
 #include <algorithm>
 #include <cmath>
@@ -41,13 +41,13 @@ bool holds(Fields const& fields, std::string_view name) {
 
 }  // namespace
 
-JsonWriter::JsonWriter(Options const& options, Output& output)
+JsonWriter::JsonWriter(Form const& form, Output& output)
     : errorMembers_(membersOf({fieldNamed("path"), fieldNamed("error")})),
       bytesOfErrors_(membersOf({fieldNamed("pathBytes")})),
-      showAbsent_(options.showAbsent.value_or(true)),
-      isArray_(options.form == FormKind::Json),
+      showAbsent_(form.showAbsent.value_or(true)),
+      isArray_(form.kind == FormKind::Json),
       output_(output) {
-  Fields const fields = options.fields.empty() ? recordFields() : options.fields;
+  Fields const fields = form.fields.empty() ? recordFields() : form.fields;
   members_ = membersOf(fields);
   if (holds(fields, "path") && !holds(fields, "pathBytes")) {
     pathBytes_ = bytesOfErrors_;

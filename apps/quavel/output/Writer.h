@@ -3,8 +3,8 @@
 
 #include <memory>
 
-#include "Options.h"
-#include "Output.h"
+#include "output/Form.h"
+#include "output/Output.h"
 
 namespace app {
 
@@ -28,8 +28,8 @@ class Writer {
   virtual void end() {}
 };
 
-/// The writer that the options ask for. Both arguments must outlive it.
-std::unique_ptr<Writer> makeWriter(Options const& options, Output& output);
+/// The writer for the form. Both arguments must outlive it.
+std::unique_ptr<Writer> makeWriter(Form const& form, Output& output);
 
 }  // namespace app
 

@@ -1,7 +1,7 @@
 #ifndef QUAVEL_APPS_JSONWRITER_H
 #define QUAVEL_APPS_JSONWRITER_H
 
-#include "Writer.h"
+#include "output/Writer.h"
 
 namespace app {
 
@@ -10,7 +10,7 @@ namespace app {
 class JsonWriter : public Writer {
  public:
   /// Writes the array's head.
-  JsonWriter(Options const& options, Output& output);
+  JsonWriter(Form const& form, Output& output);
 
   void prepare(Outcome& outcome) const override;
   void add(Outcome&& outcome) override;

@@ -1,0 +1,24 @@
+#ifndef QUAVEL_APPS_FORM_H
+#define QUAVEL_APPS_FORM_H
+
+#include <optional>
+
+#include "photo/Field.h"
+
+namespace app {
+
+enum class FormKind { Automatic, Card, Json, Jsonl, Csv };
+
+/// How the files are shown.
+struct Form {
+  FormKind kind = FormKind::Automatic;
+  Fields fields;                   ///< Empty: those of the form.
+  Field const* sort = nullptr;     ///< Null: the order of the input.
+  std::optional<bool> showAbsent;  ///< Not set: as the form does.
+
+  bool isForMachines() const { return kind != FormKind::Automatic && kind != FormKind::Card; }
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_FORM_H
