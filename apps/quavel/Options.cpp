@@ -92,12 +92,11 @@ void addInputs(CLI::App& command, Options& options) {
       command.add_option("--extension", options.extension, "The kind of that image, such as nef");
   extension->type_name("EXT")->needs(standardInput);
   standardInput->needs(extension)->excludes(list);
-  command.add_option("--why", options.why, "Tell why a file gives no record, or lacks fields")
-      ->type_name("FILE")
-      ->check(refuseEmpty);
 }
 
-void addForms(CLI::App& command, FormKind& form) {
+void addForms(CLI::App& command, Form& form) {
+  auto* const why =
+      command.add_flag("--why", form.hasNotes, "Tell why files give no record, or lack fields");
   std::vector<CLI::Option*> forms;
   struct Row {
     char const* name;
@@ -109,8 +108,11 @@ void addForms(CLI::App& command, FormKind& form) {
                          Row{"--jsonl", FormKind::Jsonl, "One JSON object a line, as they come"},
                          Row{"--csv", FormKind::Csv, "CSV (RFC 4180) with a header row"}}) {
     auto* const flag = command.add_flag_callback(
-        row.name, [&form, kind = row.kind] { form = kind; }, row.text);
+        row.name, [&form, kind = row.kind] { form.kind = kind; }, row.text);
     flag->group("Forms (otherwise a table, or a card when there is one photo)");
+    if (row.kind == FormKind::Card || row.kind == FormKind::Csv) {
+      flag->excludes(why);
+    }
     for (auto* const other : forms) {
       flag->excludes(other);
     }
@@ -148,16 +150,14 @@ void check(Options& options, Texts const& texts) {
   }
   if (options.fromStdin) {
     options.extension = extensionOf("." + options.extension);
-    if (!isPhotoExtension(options.extension)) {
-      throw CLI::ValidationError("--extension: give one of: " + extensionList());
+    std::string const unknown = whyUnknown(options.extension);
+    if (!unknown.empty()) {
+      throw CLI::ValidationError("--extension: " + unknown);
     }
   }
   bool const hasPaths = !options.inputs.paths.empty() || !options.inputs.list.empty();
-  if (!options.why.empty()) {
-    if (hasPaths || options.fromStdin || options.form.kind != FormKind::Automatic) {
-      throw CLI::ValidationError("--why explains one file in words: give no other and no form");
-    }
-    return;
+  if (options.form.isExplanation() && (!options.form.fields.empty() || texts.absent)) {
+    throw CLI::ValidationError("--fields and --absent: with --why, add --json or --jsonl");
   }
   if (hasPaths == options.fromStdin) {
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
@@ -188,7 +188,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.get_formatter()->column_width(26);
   options.jobs = std::clamp(std::thread::hardware_concurrency(), 1U, kMostJobs);
   addInputs(command, options);
-  addForms(command, options.form.kind);
+  addForms(command, options.form);
   addChoices(command, options, texts);
   try {
     command.parse(argc, argv);

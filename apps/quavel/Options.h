@@ -16,7 +16,6 @@ constexpr int kWrongUsage = 2;
 struct Options {
   Inputs inputs;
   bool fromStdin = false;
-  std::string why;        ///< The one file to explain; empty: none.
   std::string extension;  ///< Of what standard input holds, in lower case.
   Form form;
   unsigned jobs = 1;

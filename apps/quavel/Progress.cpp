@@ -111,7 +111,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  if (options_.isQuiet || (files == 1 && failures_ == 0)) {
+  bool const isToldAll = failures_ == 0 || options_.form.isExplanation();
+  if (options_.isQuiet || (files == 1 && isToldAll)) {
     return;
   }
   double const seconds = secondsSince(start_);

@@ -4,13 +4,11 @@
 
 #include <exception>
 #include <new>
-#include <sstream>
 #include <string>
 #include <system_error>
 
 #include "Options.h"
 #include "Run.h"
-#include "Why.h"
 #include "output/Output.h"
 #include "terminal/Console.h"
 #include "terminal/Interrupt.h"
@@ -33,18 +31,7 @@ void holdStandardStreams() {
   }
 }
 
-int explain(std::string const& path, app::Output& output) {
-  std::ostringstream text;
-  bool const hasRecord = app::explainFile(path, text);
-  output.add(text.str());
-  output.flush();
-  return hasRecord ? app::kSuccess : app::kSomeFailed;
-}
-
 int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
-  if (!parsed.status && !parsed.options.why.empty()) {
-    return explain(parsed.options.why, output);
-  }
   if (!parsed.status) {
     return app::run(parsed.options, output, console);
   }

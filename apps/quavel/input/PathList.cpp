@@ -8,6 +8,8 @@
 #include <cerrno>
 #include <system_error>
 
+#include "photo/Reasons.h"
+
 namespace app {
 
 namespace {
@@ -95,12 +97,14 @@ bool PathList::refill() {
 Input PathList::entry(std::string path) const {
   Input input;
   if (path.find('\0') != std::string::npos) {
-    input.problem = "holds a NUL; if the list is NUL-separated, add -0";
+    input.problem = {reason::kBadPath,
+                     "the path holds a NUL; if the list is NUL-separated, add -0"};
   } else if (path.size() > kLongestPath) {
-    input.problem = "is longer than a path can be; if the list is not NUL-separated, leave out -0";
+    input.problem = {reason::kBadPath,
+                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
   }
   input.path = std::move(path);
-  if (!input.problem.empty() && input.path.size() > kLongestPath) {
+  if (input.problem && input.path.size() > kLongestPath) {
     input.path.resize(kLongestPath);
   }
   return input;

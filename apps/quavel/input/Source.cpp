@@ -2,9 +2,8 @@
 
 #include <sys/stat.h>
 
-#include <system_error>
-
 #include "photo/Photo.h"
+#include "photo/Reasons.h"
 
 namespace app {
 
@@ -50,12 +49,12 @@ bool Source::nextOfList(Input& input) {
   if (list_->next(input)) {
     return true;
   }
-  if (list_->error != 0) {
-    report_(inputs_.list,
-            "the list cannot be read on: " + std::generic_category().message(list_->error), true);
-  }
+  int const error = list_->error;
   list_.reset();
-  return false;
+  input = {inputs_.list,
+           false,
+           {reason::kUnreadableList, "the list cannot be read on: " + reason::systemText(error)}};
+  return error != 0;
 }
 
 }  // namespace app

@@ -7,9 +7,9 @@
 #include <cerrno>
 #include <cstring>
 #include <memory>
-#include <system_error>
 
 #include "photo/Photo.h"
+#include "photo/Reasons.h"
 
 namespace app {
 
@@ -34,11 +34,6 @@ char typeOf(unsigned char type) {
   }
 }
 
-std::string unreadable(int error) {
-  return "the folder cannot be read: " + std::generic_category().message(error) +
-         "; its photos are missing";
-}
-
 }  // namespace
 
 Walk::Walk(std::string const& folder, Report report) : report_(std::move(report)) {
@@ -46,7 +41,12 @@ Walk::Walk(std::string const& folder, Report report) : report_(std::move(report)
 }
 
 bool Walk::next(Input& input) {
-  while (!levels_.empty()) {
+  while (missed_ || !levels_.empty()) {
+    if (missed_) {
+      input = std::move(*missed_);
+      missed_.reset();
+      return true;
+    }
     Level& level = levels_.back();
     if (level.next == level.starts.size()) {
       levels_.pop_back();
@@ -69,7 +69,7 @@ bool Walk::visit(char type, std::string path, Input& input) {
       enter(path, false);
       return false;
     case kOther:
-      report_(path, "is no regular file; passed over", false);
+      report_(path, "is not a regular file; passed over");
       return false;
     default:
       return visitUnknown(std::move(path), input);
@@ -80,7 +80,7 @@ bool Walk::visitUnknown(std::string path, Input& input) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
     if (errno == ELOOP) {
-      report_(path, "is a symbolic link that leads to itself; passed over", false);
+      report_(path, "is a symbolic link that leads to itself; passed over");
       return false;
     }
     input = {std::move(path), false, {}};  // reading it will tell what is wrong
@@ -103,8 +103,7 @@ void Walk::enter(std::string const& path, bool isLink) {
   std::unique_ptr<DIR, Close> const folder(::opendir(path.c_str()));
   struct stat status = {};
   if (!folder || ::fstat(::dirfd(folder.get()), &status) == -1) {
-    report_(path, unreadable(errno), true);
-    return;
+    return miss(path, errno);
   }
   Identity const identity(status.st_dev, status.st_ino);
   if (isRepeated(path, identity, isLink)) {
@@ -124,11 +123,11 @@ bool Walk::isRepeated(std::string const& path, Identity const& identity, bool is
   bool const isInside = std::any_of(levels_.begin(), levels_.end(),
                                     [&](Level const& level) { return level.identity == identity; });
   if (isInside) {
-    report_(path, "symbolic-link loop, back to a folder above; passed over", false);
+    report_(path, "symbolic-link loop, back to a folder above; passed over");
     return true;
   }
   if (isLink && !linked_.insert(identity).second) {
-    report_(path, "another symbolic link led to this folder before; passed over", false);
+    report_(path, "another symbolic link led to this folder before; passed over");
     return true;
   }
   return false;
@@ -141,13 +140,20 @@ void Walk::readNames(void* folder, Level& level) {
     errno = 0;
   }
   if (errno != 0) {
-    report_(level.path, unreadable(errno), true);
+    miss(level.path, errno);
   }
   level.names.shrink_to_fit();
   char const* const names = level.names.data();
   std::sort(level.starts.begin(), level.starts.end(), [names](std::size_t a, std::size_t b) {
     return std::strcmp(names + a + 1, names + b + 1) < 0;
   });
+}
+
+void Walk::miss(std::string const& path, int error) {
+  missed_ = {path,
+             false,
+             {reason::kUnreadableFolder, "the folder cannot be read: " + reason::systemText(error) +
+                                             "; its photos are missing"}};
 }
 
 void Walk::addName(Level& level, char type, char const* name) {

@@ -4,6 +4,7 @@
 #include <sys/types.h>
 
 #include <functional>
+#include <optional>
 #include <set>
 #include <string>
 #include <utility>
@@ -13,9 +14,8 @@
 
 namespace app {
 
-/// Takes a path and what is wrong with it. `isFailure`: photos may have been missed.
-using Report =
-    std::function<void(std::string const& path, std::string const& problem, bool isFailure)>;
+/// Takes a path that is passed over, and why.
+using Report = std::function<void(std::string const& path, std::string const& why)>;
 
 /// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
 /// are followed; one that leads back to a folder above it, or to where another link led before, is
@@ -24,7 +24,7 @@ class Walk {
  public:
   Walk(std::string const& folder, Report report);
 
-  /// The next photo; false at the end.
+  /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
 
  private:
@@ -40,6 +40,7 @@ class Walk {
   void enter(std::string const& path, bool isLink);
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
   void readNames(void* folder, Level& level);
+  void miss(std::string const& path, int error);
   void addName(Level& level, char type, char const* name);
   bool visit(char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
@@ -47,6 +48,7 @@ class Walk {
   Report report_;
   std::vector<Level> levels_;
   std::set<Identity> linked_;
+  std::optional<Input> missed_;
 };
 
 }  // namespace app

@@ -15,8 +15,11 @@ struct Form {
   Fields fields;                   ///< Empty: those of the form.
   Field const* sort = nullptr;     ///< Null: the order of the input.
   std::optional<bool> showAbsent;  ///< Not set: as the form does.
+  bool hasNotes = false;           ///< The notes of the read are shown too.
 
   bool isForMachines() const { return kind != FormKind::Automatic && kind != FormKind::Card; }
+  /// Words that say of each file why it gave no record.
+  bool isExplanation() const { return hasNotes && !isForMachines(); }
 };
 
 }  // namespace app

@@ -3,16 +3,44 @@
 #include <algorithm>
 #include <exception>
 
-#include "output/CardWriter.h"
-#include "output/CsvWriter.h"
-#include "output/JsonWriter.h"
-#include "output/TableWriter.h"
+#include "output/Forms.h"
+#include "photo/Reasons.h"
 
 namespace app {
 
 namespace {
 
 bool isAbsent(Value const& value) { return std::holds_alternative<std::monostate>(value); }
+
+/// Shows each file by a text of its own, with `start` before the first one and `separator` before
+/// the others.
+class TextWriter : public Writer {
+ public:
+  TextWriter(Output& output, TextOf textOf, std::string start, std::string separator)
+      : output_(output),
+        textOf_(std::move(textOf)),
+        start_(std::move(start)),
+        separator_(std::move(separator)) {}
+
+  void prepare(Outcome& outcome) const override {
+    outcome.text = textOf_(outcome);
+    outcome.record.reset();
+    outcome.notes.clear();
+  }
+  void add(Outcome&& outcome) override {
+    if (!outcome.text.empty()) {
+      output_.add(start_ + outcome.text);
+      start_ = separator_;
+    }
+  }
+  void end() override { output_.finish(); }
+
+ private:
+  Output& output_;
+  TextOf textOf_;
+  std::string start_;
+  std::string separator_;
+};
 
 /// Keeps all outcomes and hands them to another writer in the order of a field.
 class SortingWriter : public Writer {
@@ -49,16 +77,23 @@ void SortingWriter::end() {
 }
 
 std::unique_ptr<Writer> makeUnsorted(Form const& form, Output& output) {
+  auto const write = [&output](TextOf textOf, char const* start, char const* separator) {
+    return std::make_unique<TextWriter>(output, std::move(textOf), start, separator);
+  };
   switch (form.kind) {
     case FormKind::Json:
+      output.enclose("[", "\n]\n");
+      return write(jsonObjects(form), "\n", ",\n");
     case FormKind::Jsonl:
-      return std::make_unique<JsonWriter>(form, output);
+      return write([object = jsonObjects(form)](Outcome const& o) { return object(o) + '\n'; }, "",
+                   "");
     case FormKind::Csv:
-      return std::make_unique<CsvWriter>(form, output);
+      output.add(csvHeader(form));
+      return write(csvRows(form), "", "");
     case FormKind::Card:
-      return std::make_unique<CardWriter>(form, output);
+      return write([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
     default:
-      return std::make_unique<TableWriter>(form, output);
+      return form.hasNotes ? write(explanationOf, "", "\n") : makeTable(form, output);
   }
 }
 
@@ -72,7 +107,7 @@ void Writer::prepareSafely(Outcome& outcome) const {
   } catch (std::exception const& error) {
     Outcome failed;
     failed.path = std::move(outcome.path);
-    failed.error = std::string("cannot be shown: ") + error.what();
+    failed.problem = reason::failure(error);
     outcome = std::move(failed);
     prepare(outcome);
   }

@@ -24,7 +24,7 @@ Value present(T value) {
     return value.empty() ? Value() : Value(textAsUtf8(std::move(value)));
   } else if constexpr (std::is_same_v<T, float>) {
     return std::isnan(value) ? Value() : Value(value);
-  } else if constexpr (std::is_same_v<T, std::int32_t>) {
+  } else if constexpr (std::is_same_v<T, std::int32_t> || std::is_same_v<T, std::int64_t>) {
     return value == -1 ? Value() : Value(value);
   } else {
     return value;
@@ -42,7 +42,10 @@ Value captureDate(Outcome const& outcome) {
 
 Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 
-Value error(Outcome const& outcome) { return present(outcome.error); }
+template <auto member>
+Value problem(Outcome const& outcome) {
+  return present(outcome.problem.*member);
+}
 
 Value pathBytes(Outcome const& outcome) {
   if (pathAsUtf8(outcome.path) == outcome.path) {
@@ -64,7 +67,8 @@ std::string said(Value const& value) {
 }
 
 std::string plain(std::string const& text) { return text; }
-std::string number(std::int32_t value) { return std::to_string(value); }
+std::string number(std::int64_t value) { return std::to_string(value); }
+std::string isoSpeed(std::int32_t value) { return number(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
@@ -94,7 +98,7 @@ std::vector<Field> const& allFields() {
       {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, kYesNo},
       {"model", "Camera", valueOf<&M::model>, kText},
       {"lensModel", "Lens", valueOf<&M::lensModel>, kText},
-      {"iso", "ISO", valueOf<&M::iso>, said<std::int32_t, number>},
+      {"iso", "ISO", valueOf<&M::iso>, said<std::int32_t, isoSpeed>},
       {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, kFNumber},
       {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>, kTime},
       {"apertureValue", "Aperture value", valueOf<&M::apertureValue>, kApex},
@@ -110,7 +114,9 @@ std::vector<Field> const& allFields() {
        said<std::int32_t, millimetres>},
       {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, kTime},
       {"fNumber", "F-number", valueOf<&M::fNumber>, kFNumber},
-      {"error", "Error", error, kText},
+      {"error", "Error", problem<&Problem::text>, kText},
+      {"reason", "Reason", problem<&Problem::reason>, kText},
+      {"position", "At byte", problem<&Problem::position>, said<std::int64_t, number>},
       {"pathBytes", "File (hex)", pathBytes, kText},
   };
   return fields;
@@ -128,9 +134,10 @@ Field const* fieldNamed(std::string_view name) {
 Fields recordFields() {
   Fields fields;
   for (auto const& field : allFields()) {
-    if (field.name != "error" && field.name != "pathBytes") {
-      fields.push_back(&field);
+    if (field.name == "error") {
+      break;
     }
+    fields.push_back(&field);
   }
   return fields;
 }

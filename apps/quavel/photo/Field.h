@@ -12,7 +12,7 @@
 namespace app {
 
 /// An exact value; the first alternative is absence. Texts are UTF-8.
-using Value = std::variant<std::monostate, bool, std::int32_t, float, std::string>;
+using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
 /// Something that can be told of a file.
 struct Field {
@@ -24,11 +24,12 @@ struct Field {
 
 using Fields = std::vector<Field const*>;
 
-/// All fields: path, captureDate, the record's members in their order, then error and pathBytes.
+/// All fields: path, captureDate, the record's members in their order, then error, reason,
+/// position and pathBytes.
 std::vector<Field> const& allFields();
 /// Null when there is no such field.
 Field const* fieldNamed(std::string_view name);
-/// The fields of a file that gave a record: all but error and pathBytes.
+/// The fields of a file that gave a record: those up to error.
 Fields recordFields();
 
 /// The field for people: in words, on one line, safe for a terminal and at most 200 cells long

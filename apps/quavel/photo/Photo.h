@@ -1,6 +1,8 @@
 #ifndef QUAVEL_APPS_PHOTO_H
 #define QUAVEL_APPS_PHOTO_H
 
+#include <quavel/QVJournal.h>
+
 #include <string>
 #include <string_view>
 
@@ -8,21 +10,21 @@
 
 namespace app {
 
-/// The extensions that name a format.
-inline constexpr std::string_view kExtensions[] = {"tiff", "tif",  "dng", "nef", "cr2", "raf",
-                                                   "arw",  "jpeg", "jpg", "nrw", "3fr", "cr3"};
-/// All of them, separated by spaces.
-std::string extensionList();
+using Detail = quavel::QVJournal::Detail;
 
 /// What follows the last ".", in lower case; empty when there is no ".".
 std::string extensionOf(std::string_view path);
-bool isPhotoExtension(std::string_view extension);
+/// Whether an extension in lower case names a format.
+bool isPhotoExtension(std::string const& extension);
+/// Why an extension names none; empty when it does.
+std::string whyUnknown(std::string const& extension);
 
 /// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
-Outcome readPhoto(Input input);
+/// The outcome holds notes when all of them are wanted.
+Outcome readPhoto(Input input, Detail detail);
 
 /// Reads one image from standard input, under the path "-".
-Outcome readStandardInput(std::string const& extension);
+Outcome readStandardInput(std::string const& extension, Detail detail);
 
 }  // namespace app
 

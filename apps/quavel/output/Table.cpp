@@ -1,8 +1,9 @@
-#include "output/TableWriter.h"
-
 #include <algorithm>
+#include <atomic>
+#include <chrono>
 
-#include "output/CardWriter.h"
+#include "output/Forms.h"
+#include "output/Layout.h"
 #include "photo/Words.h"
 #include "terminal/Escape.h"
 #include "terminal/Text.h"
@@ -65,14 +66,40 @@ bool isWithin(Widths const& inner, Widths const& outer) {
   return true;
 }
 
-}  // namespace
+class Table : public Writer {
+ public:
+  Table(Form const& form, Output& output);
 
-TableWriter::TableWriter(Form const& form, Output& output)
+  void prepare(Outcome& outcome) const override;
+  void add(Outcome&& outcome) override;
+  void pause() override;
+  void end() override;
+
+ private:
+  std::vector<std::string> cellsOf(Outcome const& outcome) const;
+  void writePage();
+  Widths naturalWidths() const;
+  void useLayout(Widths const& natural);
+
+  Form const& form_;
+  Output& output_;
+  std::vector<Column> columns_;
+  std::vector<std::vector<std::string>> page_;
+  std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
+  std::size_t files_ = 0;
+  std::atomic<bool> isCardLikely_{true};  // no file has come yet: records are kept
+  Outcome first_;
+  std::size_t line_ = 0;
+  Widths natural_;  // of the layout in use
+  Widths widths_;
+};
+
+Table::Table(Form const& form, Output& output)
     : form_(form),
       output_(output),
       columns_(form.fields.empty() ? defaultColumns() : columnsOf(form.fields)) {}
 
-void TableWriter::prepare(Outcome& outcome) const {
+void Table::prepare(Outcome& outcome) const {
   if (outcome.record) {
     outcome.cells = cellsOf(outcome);
     if (!isCardLikely_) {
@@ -81,7 +108,7 @@ void TableWriter::prepare(Outcome& outcome) const {
   }
 }
 
-std::vector<std::string> TableWriter::cellsOf(Outcome const& outcome) const {
+std::vector<std::string> Table::cellsOf(Outcome const& outcome) const {
   if (form_.fields.empty()) {
     return defaultCells(outcome);
   }
@@ -92,7 +119,7 @@ std::vector<std::string> TableWriter::cellsOf(Outcome const& outcome) const {
   return cells;
 }
 
-void TableWriter::add(Outcome&& outcome) {
+void Table::add(Outcome&& outcome) {
   if (++files_ == 1) {
     first_ = outcome;
     isCardLikely_ = false;
@@ -110,13 +137,13 @@ void TableWriter::add(Outcome&& outcome) {
   }
 }
 
-void TableWriter::pause() {
+void Table::pause() {
   if (files_ > 1) {
     writePage();
   }
 }
 
-void TableWriter::end() {
+void Table::end() {
   if (files_ == 1) {
     output_.add(cardOf(form_, first_));
   } else {
@@ -124,7 +151,7 @@ void TableWriter::end() {
   }
 }
 
-void TableWriter::writePage() {
+void Table::writePage() {
   if (page_.empty()) {
     return;
   }
@@ -136,7 +163,7 @@ void TableWriter::writePage() {
   page_.clear();
 }
 
-Widths TableWriter::naturalWidths() const {
+Widths Table::naturalWidths() const {
   Widths natural(columns_.size(), 0);
   for (std::size_t i = 0; i < columns_.size(); ++i) {
     for (auto const& cells : page_) {
@@ -149,7 +176,7 @@ Widths TableWriter::naturalWidths() const {
   return natural;
 }
 
-void TableWriter::useLayout(Widths const& natural) {
+void Table::useLayout(Widths const& natural) {
   std::size_t const line = output_.isTerminal() ? Output::terminalWidth() : kUnlimited;
   if (line == line_ && isWithin(natural, natural_)) {
     return;
@@ -165,6 +192,12 @@ void TableWriter::useLayout(Widths const& natural) {
     labels.push_back(column.label);
   }
   output_.add(lineOf(columns_, widths_, labels));
+}
+
+}  // namespace
+
+std::unique_ptr<Writer> makeTable(Form const& form, Output& output) {
+  return std::make_unique<Table>(form, output);
 }
 
 }  // namespace app

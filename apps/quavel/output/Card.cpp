@@ -1,7 +1,6 @@
-#include "output/CardWriter.h"
-
 #include <algorithm>
 
+#include "output/Forms.h"
 #include "terminal/Escape.h"
 
 namespace app {
@@ -62,20 +61,6 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
     card += "  " + label + (text.empty() ? "-" : text) + "\n";
   }
   return card;
-}
-
-CardWriter::CardWriter(Form const& form, Output& output) : form_(form), output_(output) {}
-
-void CardWriter::prepare(Outcome& outcome) const {
-  outcome.text = cardOf(form_, outcome);
-  outcome.record.reset();
-}
-
-void CardWriter::add(Outcome&& outcome) {
-  if (!outcome.text.empty()) {
-    output_.add((isFirst_ ? "" : "\n") + outcome.text);
-    isFirst_ = false;
-  }
 }
 
 }  // namespace app

@@ -1,4 +1,4 @@
-#include "output/CsvWriter.h"
+#include "output/Forms.h"
 
 namespace app {
 
@@ -7,7 +7,10 @@ namespace {
 struct ToText {
   std::string operator()(std::monostate) const { return {}; }
   std::string operator()(bool value) const { return value ? "true" : "false"; }
-  std::string operator()(std::int32_t value) const { return std::to_string(value); }
+  template <class Integer>
+  std::string operator()(Integer value) const {
+    return std::to_string(value);
+  }
   std::string operator()(float value) const { return exact(value); }
   std::string operator()(std::string const& value) const { return value; }
 };
@@ -23,8 +26,11 @@ std::string quoted(std::string const& text) {
   return result + '"';
 }
 
-Fields everyField() {
-  Fields fields;
+Fields columnsOf(Form const& form) {
+  Fields fields = form.fields;
+  if (!fields.empty()) {
+    return fields;
+  }
   for (auto const& field : allFields()) {
     fields.push_back(&field);
   }
@@ -33,26 +39,24 @@ Fields everyField() {
 
 }  // namespace
 
-CsvWriter::CsvWriter(Form const& form, Output& output)
-    : fields_(form.fields.empty() ? everyField() : form.fields), output_(output) {
+std::string csvHeader(Form const& form) {
   std::string header;
-  for (auto const* field : fields_) {
+  for (auto const* field : columnsOf(form)) {
     header.append(header.empty() ? "" : ",").append(field->name);
   }
-  output_.add(header + "\r\n");
+  return header + "\r\n";
 }
 
-void CsvWriter::prepare(Outcome& outcome) const {
-  std::string row;
-  for (auto const* field : fields_) {
-    row += quoted(std::visit(ToText(), field->value(outcome)));
-    row += ',';
-  }
-  row.back() = '\r';
-  outcome.text = row + '\n';
-  outcome.record.reset();
+TextOf csvRows(Form const& form) {
+  return [fields = columnsOf(form)](Outcome const& outcome) {
+    std::string row;
+    for (auto const* field : fields) {
+      row += quoted(std::visit(ToText(), field->value(outcome)));
+      row += ',';
+    }
+    row.back() = '\r';
+    return row + '\n';
+  };
 }
-
-void CsvWriter::add(Outcome&& outcome) { output_.add(outcome.text); }
 
 }  // namespace app
