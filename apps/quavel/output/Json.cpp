@@ -12,8 +12,7 @@ namespace {
 // Room for a usual record: growing the text step by step would cost more than filling it.
 constexpr std::size_t kUsualObject = 700;
 
-/// Appends a value. Nearly all texts can stand between quotes as they are; the others are left to
-/// the JSON library.
+/// Appends a value. Nearly all texts are ASCII; the others are left to the JSON library.
 struct AppendJson {
   using Handler = nlohmann::json::error_handler_t;
 
@@ -30,9 +29,18 @@ struct AppendJson {
     json.append(isNumber ? "" : "\"").append(exact(value)).append(isNumber ? "" : "\"");
   }
   void operator()(std::string const& value) const {
-    if (std::all_of(value.begin(), value.end(), isPlain)) {
-      json.append(1, '"').append(value).append(1, '"');
-    } else {
+    std::size_t const start = json.size();
+    json += '"';
+    auto begin = value.begin();
+    auto end = std::find_if_not(begin, value.end(), isPlain);
+    while (end != value.end() && (*end == '"' || *end == '\\')) {
+      json.append(begin, end) += '\\';
+      begin = end;
+      end = std::find_if_not(begin + 1, value.end(), isPlain);
+    }
+    json.append(begin, end) += '"';
+    if (end != value.end()) {
+      json.resize(start);
       json += nlohmann::json(value).dump(-1, ' ', false, Handler::replace);
     }
   }

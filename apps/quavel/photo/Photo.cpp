@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <exception>
+#include <set>
 #include <utility>
 
 #include "photo/Reasons.h"
@@ -91,8 +92,17 @@ std::string extensionOf(std::string_view path) {
 }
 
 bool isPhotoExtension(std::string const& extension) {
-  static quavel::QVReader const reader("");
-  return reader.createMetadata(extension) != nullptr;
+  static quavel::QVReader const library("");
+  // The library answers with a record, which costs too much for each name of a large folder.
+  thread_local std::set<std::string> known;
+  if (known.count(extension) != 0) {
+    return true;
+  }
+  bool const isKnown = library.createMetadata(extension) != nullptr;
+  if (isKnown) {
+    known.insert(extension);
+  }
+  return isKnown;
 }
 
 std::string whyUnknown(std::string const& extension) {
