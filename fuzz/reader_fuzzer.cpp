@@ -1,6 +1,7 @@
 // Any bytes as a file of any format: what a record may hold, and that reading leaves no trace.
 
 #include "Fuzzing.h"
+#include "support/JournalLaw.h"
 
 namespace quavel::fuzz {
 namespace {
@@ -50,7 +51,12 @@ int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
     fuzz::checkFields(input, *reader.metadata);
   }
 
-  auto record = reader.createMetadata(input.extension);
+  QVJournal journal;
+  auto record = journal.read(input.bytes.data(), input.bytes.size(), input.extension);
+  fuzz::require(fuzz::isSame(record, reader.metadata), "a journal changes no record");
+  fuzz::require(test::brokenLaw(journal, record.get()).empty(), "the journal keeps its law");
+
+  record = reader.createMetadata(input.extension);
   fuzz::require((record == nullptr) == (input.extension == "txt"), "twelve extensions are known");
   if (!record) {
     fuzz::require(!reader.metadata, "an unknown extension gives no record");

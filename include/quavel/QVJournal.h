@@ -55,11 +55,14 @@ enum class QVReason : std::uint8_t {
 struct QVNote {
   QVNoteKind kind = QVNoteKind::Step;
   QVReason reason = QVReason::None;
-  std::int64_t position =
-      -1;             ///< In bytes from the file's first one; -1: of no place in particular.
-  std::string field;  ///< An absence: the name of the record's member, "fNumber" say; else empty.
-  std::string text;   ///< In English: what the file holds, and where, then the rule. Printable
-                     ///< ASCII, but for a system's own message; no full stop; at most 500 bytes.
+  /// In bytes from the file's first one; -1: of no place in particular.
+  std::int64_t position = -1;
+  /// Of an absence: the name of the record's member, such as "fNumber"; else empty.
+  std::string field;
+  /// What the file holds and where, then the rule, in English: printable ASCII but for a system's
+  /// own message, without a full stop, at most 500 bytes.
+  std::string text;
+  int systemError = 0;  ///< The `errno` of CannotOpen and ReadError; else 0.
 };
 
 /// Reads files like a `QVReader`, giving the same records, and keeps notes of what happened. One

@@ -58,6 +58,15 @@ void noteSize(Directory const& exifIFD, int width, int height) {
   }
 }
 
+/// Notes where the data ends; a segment's length may lead beyond that.
+void noteEnd(Journal* journal, std::int64_t position) {
+  if (journal != nullptr) {
+    std::int64_t const size = journal->dataSize;
+    notePassed(journal, position, "end of the data at {}, where the walk ends",
+               Offset{size < 0 ? position : std::min(position, size)});
+  }
+}
+
 }  // namespace
 
 /// What the segments have shown so far. Positions, in the file, serve notes alone.
@@ -99,8 +108,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
     std::int64_t const segmentStart = notedPosition(journal, *stream);
     if (!stream->readShort(&marker)) {
-      notePassed(journal, segmentStart, "end of the data at {}, where the walk ends",
-                 Offset{segmentStart});
+      noteEnd(journal, segmentStart);
       break;
     }
     if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, segmentStart, walk)) {

@@ -56,7 +56,8 @@ bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> 
   }
   if (thumbnailWidth != kThumbnailWidth || thumbnailHeight != kThumbnailHeight) {
     return refuse(journalOf(ifd), QVReason::WrongImage, positionOf(ifd), "{} declares {} x {}; {}",
-                  NamedDirectory{ifd}, thumbnailWidth, thumbnailHeight, kThumbnailRule);
+                  NamedDirectory{ifd}, static_cast<std::uint32_t>(thumbnailWidth),
+                  static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRule);
   }
   return storeNumber(ifd, tag::Orientation, orientation);
 }

@@ -200,7 +200,7 @@ bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::in
     return refuse(journalOf(directory), QVReason::WrongImage, positionOf(directory),
                   "{} declares a reduced image (NewSubfileType {}); the raw image of full size is "
                   "wanted there",
-                  NamedDirectory{directory}, newSubfileType);
+                  NamedDirectory{directory}, static_cast<std::uint32_t>(newSubfileType));
   }
   char const* const rule = "the raw image's size is wanted there";
   return storeRequiredNumber(directory, tag::ImageWidth, rule, width) &&

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <string_view>
 
 #include "front/Formats.h"
 #include "journal/Journal.h"
@@ -13,8 +12,6 @@
 namespace quavel::detail {
 
 namespace {
-
-using namespace std::string_view_literals;
 
 constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
@@ -29,44 +26,44 @@ bool isAbsentIn(QVMetadata const& record) {
 
 /// A field that can be absent.
 struct FieldRow {
-  char const* name;
+  char name[22];
+  char origin[18];    ///< The field that it is computed from, if any.
   unsigned families;  ///< The readers that fill it.
   bool (*isAbsent)(QVMetadata const& record);
-  char const* origin = nullptr;  ///< The field that it is computed from, if any.
 };
 
 using M = QVMetadata;
 constexpr FieldRow kFields[] = {
-    {"width", kAll, isAbsentIn<&M::width>},
-    {"height", kAll, isAbsentIn<&M::height>},
-    {"orientation", kAll, isAbsentIn<&M::orientation>},
-    {"dateTimeOriginal", kAll & ~unsigned{kCr3}, isAbsentIn<&M::dateTimeOriginal>},
-    {"dateTimeDigitized", kTiff, isAbsentIn<&M::dateTimeDigitized>},
-    {"dateTime", kTiff | kCr3, isAbsentIn<&M::dateTime>},
-    {"model", kCr3, isAbsentIn<&M::model>},
-    {"lensModel", kCr3, isAbsentIn<&M::lensModel>},
-    {"iso", kCr3, isAbsentIn<&M::iso>},
-    {"apexFNumber", kCr3, isAbsentIn<&M::apexFNumber>, "apertureValue"},
-    {"apexExposureTime", kCr3, isAbsentIn<&M::apexExposureTime>, "shutterSpeedValue"},
-    {"apertureValue", kCr3, isAbsentIn<&M::apertureValue>},
-    {"shutterSpeedValue", kCr3, isAbsentIn<&M::shutterSpeedValue>},
-    {"focalLength", kCr3, isAbsentIn<&M::focalLength>},
-    {"whiteBalance", kCr3, isAbsentIn<&M::whiteBalance>},
-    {"meteringMode", kCr3, isAbsentIn<&M::meteringMode>},
-    {"exposureBiasValue", kCr3, isAbsentIn<&M::exposureBiasValue>},
-    {"focalLengthIn35mmFilm", kCr3, isAbsentIn<&M::focalLengthIn35mmFilm>},
-    {"exposureTime", kCr3, isAbsentIn<&M::exposureTime>},
-    {"fNumber", kCr3, isAbsentIn<&M::fNumber>},
+    {"width", "", kAll, isAbsentIn<&M::width>},
+    {"height", "", kAll, isAbsentIn<&M::height>},
+    {"orientation", "", kAll, isAbsentIn<&M::orientation>},
+    {"dateTimeOriginal", "", kAll & ~unsigned{kCr3}, isAbsentIn<&M::dateTimeOriginal>},
+    {"dateTimeDigitized", "", kTiff, isAbsentIn<&M::dateTimeDigitized>},
+    {"dateTime", "", kTiff | kCr3, isAbsentIn<&M::dateTime>},
+    {"model", "", kCr3, isAbsentIn<&M::model>},
+    {"lensModel", "", kCr3, isAbsentIn<&M::lensModel>},
+    {"iso", "", kCr3, isAbsentIn<&M::iso>},
+    {"apexFNumber", "apertureValue", kCr3, isAbsentIn<&M::apexFNumber>},
+    {"apexExposureTime", "shutterSpeedValue", kCr3, isAbsentIn<&M::apexExposureTime>},
+    {"apertureValue", "", kCr3, isAbsentIn<&M::apertureValue>},
+    {"shutterSpeedValue", "", kCr3, isAbsentIn<&M::shutterSpeedValue>},
+    {"focalLength", "", kCr3, isAbsentIn<&M::focalLength>},
+    {"whiteBalance", "", kCr3, isAbsentIn<&M::whiteBalance>},
+    {"meteringMode", "", kCr3, isAbsentIn<&M::meteringMode>},
+    {"exposureBiasValue", "", kCr3, isAbsentIn<&M::exposureBiasValue>},
+    {"focalLengthIn35mmFilm", "", kCr3, isAbsentIn<&M::focalLengthIn35mmFilm>},
+    {"exposureTime", "", kCr3, isAbsentIn<&M::exposureTime>},
+    {"fNumber", "", kCr3, isAbsentIn<&M::fNumber>},
 };
 
 QVNote absence(FieldRow const& row, Format const& format, Journal const& journal) {
-  QVNote note = {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, ""};
+  QVNote note = {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, "", 0};
   if ((row.families & format.family) == 0) {
     note.text = row.families == kCr3 ? "only CR3 files give it"
                                      : composed("never taken from {} files", {format.kind});
     return note;
   }
-  auto const* const known = journal.absenceOf(row.origin == nullptr ? row.name : row.origin);
+  auto const* const known = journal.absenceOf(row.origin[0] == '\0' ? row.name : row.origin);
   if (known != nullptr) {
     note = *known;
     note.field = row.name;
@@ -80,31 +77,37 @@ constexpr std::size_t kBrandPosition = 8;
 constexpr std::size_t kBrandSize = 4;
 
 struct Signature {
-  std::size_t position;
-  std::string_view bytes;
-  char const* kind;
+  std::uint8_t position;
+  std::uint8_t size;
+  char bytes[9];
+  char kind[36];
   unsigned families;  ///< The readers of such files.
+
+  bool matches(std::uint8_t const* opening, std::size_t length) const {
+    return length >= std::size_t{position} + size &&
+           std::memcmp(opening + position, bytes, size) == 0;
+  }
 };
 
 constexpr unsigned kTiffFamilies = kTiff | kNef | kArw;
 
 constexpr Signature kSignatures[] = {
-    {0, "II*\0"sv, "a TIFF structure", kTiffFamilies},
-    {0, "MM\0*"sv, "a TIFF structure", kTiffFamilies},
-    {0, "II+\0"sv, "a BigTIFF structure", kTiffFamilies},
-    {0, "MM\0+"sv, "a BigTIFF structure", kTiffFamilies},
-    {0, "\xff\xd8\xff"sv, "a JPEG file", kJpeg},
-    {0, "FUJIFILM"sv, "a RAF file", kRaf},
-    {4, "ftyp"sv, "an ISO base media file", kCr3},
-    {0, "\x89PNG"sv, "a PNG file", 0},
-    {0, "GIF8"sv, "a GIF file", 0},
-    {0, "RIFF"sv, "a RIFF file (WebP, for example)", 0},
-    {0, "BM"sv, "a BMP file", 0},
-    {0, "%PDF"sv, "a PDF file", 0},
-    {0, "8BPS"sv, "a PSD file", 0},
-    {0, "PK\3\4"sv, "a ZIP archive", 0},
-    {0, "<"sv, "markup text (HTML or XML)", 0},
-    {0, "\0\0\0\0\0\0\0\0"sv, "a file that was emptied with zeros", 0},
+    {0, 4, "II*\0", "a TIFF structure", kTiffFamilies},
+    {0, 4, "MM\0*", "a TIFF structure", kTiffFamilies},
+    {0, 4, "II+\0", "a BigTIFF structure", kTiffFamilies},
+    {0, 4, "MM\0+", "a BigTIFF structure", kTiffFamilies},
+    {0, 3, "\xff\xd8\xff", "a JPEG file", kJpeg},
+    {0, 8, "FUJIFILM", "a RAF file", kRaf},
+    {4, 4, "ftyp", "an ISO base media file", kCr3},
+    {0, 4, "\x89PNG", "a PNG file", 0},
+    {0, 4, "GIF8", "a GIF file", 0},
+    {0, 4, "RIFF", "a RIFF file (WebP, for example)", 0},
+    {0, 2, "BM", "a BMP file", 0},
+    {0, 4, "%PDF", "a PDF file", 0},
+    {0, 4, "8BPS", "a PSD file", 0},
+    {0, 4, "PK\3\4", "a ZIP archive", 0},
+    {0, 1, "<", "markup text (HTML or XML)", 0},
+    {0, 8, "\0\0\0\0\0\0\0\0", "a file that was emptied with zeros", 0},
 };
 
 void noteOtherContent(Format const& format, QVStream& stream, Journal& journal) {
@@ -113,15 +116,14 @@ void noteOtherContent(Format const& format, QVStream& stream, Journal& journal) 
   std::array<std::uint8_t, kOpeningSize> opening;
   std::size_t const size = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
-    if (size < row.position + row.bytes.size() ||
-        std::memcmp(opening.data() + row.position, row.bytes.data(), row.bytes.size()) != 0) {
+    if (!row.matches(opening.data(), size)) {
       continue;
     }
     if ((row.families & format.family) == 0) {
       bool const hasBrand = row.position != 0 && size >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       std::string const kind =
-          hasBrand ? composed("{} of brand \"{}\"", {row.kind, brand}) : row.kind;
+          hasBrand ? composed("{} of brand \"{}\"", {&row.kind[0], brand}) : row.kind;
       noteHint(&journal, QVReason::OtherContent, 0,
                "The file looks like {}; its extension has it read as {}", kind, format.kind);
     }

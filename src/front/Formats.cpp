@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <new>
 #include <system_error>
 #include <utility>
 
@@ -27,9 +28,34 @@ namespace quavel::detail {
 
 namespace {
 
+/// Room for an image of any class: as none adds members to the record, one kind of room serves all,
+/// which keeps ten kinds of shared owner out of the library.
+class ImageRoom {
+ public:
+  ImageRoom() {}  // leaves the bytes as they are
+  ~ImageRoom() {
+    if (image_ != nullptr) {
+      image_->~QVMetadata();
+    }
+  }
+  ImageRoom(ImageRoom const&) = delete;
+  ImageRoom& operator=(ImageRoom const&) = delete;
+
+  template <class Image>
+  QVMetadata* make() {
+    static_assert(sizeof(Image) == sizeof(QVMetadata));
+    return image_ = new (bytes_) Image;
+  }
+
+ private:
+  QVMetadata* image_ = nullptr;
+  alignas(QVMetadata) unsigned char bytes_[sizeof(QVMetadata)];
+};
+
 template <class Image>
 std::shared_ptr<QVMetadata> make() {
-  return std::make_shared<Image>();
+  auto const room = std::make_shared<ImageRoom>();
+  return {room, room->make<Image>()};
 }
 
 constexpr Format kFormats[] = {
@@ -59,10 +85,10 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
 
 /// Learns what notes tell of an open file; or why it is not open.
 bool examine(QVFStream const& file, Journal& journal) {
-  int const error = errno;
   if (file.fd == -1) {
+    journal.systemError = errno;
     return refuse(&journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
-                  std::generic_category().message(error));
+                  std::generic_category().message(journal.systemError));
   }
   struct stat status = {};
   if (::fstat(file.fd, &status) == 0 && S_ISREG(status.st_mode)) {

@@ -1,7 +1,7 @@
 #include "quavel/QVJournal.h"
 
 #include <algorithm>
-#include <array>
+#include <iterator>
 #include <utility>
 
 #include "front/Formats.h"
@@ -13,7 +13,7 @@ namespace quavel {
 namespace {
 
 // In the order of the enumerators.
-constexpr std::array<char const*, 21> kReasonNames = {
+constexpr char kReasonNames[][18] = {
     "none",        "unknown-extension", "cannot-open",     "read-error",    "empty",
     "cut-short",   "other-kind",        "malformed-entry", "malformed-box", "missing-part",
     "wrong-image", "too-many-values",   "too-much-work",   "not-in-file",   "not-in-format",
@@ -24,7 +24,7 @@ constexpr std::array<char const*, 21> kReasonNames = {
 
 char const* QVJournal::reasonName(QVReason reason) {
   auto const index = static_cast<std::size_t>(reason);
-  return index < kReasonNames.size() ? kReasonNames[index] : "";
+  return index < std::size(kReasonNames) ? kReasonNames[index] : "";
 }
 
 QVJournal::QVJournal(Detail detail) : detail_(detail) {}

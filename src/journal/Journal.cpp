@@ -19,7 +19,7 @@ bool isLimit(QVReason reason) {
 }  // namespace
 
 void Journal::add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text) {
-  notes.push_back({kind, reason, position, "", std::move(text)});
+  notes.push_back({kind, reason, position, "", std::move(text), 0});
 }
 
 void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern, Words words) {
@@ -29,6 +29,7 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
   isRefused_ = true;
   QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
   add(kind, reason, position, composed(pattern, words));
+  notes.back().systemError = systemError;
 }
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
@@ -43,12 +44,12 @@ void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* p
 }
 
 QVReason Journal::cutReason() const {
-  return readError != 0 ? QVReason::ReadError : QVReason::CutShort;
+  return systemError != 0 ? QVReason::ReadError : QVReason::CutShort;
 }
 
 std::string Journal::cutText(std::int64_t end) const {
-  if (readError != 0) {
-    return "reading fails: " + std::generic_category().message(readError);
+  if (systemError != 0) {
+    return "reading fails: " + std::generic_category().message(systemError);
   }
   if (dataSize < 0) {
     return "the data ends before that";
@@ -77,7 +78,7 @@ void Journal::absent(char const* field, QVReason reason, char const* pattern, Wo
   auto found = std::find_if(absences_.begin(), absences_.end(),
                             [field](QVNote const& note) { return note.field == field; });
   if (found == absences_.end()) {
-    found = absences_.insert(found, {QVNoteKind::Absence, reason, -1, field, ""});
+    found = absences_.insert(found, {QVNoteKind::Absence, reason, -1, field, "", 0});
   }
   found->reason = reason;
   found->text = composed(pattern, words);

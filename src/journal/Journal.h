@@ -44,7 +44,7 @@ class Journal {
   std::vector<QVNote> notes;
   std::uint64_t furtherSteps = 0;
   std::int64_t dataSize = -1;  ///< In bytes; -1: not known.
-  int readError = 0;           ///< The `errno` of a read that failed; 0: none did.
+  int systemError = 0;         ///< The `errno` of what failed; 0: nothing did.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);

@@ -6,7 +6,7 @@ namespace quavel::detail {
 
 void noteReadError(QVStream const& stream, int error) {
   if (Journal* const journal = journalOf(stream)) {
-    journal->readError = error;
+    journal->systemError = error;
   }
 }
 

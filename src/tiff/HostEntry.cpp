@@ -5,6 +5,7 @@
 
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "tiff/EntryTable.h"
+#include "tiff/ReaderDirectory.h"
 
 namespace quavel::detail {
 
@@ -55,6 +56,13 @@ std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
     map->emplace_hint(map->end(), row.tag, std::move(entry));
   }
   return map;
+}
+
+Directory ReaderDirectory::forHost() {
+  auto directory = std::make_shared<QVTiffImageFileDirectory>();
+  directory->nextIFDOffset = nextIFDOffset;
+  directory->entries = table.takeEntries();
+  return directory;
 }
 
 }  // namespace quavel::detail

@@ -4,13 +4,6 @@
 
 namespace quavel::detail {
 
-Directory ReaderDirectory::forHost() {
-  auto directory = std::make_shared<QVTiffImageFileDirectory>();
-  directory->nextIFDOffset = nextIFDOffset;
-  directory->entries = table.takeEntries();
-  return directory;
-}
-
 Entry findEntry(Directory const& directory, unsigned short tag) {
   if (auto const* const own = ReaderDirectory::of(*directory)) {
     return own->table.entry(tag);

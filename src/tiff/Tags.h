@@ -37,8 +37,9 @@ inline constexpr unsigned short RafImageLength = 0xf002;
 /// A tag's name, and the record's field that an entry under it gives, if any.
 struct Name {
   unsigned short tag;
-  char const* name;
-  char const* field = nullptr;
+  char name[26];
+  char field[22] =
+      "";  // texts in place: pointers would be relocated whenever the library is loaded
 };
 
 inline constexpr Name kNames[] = {

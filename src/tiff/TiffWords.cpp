@@ -1,6 +1,6 @@
 #include "tiff/TiffWords.h"
 
-#include <array>
+#include <iterator>
 
 #include "tiff/Tags.h"
 
@@ -8,9 +8,9 @@ namespace quavel::detail {
 
 namespace {
 
-constexpr std::array<char const*, 14> kTypeNames = {
-    nullptr,     "BYTE",   "ASCII", "SHORT",     "LONG",  "RATIONAL", "SBYTE",
-    "UNDEFINED", "SSHORT", "SLONG", "SRATIONAL", "FLOAT", "DOUBLE",   "IFD"};
+constexpr char kTypeNames[][10] = {"",          "BYTE",  "ASCII",     "SHORT",  "LONG",
+                                   "RATIONAL",  "SBYTE", "UNDEFINED", "SSHORT", "SLONG",
+                                   "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
 
 tag::Name const* nameOf(unsigned short tag) {
   for (auto const& row : tag::kNames) {
@@ -49,7 +49,7 @@ void append(std::string& out, DirectoryName const& directory) {
 }
 
 void appendType(std::string& out, std::uint16_t typeCode) {
-  if (typeCode == 0 || typeCode >= kTypeNames.size()) {
+  if (typeCode == 0 || typeCode >= std::size(kTypeNames)) {
     out.append("type ").append(std::to_string(typeCode));
   } else {
     out += kTypeNames[typeCode];
@@ -58,7 +58,7 @@ void appendType(std::string& out, std::uint16_t typeCode) {
 
 char const* fieldOf(unsigned short tag) {
   auto const* const row = nameOf(tag);
-  return row == nullptr ? nullptr : row->field;
+  return row == nullptr || row->field[0] == '\0' ? nullptr : row->field;
 }
 
 }  // namespace quavel::detail
