@@ -48,7 +48,7 @@ Value problem(Outcome const& outcome) {
 }
 
 Value pathBytes(Outcome const& outcome) {
-  if (pathAsUtf8(outcome.path) == outcome.path) {
+  if (isUtf8(outcome.path) && outcome.path.find('\0') == std::string::npos) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";

@@ -69,11 +69,9 @@ void fill(Outcome& outcome, Detail detail, Read read) {
     return;
   }
   QVJournal journal(detail);
-  errno = 0;
   outcome.record = read(journal);
-  int const error = errno;
   if (auto const* const refusal = journal.refusal()) {
-    outcome.problem = reason::refusal(*refusal, error);
+    outcome.problem = reason::refusal(*refusal);
   }
   if (detail == Detail::All) {
     outcome.notes = journal.notes();

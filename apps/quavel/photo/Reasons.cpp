@@ -75,15 +75,10 @@ Problem failure(std::exception const& error) {
   return {kUnexpected, std::string("unexpected: ") + error.what()};
 }
 
-Problem refusal(quavel::QVNote const& note, int error) {
-  Problem problem = {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text,
-                     note.position};
-  if (note.reason == QVReason::Empty) {
-    problem.text += "; copy it anew from its source";
-  } else if (note.reason == QVReason::CannotOpen || note.reason == QVReason::ReadError) {
-    problem.text += advice(error);
-  }
-  return problem;
+Problem refusal(quavel::QVNote const& note) {
+  char const* const end =
+      note.reason == QVReason::Empty ? "; copy it anew from its source" : advice(note.systemError);
+  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + end, note.position};
 }
 
 }  // namespace app::reason

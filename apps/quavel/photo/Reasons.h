@@ -28,8 +28,8 @@ Problem cannotOpen(int error);
 Problem cannotRead(int error);
 /// What was thrown on the way.
 Problem failure(std::exception const& error);
-/// The library's refusal. `error`: what system calls left in errno.
-Problem refusal(quavel::QVNote const& note, int error);
+/// The library's refusal.
+Problem refusal(quavel::QVNote const& note);
 
 }  // namespace app::reason
 

@@ -96,6 +96,9 @@ bool isAscii(std::string_view text) {
 }
 
 bool isUtf8(std::string_view text) {
+  if (isAscii(text)) {
+    return true;
+  }
   while (!text.empty()) {
     Character const next = firstCharacter(text);
     if (!next.isValid) {
@@ -107,7 +110,7 @@ bool isUtf8(std::string_view text) {
 }
 
 std::string textAsUtf8(std::string text) {
-  if (isAscii(text) || isUtf8(text)) {
+  if (isUtf8(text)) {
     return text;
   }
   std::string utf8;
@@ -124,7 +127,7 @@ std::string textAsUtf8(std::string text) {
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isAscii(path) && path.find('\0') == std::string::npos) {
+  if (isUtf8(path) && path.find('\0') == std::string::npos) {
     return path;
   }
   std::string utf8;
