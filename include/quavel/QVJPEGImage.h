@@ -41,10 +41,9 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  private:
   struct Walk;
 
-  bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker, std::int64_t start,
-                   Walk& walk);
-  bool readAPP1(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk);
-  static bool readSOF0(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk);
+  bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker, Walk& walk);
+  bool readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk);
+  static bool readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk);
   void reconcileSizeWith(Walk const& walk);
   static void noteWhatIsMissing(detail::Journal* journal, Walk const& walk);
 };

@@ -19,8 +19,8 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                         exifIFD)) {
+  if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                   exifIFD)) {
     return false;
   }
   if (!exifIFD) {
@@ -29,10 +29,6 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
                TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
     return true;
   }
-  if (!storeInfoFromExifIFD(exifIFD)) {
-    return false;
-  }
-
   Directory rawIFD;
   if (!readSubIFD(stream, mainIFD, 0, {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength},
                   rawIFD)) {

@@ -13,30 +13,22 @@ namespace {
 /// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
 /// untouched. Not a single value: false.
 bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const entry = findEntry(directory, tag);
-  if (!entry) {
-    noteNoEntry(directory, tag);
-    return true;
-  }
-  auto const* const value = singleValue(entry);
-  if (value == nullptr) {
-    return refuseContent(directory, tag, "exactly one wanted");
-  }
-  field = value->shortValue();
-  return true;
+  ValuePointer value = nullptr;
+  bool const isRead = findNumber(directory, tag, value);
+  field = value == nullptr ? field : value->shortValue();
+  return isRead;
 }
 
 /// Stores the tag's fraction. Absent: true, the field untouched. Not a single value, or of
 /// another type: false.
 bool storeFraction(Directory const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
-  auto const entry = findEntry(directory, tag);
-  if (!entry) {
-    noteNoEntry(directory, tag);
-    return true;
+  ValuePointer value = nullptr;
+  bool const isRead = findNumber(directory, tag, value);
+  if (value == nullptr) {
+    return isRead;
   }
-  auto const* const value = singleValue(entry);
-  if (value == nullptr || value->type != type) {
+  if (value->type != type) {
     return refuseContent(
         directory, tag,
         type == EntryValueType::RATIONAL ? "1 RATIONAL value wanted" : "1 SRATIONAL value wanted");
@@ -80,26 +72,22 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
 // seconds.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  if (!findEntry(ifd, tag::ApertureValue)) {
-    noteNoEntry(ifd, tag::ApertureValue);
-    return true;
-  }
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {
     return false;
   }
-  apexFNumber = ::exp2f(apertureValue * 0.5F);
+  if (findEntry(ifd, tag::ApertureValue)) {
+    apexFNumber = ::exp2f(apertureValue * 0.5F);
+  }
   return true;
 }
 
 bool QVCR3CMT2Box::storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  if (!findEntry(ifd, tag::ShutterSpeedValue)) {
-    noteNoEntry(ifd, tag::ShutterSpeedValue);
-    return true;
-  }
   if (!storeFraction(ifd, tag::ShutterSpeedValue, EntryValueType::SRATIONAL, shutterSpeedValue)) {
     return false;
   }
-  apexExposureTime = 1.0F / ::exp2f(shutterSpeedValue);
+  if (findEntry(ifd, tag::ShutterSpeedValue)) {
+    apexExposureTime = 1.0F / ::exp2f(shutterSpeedValue);
+  }
   return true;
 }
 

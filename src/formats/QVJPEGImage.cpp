@@ -4,6 +4,7 @@
 #include <array>
 #include <utility>
 
+#include "formats/JpegWalk.h"
 #include "formats/Steps.h"
 #include "quavel/QVStream.h"
 #include "tiff/Tags.h"
@@ -46,40 +47,7 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd9, 2},  // EOI
 }};
 
-/// Notes why an Exif size does not count, if it does not.
-void noteSize(Directory const& exifIFD, int width, int height) {
-  if (width < 0 || height < 0) {
-    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
-               "{} does not give both sides", NamedDirectory{exifIFD});
-  } else {
-    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
-               "{} declares {} x {}; only more than 500 a side counts", NamedDirectory{exifIFD},
-               width, height);
-  }
-}
-
-/// Notes where the data ends; a segment's length may lead beyond that.
-void noteEnd(Journal* journal, std::int64_t position) {
-  if (journal != nullptr) {
-    std::int64_t const size = journal->dataSize;
-    notePassed(journal, position, "end of the data at {}, where the walk ends",
-               Offset{size < 0 ? position : std::min(position, size)});
-  }
-}
-
 }  // namespace
-
-/// What the segments have shown so far. Positions, in the file, serve notes alone.
-struct QVJPEGImage::Walk {
-  bool sawAPP1 = false;  ///< Of any content, Exif or not.
-  bool sawSOF0 = false;
-  bool sawExif = false;
-  unsigned short frameWidth = 0;
-  unsigned short frameHeight = 0;
-  std::int64_t frame = -1;
-  std::int64_t otherFrame = -1;  ///< A progressive one.
-  std::int64_t scan = -1;        ///< Where picture data begins.
-};
 
 std::map<std::uint16_t, std::uint16_t> const QVJPEGImage::markerSkipLengths(kFixedSkips.begin(),
                                                                             kFixedSkips.end());
@@ -95,10 +63,8 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
     return refuseCut(journal, start, sizeof(marker), "the marker SOI");
   }
   if (marker != kSOI) {
-    std::uint8_t const bytes[] = {static_cast<std::uint8_t>(marker >> 8U),
-                                  static_cast<std::uint8_t>(marker)};
     return refuse(journal, QVReason::OtherKind, start,
-                  "the file begins with {}, not with ff d8 (SOI)", HexBytes{bytes, sizeof(bytes)});
+                  "the file begins with {}, not with ff d8 (SOI)", HexPair{marker});
   }
 
   // An ordinary file ends the walk at its frame header. One without a baseline frame or an APP1
@@ -106,12 +72,12 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   Walk walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
-    std::int64_t const segmentStart = notedPosition(journal, *stream);
+    walk.start = notedPosition(journal, *stream);
     if (!stream->readShort(&marker)) {
-      noteEnd(journal, segmentStart);
+      noteEnd(journal, walk.start);
       break;
     }
-    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, segmentStart, walk)) {
+    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk)) {
       return false;
     }
   }
@@ -124,7 +90,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
-                              std::int64_t start, Walk& walk) {
+                              Walk& walk) {
   for (auto const& [skippedMarker, skip] : kFixedSkips) {
     if (marker == skippedMarker) {
       stream->setOffset(stream->getOffset() + skip);
@@ -134,45 +100,45 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
 
   unsigned short length = 0;
   if (!stream->readShort(&length)) {
-    return refuseCut(journalOf(*stream), start + kMarkerSize, sizeof(length),
-                     "the length of the segment {} at {}", HexCode{marker}, Offset{start});
+    return refuseCut(journalOf(*stream), walk.start + kMarkerSize, sizeof(length),
+                     "the length of the segment {} at {}", HexCode{marker}, Offset{walk.start});
   }
   long const segmentEnd = stream->getOffset() + length - kLengthSize;
-  if (marker == kAPP1 && !readAPP1(stream, start, walk)) {
+  if (marker == kAPP1 && !readAPP1(stream, walk)) {
     return false;
   }
-  if (marker == kSOF0 && !readSOF0(stream, start, walk)) {
+  if (marker == kSOF0 && !readSOF0(stream, walk)) {
     return false;
   }
   if (marker == kSOS && walk.scan < 0) {
-    walk.scan = start;
+    walk.scan = walk.start;
   }
   // After the start of the scan, the same two bytes are picture data.
   if (marker == kSOF2 && walk.scan < 0) {
-    walk.otherFrame = start;
+    walk.otherFrame = walk.start;
   }
   stream->setOffset(segmentEnd);
   return true;
 }
 
-bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk) {
+bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
   Journal* const journal = journalOf(*stream);
   std::int64_t const baseOffset = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
   if (stream->readBuffer(identifier.data(), identifier.size()) !=
       static_cast<std::int64_t>(identifier.size())) {
-    return refuseCut(journal, start + kPayloadPosition, identifier.size(),
-                     "the identifier of the APP1 segment at {}", Offset{start});
+    return refuseCut(journal, walk.start + kPayloadPosition, identifier.size(),
+                     "the identifier of the APP1 segment at {}", Offset{walk.start});
   }
   bool const isExif = identifier == kExifIdentifier;
-  notePassed(journal, start, "the APP1 segment at {}: {}", Offset{start},
+  notePassed(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
              isExif ? "Exif" : "not Exif");
   if (isExif) {
     unsigned short padding = 0;
     if (!stream->readShort(&padding)) {
-      return refuseCut(journal, start + kPayloadPosition + std::int64_t{identifier.size()},
+      return refuseCut(journal, walk.start + kPayloadPosition + std::int64_t{identifier.size()},
                        sizeof(padding), "the Exif identifier of the APP1 segment at {}",
-                       Offset{start});
+                       Offset{walk.start});
     }
     if (!readExifSegment(stream)) {
       return false;
@@ -184,20 +150,20 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, std::int64_t start
   return true;
 }
 
-bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, std::int64_t start, Walk& walk) {
+bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk) {
   unsigned char precision = 0;
   unsigned short height = 0;
   unsigned short width = 0;
   if (!stream->readByte(&precision) || !stream->readShort(&height) || !stream->readShort(&width)) {
-    return refuseCut(journalOf(*stream), start + kPayloadPosition,
+    return refuseCut(journalOf(*stream), walk.start + kPayloadPosition,
                      sizeof(precision) + sizeof(height) + sizeof(width), "the SOF0 segment at {}",
-                     Offset{start});
+                     Offset{walk.start});
   }
-  notePassed(journalOf(*stream), start, "the SOF0 segment at {} declares {} x {}", Offset{start},
-             int{width}, int{height});
+  notePassed(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
+             Offset{walk.start}, width, height);
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
-  walk.frame = start;
+  walk.frame = walk.start;
   walk.sawSOF0 = true;
   return true;
 }
@@ -218,36 +184,6 @@ void QVJPEGImage::reconcileSizeWith(Walk const& walk) {
   }
 }
 
-void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
-  QVNote const* const exif = journal->absenceOf("width");
-  std::string const exifText = exif == nullptr ? "no Exif IFD gives a size" : exif->text;
-  if (walk.sawSOF0) {
-    noteAbsent(journal, {"width", "height"}, QVReason::NotInFile,
-               "the SOF0 segment at {} declares {} x {}; {}", Offset{walk.frame},
-               int{walk.frameWidth}, int{walk.frameHeight}, exifText);
-  } else {
-    noteAbsent(journal, {"width", "height"}, QVReason::NotInFile,
-               "no baseline frame (SOF0) was met; {}", exifText);
-  }
-  if (!walk.sawExif) {
-    noteAbsent(journal, {"orientation", "dateTimeOriginal"}, QVReason::NotInFile,
-               walk.sawSOF0 && walk.sawAPP1
-                   ? "no Exif segment among those up to SOF0 and an APP1, where the walk ends"
-                   : "no Exif segment (APP1) was met");
-  }
-  if (walk.otherFrame >= 0) {
-    noteHint(journal, QVReason::NotBaseline, walk.otherFrame,
-             "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
-             Offset{walk.otherFrame});
-  }
-  if (walk.scan >= 0) {
-    noteHint(journal, QVReason::PictureData, walk.scan,
-             "Before the scan at {} no {} was met; the walk goes on through picture data, taken as "
-             "segments",
-             Offset{walk.scan}, walk.sawAPP1 ? "SOF0" : "APP1");
-  }
-}
-
 bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   stream->baseOffset += stream->getOffset();
@@ -259,13 +195,10 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(stream, mainIFD,
-                         {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
-                          tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
-                         exifIFD)) {
-    return false;
-  }
-  return !exifIFD || storeInfoFromExifIFD(exifIFD);
+  return readExifIFD(*this, stream, mainIFD,
+                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
+                      tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
+                     exifIFD);
 }
 
 bool QVJPEGImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

@@ -29,16 +29,12 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                         exifIFD)) {
-    return false;
-  }
-  // Without it, the raw image's directory is looked for all the same.
-  if (exifIFD && !storeInfoFromExifIFD(exifIFD)) {
+  if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                   exifIFD)) {
     return false;
   }
 
-  // The first SubIFD is a preview's, the second the raw image's.
+  // The first SubIFD is a preview's, the second the raw image's, with or without an Exif directory.
   Directory rawIFD;
   if (!readSubIFD(stream, mainIFD, 1, {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType},
                   rawIFD)) {

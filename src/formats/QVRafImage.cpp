@@ -105,11 +105,8 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                         exifIFD)) {
-    return false;
-  }
-  return !exifIFD || storeInfoFromExifIFD(exifIFD);
+  return readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                     exifIFD);
 }
 
 bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {

@@ -10,15 +10,6 @@ using namespace detail;
 
 namespace {
 
-/// The entry that says whether a directory's image is a reduced one. Absent: true, `type` is null.
-/// Not a single value: false.
-bool findNewSubfileType(Directory const& directory, ValuePointer& type) {
-  auto const entry = findEntry(directory, tag::NewSubfileType);
-  type = singleValue(entry);
-  return !entry || type != nullptr ||
-         refuseContent(directory, tag::NewSubfileType, "exactly one wanted");
-}
-
 /// The first of the SubIFDs that says it is not a reduced image; null on failure and when none
 /// does.
 Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
@@ -30,7 +21,7 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const
         readDirectoryAt(stream, {"SubIFD", nullptr, i + 1, count}, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     ValuePointer type = nullptr;
-    if (!subIFD || !findNewSubfileType(subIFD, type)) {
+    if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {
       return nullptr;
     }
     if (type != nullptr && !isReducedImage(type)) {
@@ -54,7 +45,7 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const
 /// The directory of the full-size image; null on failure and when there is none.
 Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
   ValuePointer type = nullptr;
-  if (!findNewSubfileType(mainIFD, type)) {
+  if (!findNumber(mainIFD, tag::NewSubfileType, type)) {
     return nullptr;
   }
   bool const isReduced = type != nullptr && isReducedImage(type);
@@ -79,12 +70,9 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   Directory exifIFD;
-  if (!followExifPointer(stream, mainIFD,
-                         {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
-                         exifIFD)) {
-    return false;
-  }
-  return !exifIFD || storeInfoFromExifIFD(exifIFD);
+  return readExifIFD(*this, stream, mainIFD,
+                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
+                     exifIFD);
 }
 
 bool QVTiffImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

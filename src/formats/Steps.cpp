@@ -1,5 +1,6 @@
 #include "formats/Steps.h"
 
+#include "quavel/QVMetadata.h"
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffHeader.h"
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
@@ -45,40 +46,38 @@ void append(std::string& out, EntryContent content) {
   }
 }
 
-bool storeNumberOf(Entry const& entry, Directory const& directory, unsigned short tag,
-                   std::int32_t& field) {
-  auto const* const value = singleValue(entry);
-  if (value == nullptr) {
-    return refuseContent(directory, tag, "exactly one wanted");
+}  // namespace
+
+bool findNumber(Directory const& directory, unsigned short tag, ValuePointer& value) {
+  auto const entry = findEntry(directory, tag);
+  value = entry.size() == 1 ? entry[0] : nullptr;
+  if (!entry) {
+    noteNoEntry(directory, tag);
   }
-  field = static_cast<std::int32_t>(value->longValue());
-  if (field == kAbsentNumber) {
-    noteNoValue(directory, tag, "{} is -1, which counts as absent");
+  return value != nullptr || !entry || refuseContent(directory, tag, "exactly one wanted");
+}
+
+bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
+  ValuePointer value = nullptr;
+  if (!findNumber(directory, tag, value)) {
+    return false;
+  }
+  if (value != nullptr) {
+    field = static_cast<std::int32_t>(value->longValue());
+    if (field == kAbsentNumber) {
+      noteNoValue(directory, tag, "{} is -1, which counts as absent");
+    }
   }
   return true;
 }
 
-}  // namespace
-
-ValuePointer singleValue(Entry const& entry) { return entry.size() == 1 ? entry[0] : nullptr; }
-
-bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
-  auto const entry = findEntry(directory, tag);
-  if (!entry) {
-    noteNoEntry(directory, tag);
-    return true;
-  }
-  return storeNumberOf(entry, directory, tag, field);
-}
-
 bool storeRequiredNumber(Directory const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field) {
-  auto const entry = findEntry(directory, tag);
-  if (!entry) {
+  if (!findEntry(directory, tag)) {
     return refuse(journalOf(directory), QVReason::MissingPart, positionOf(directory),
                   "no {} in {}; {}", TagName{tag}, NamedDirectory{directory}, rule);
   }
-  return storeNumberOf(entry, directory, tag, field);
+  return storeNumber(directory, tag, field);
 }
 
 bool storeText(Directory const& directory, unsigned short tag, std::string& field) {
@@ -116,21 +115,16 @@ Directory readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* stru
 
 bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory,
                    unsigned short pointer, char const* name, Tags tags, Directory& result) {
-  result = nullptr;
-  auto const entry = findEntry(directory, pointer);
-  if (!entry) {
-    return true;
+  ValuePointer offset = nullptr;
+  if (!findNumber(directory, pointer, offset)) {
+    return false;
   }
-  auto const* const offset = singleValue(entry);
-  if (offset == nullptr) {
-    return refuseContent(directory, pointer, "exactly one wanted");
-  }
-  result = readDirectoryAt(stream, {name}, offset->longValue(), tags);
-  return result != nullptr;
+  result = offset == nullptr ? nullptr : readDirectoryAt(stream, {name}, offset->longValue(), tags);
+  return offset == nullptr || result != nullptr;
 }
 
-bool followExifPointer(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, Tags tags,
-                       Directory& exifIFD) {
+bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream, Directory const& mainIFD,
+                 Tags tags, Directory& exifIFD) {
   if (!followPointer(stream, mainIFD, tag::ExifIFDPointer, "the Exif IFD", tags, exifIFD)) {
     return false;
   }
@@ -139,10 +133,11 @@ bool followExifPointer(std::shared_ptr<QVStream>& stream, Directory const& mainI
                "no {} in {}", TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
     return true;
   }
+  // A host's class may override what takes it, and keep any part of it.
   if (!readingOf(*stream).isOwnRecord) {
     exifIFD = static_cast<ReaderDirectory&>(*exifIFD).forHost();
   }
-  return true;
+  return record.storeInfoFromExifIFD(exifIFD);
 }
 
 bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std::uint32_t index,

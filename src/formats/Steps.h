@@ -13,10 +13,14 @@
 
 // The steps that the readers of several formats share. Each that can fail states why. What an
 // absent entry means is decided in the readers, where the formats differ.
+namespace quavel {
+class QVMetadata;
+}  // namespace quavel
+
 namespace quavel::detail {
 
-/// The entry's only value; null when it holds none or several.
-ValuePointer singleValue(Entry const& entry);
+/// Finds the tag's only value. Absent: true and null. None or several: false.
+bool findNumber(Directory const& directory, unsigned short tag, ValuePointer& value);
 
 /// Stores the tag's number. Absent: true, the field untouched. Not a single value: false.
 bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field);
@@ -41,10 +45,10 @@ Directory readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* stru
 bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory,
                    unsigned short pointer, char const* name, Tags tags, Directory& result);
 
-/// The same under ExifIFDPointer, for the record's `storeInfoFromExifIFD`. A host's class may
-/// override that, so the directory has `entries` unless the library has made the record.
-bool followExifPointer(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, Tags tags,
-                       Directory& exifIFD);
+/// Follows ExifIFDPointer and gives the Exif directory to the record's `storeInfoFromExifIFD`.
+/// Absent: true, `exifIFD` is null. The directory cannot be read or stored: false.
+bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream, Directory const& mainIFD,
+                 Tags tags, Directory& exifIFD);
 
 /// Reads the raw image's directory, the SubIFD of this index. `mainIFD` does not name as many:
 /// true, `rawIFD` is null. The directory cannot be read: false.

@@ -1,5 +1,3 @@
-#include "front/Explain.h"
-
 #include <algorithm>
 #include <array>
 #include <cmath>

@@ -8,7 +8,6 @@
 #include <system_error>
 #include <utility>
 
-#include "front/Explain.h"
 #include "journal/Journal.h"
 #include "journal/Reading.h"
 #include "quavel/QV3FRImage.h"

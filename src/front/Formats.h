@@ -31,6 +31,10 @@ std::string extensionOf(std::string const& path);
 /// The format of an extension in lower case, or null.
 Format const* formatOf(std::string_view extension);
 
+/// Completes the notes of a read that has ended: what the content looks like when that does not fit
+/// the format, and, of a record, why each absent field is absent. `record` is null after a failure.
+void explain(Format const& format, QVStream& stream, QVMetadata const* record, Journal& journal);
+
 /// The record of the file at a path, or null.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);
 

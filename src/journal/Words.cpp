@@ -46,6 +46,12 @@ void append(std::string& out, HexBytes bytes) {
   }
 }
 
+void append(std::string& out, HexPair pair) {
+  appendHex(out, pair.value >> 8U, 2);
+  out += ' ';
+  appendHex(out, pair.value & 0xffU, 2);
+}
+
 void append(std::string& out, HexCode code) {
   out += "0x";
   appendHex(out, code.value, 4);

@@ -19,6 +19,11 @@ struct HexBytes {
   std::size_t count;
 };
 
+/// Two bytes of the file, as a big-endian number: "ff d8".
+struct HexPair {
+  std::uint16_t value;
+};
+
 /// A 16-bit code of the file: "0xffe1".
 struct HexCode {
   std::uint16_t value;
@@ -34,9 +39,11 @@ void append(std::string& out, char const* text);
 void append(std::string& out, std::string const& text);
 void append(std::string& out, std::int64_t number);
 inline void append(std::string& out, int number) { append(out, std::int64_t{number}); }
+inline void append(std::string& out, std::uint16_t number) { append(out, std::int64_t{number}); }
 inline void append(std::string& out, std::uint32_t number) { append(out, std::int64_t{number}); }
 void append(std::string& out, Offset offset);
 void append(std::string& out, HexBytes bytes);
+void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 

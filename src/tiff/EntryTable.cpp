@@ -32,7 +32,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
     if (!walk.hasTag()) {
       return refuseCut(journal_, positionOf(walk), kEntryTypePosition, "entry {} of {} of {}",
-                       walk.number(), std::uint32_t{entryCount_}, PlacedDirectory{*this});
+                       walk.number(), entryCount_, PlacedDirectory{*this});
     }
     unsigned short const tag = walk.tag();
     if (!wanted.take(tag)) {
@@ -87,8 +87,8 @@ bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIF
   if (!stream.readLong(nextIFDOffset)) {
     return refuseCut(journal_, position_ + kEntryCountSize + kEntrySize * entryCount_,
                      sizeof(*nextIFDOffset),
-                     "the offset of the next directory, behind the {} entries of {}",
-                     std::uint32_t{entryCount_}, PlacedDirectory{*this});
+                     "the offset of the next directory, behind the {} entries of {}", entryCount_,
+                     PlacedDirectory{*this});
   }
   notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{*this},
              static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));

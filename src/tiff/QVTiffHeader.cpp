@@ -2,6 +2,7 @@
 
 #include "journal/Journal.h"
 #include "journal/Reading.h"
+#include "stream/Bytes.h"
 #include "tiff/HeaderStep.h"
 #include "tiff/TiffWords.h"
 
@@ -18,20 +19,6 @@ constexpr unsigned short kBigTiffMagic = 43;
 // Where the header's numbers lie, in bytes from its start.
 constexpr std::int64_t kMagicPosition = 2;
 constexpr std::int64_t kOffsetPosition = 4;
-
-/// A number as the two bytes that it was in the file.
-struct StoredShort {
-  unsigned short value;
-  ByteOrder order;
-};
-
-void append(std::string& out, StoredShort stored) {
-  auto const high = static_cast<std::uint8_t>(stored.value >> 8U);
-  auto const low = static_cast<std::uint8_t>(stored.value);
-  bool const isLittle = stored.order == ByteOrder::LittleEndian;
-  std::uint8_t const bytes[] = {isLittle ? low : high, isLittle ? high : low};
-  append(out, detail::HexBytes{bytes, sizeof(bytes)});
-}
 
 }  // namespace
 
@@ -54,7 +41,8 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
   if (mark != kLittleEndianMark && mark != kBigEndianMark) {
     return refuse(journal, QVReason::OtherKind, start,
                   "{} at {} begins with {}, not with 49 49 (\"II\") or 4d 4d (\"MM\")", name,
-                  Offset{start}, StoredShort{mark, stream.byteOrder});
+                  Offset{start},
+                  HexPair{stream.byteOrder == ByteOrder::BigEndian ? mark : reversed(mark)});
   }
   bool const isLittle = mark == kLittleEndianMark;
   stream.byteOrder = isLittle ? ByteOrder::LittleEndian : ByteOrder::BigEndian;
@@ -66,7 +54,7 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
   }
   if (magic != expectedMagic) {
     return refuse(journal, QVReason::OtherKind, start, "{} at {} has magic {}, not {}{}", name,
-                  Offset{start}, int{magic}, int{expectedMagic},
+                  Offset{start}, magic, expectedMagic,
                   magic == kBigTiffMagic ? "; 43 marks a BigTIFF, which is not read" : "");
   }
   if (!stream.readLong(&header.firstIFDOffset)) {

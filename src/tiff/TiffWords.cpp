@@ -1,5 +1,6 @@
 #include "tiff/TiffWords.h"
 
+#include <algorithm>
 #include <iterator>
 
 #include "tiff/Tags.h"
@@ -12,20 +13,17 @@ constexpr char kTypeNames[][10] = {"",          "BYTE",  "ASCII",     "SHORT",  
                                    "RATIONAL",  "SBYTE", "UNDEFINED", "SSHORT", "SLONG",
                                    "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
 
-tag::Name const* nameOf(unsigned short tag) {
-  for (auto const& row : tag::kNames) {
-    if (row.tag == tag) {
-      return &row;
-    }
-  }
-  return nullptr;
+tag::Tag const* known(unsigned short number) {
+  auto const* const found = std::find_if(std::begin(tag::kAll), std::end(tag::kAll),
+                                         [number](auto const& tag) { return tag == number; });
+  return found == std::end(tag::kAll) ? nullptr : found;
 }
 
 }  // namespace
 
 void append(std::string& out, TagName tag) {
   append(out, HexCode{tag.tag});
-  if (auto const* const row = nameOf(tag.tag)) {
+  if (auto const* const row = known(tag.tag)) {
     out.append(" ").append(row->name);
   }
 }
@@ -57,7 +55,7 @@ void appendType(std::string& out, std::uint16_t typeCode) {
 }
 
 char const* fieldOf(unsigned short tag) {
-  auto const* const row = nameOf(tag);
+  auto const* const row = known(tag);
   return row == nullptr || row->field[0] == '\0' ? nullptr : row->field;
 }
 

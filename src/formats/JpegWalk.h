@@ -1,0 +1,33 @@
+#ifndef QUAVEL_SRC_FORMATS_JPEGWALK_H
+#define QUAVEL_SRC_FORMATS_JPEGWALK_H
+
+#include "formats/Steps.h"
+#include "quavel/QVJPEGImage.h"
+
+namespace quavel {
+
+/// What the segments have shown so far. Positions, in the file, serve notes alone.
+struct QVJPEGImage::Walk {
+  bool sawAPP1 = false;  ///< Of any content, Exif or not.
+  bool sawSOF0 = false;
+  bool sawExif = false;
+  unsigned short frameWidth = 0;
+  unsigned short frameHeight = 0;
+  std::int64_t start = 0;  ///< Of the segment being read.
+  std::int64_t frame = -1;
+  std::int64_t otherFrame = -1;  ///< A progressive one.
+  std::int64_t scan = -1;        ///< Where picture data begins.
+};
+
+namespace detail {
+
+/// Notes where the data ends; a segment's length may lead beyond that.
+void noteEnd(Journal* journal, std::int64_t position);
+
+/// Notes why an Exif size does not count, if it does not.
+void noteSize(Directory const& exifIFD, int width, int height);
+
+}  // namespace detail
+}  // namespace quavel
+
+#endif  // QUAVEL_SRC_FORMATS_JPEGWALK_H
