@@ -20,7 +20,7 @@ constexpr char kFooter[] =
     "  quavel --csv --sort captureDate ~/Photos > photos.csv\n"
     "  quavel --jsonl --fields path,iso,fNumber ~/Photos | jq .iso\n"
     "  find . -mtime -7 -name '*.nef' -print0 | quavel -0 --files-from -\n"
-    "Fields are the record's names, such as model, or path, captureDate, error: see quavel(1).\n"
+    "Fields are the record's names, such as model, or path, captureDate, reason: see quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
 /// Shows an option's argument and no more: what excludes what is told when it matters.

@@ -8,6 +8,7 @@ import math
 import os
 import pty
 import re
+import resource
 import select
 import shutil
 import signal
@@ -290,8 +291,9 @@ class Inputs(CommandTest):
         self.assertIn(b"8 files, 0 records, 8 without", done.stderr)
         self.assertEqual(self.run_quavel("-q", "--jsonl", "empty.nef", status=1).stderr, b"")
 
-    def test_unreadable_folder_is_told(self):
+    def test_what_the_system_refuses_is_told(self):
         self.put("a/b.tif", photo())
+        os.chmod(self.put("c.tif", photo()), 0)
         self.folder.chmod(0o755)
         (self.folder / "a").chmod(0)
         self.addCleanup((self.folder / "a").chmod, 0o700)
@@ -302,8 +304,17 @@ class Inputs(CommandTest):
         except PermissionError:
             self.skipTest("the command lies where only root can run it")
         self.assertIn(b"Permission denied", self.run_quavel(".", status=1, **options).stderr)
-        folder, = self.objects(".", status=1, **options)
+        folder, file = self.objects(".", status=1, **options)
         self.assertEqual((folder["path"], folder["reason"]), ("./a", "unreadable-folder"))
+        self.assertEqual((file["path"], file["reason"]), ("./c.tif", "cannot-open"))
+        self.assertIn("check its permissions", file["error"])
+
+    def test_too_many_open_files_are_told(self):
+        self.put("a.tif", photo())
+        self.put("list", b"a.tif\n")
+        few, = self.objects("--files-from", "list", "--jobs", "1", status=1,
+                            preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_NOFILE, (4, 4)))
+        self.assertIn("try fewer --jobs", few["error"])
 
     def test_order_is_the_inputs_whatever_the_jobs(self):
         names = [f"{i * 7919 % 1000:03}.tif" for i in range(1000)]

@@ -206,8 +206,11 @@ class WhyTest(unittest.TestCase):
                 self.assertIn(line, text)
 
     def test_says_what_the_content_looks_like(self):
-        text = self.why(self.write("x.jpg", box(b"ftyp", b"he\x1bc")))[1]
+        path = self.write("x.jpg", box(b"ftyp", b"he\x1bc"))
+        text = self.why(path)[1]
         self.assertIn(r'looks like an ISO base media file of brand "he\x1bc"', text)
+        hint = self.objects("--why", path)[0]["notes"][-1]
+        self.assertEqual((hint["kind"], hint["reason"]), ("hint", "other-content"))
 
     def test_opens_nothing_but_photos(self):
         os.mkfifo(self.folder / "pipe.nef")
@@ -233,6 +236,8 @@ class WhyTest(unittest.TestCase):
         self.assertEqual(done.stdout, "\n".join(self.why(path)[1] for path in paths))
         self.assertRegex(done.stderr, r"\Aquavel: 3 files, 2 records, 1 without record.*\n\Z")
         good, empty, steps = self.objects("--why", paths[0], self.folder / "in")
+        array = json.loads(self.run_quavel("--why", "--json", *paths).stdout)
+        self.assertEqual(array, [good, empty, steps])
         absences = [note for note in good["notes"] if note["kind"] == "absence"]
         self.assertEqual([note["field"] for note in absences],
                          [k for k, v in good.items() if v is None and k != "captureDate"])
