@@ -8,7 +8,6 @@ import math
 import os
 import pty
 import re
-import resource
 import select
 import shutil
 import signal
@@ -308,13 +307,6 @@ class Inputs(CommandTest):
         self.assertEqual((folder["path"], folder["reason"]), ("./a", "unreadable-folder"))
         self.assertEqual((file["path"], file["reason"]), ("./c.tif", "cannot-open"))
         self.assertIn("check its permissions", file["error"])
-
-    def test_too_many_open_files_are_told(self):
-        self.put("a.tif", photo())
-        self.put("list", b"a.tif\n")
-        few, = self.objects("--files-from", "list", "--jobs", "1", status=1,
-                            preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_NOFILE, (4, 4)))
-        self.assertIn("try fewer --jobs", few["error"])
 
     def test_order_is_the_inputs_whatever_the_jobs(self):
         names = [f"{i * 7919 % 1000:03}.tif" for i in range(1000)]

@@ -24,8 +24,8 @@ std::string explanationOf(Outcome const& outcome);
 std::string csvHeader(Form const& form);
 TextOf csvRows(Form const& form);
 
-/// JSON objects, each on one line. An infinity, which JSON has no number for, is the text
-/// "Infinity" or "-Infinity"; the notes are an array.
+/// JSON objects, each on one line, which ends in the form of JSON lines. An infinity, which JSON
+/// has no number for, is the text "Infinity" or "-Infinity"; the notes are an array.
 TextOf jsonObjects(Form const& form);
 
 /// A table for people, laid out page by page so that no more than a page is ever held. On a

@@ -103,6 +103,7 @@ class JsonObjects {
   Members pathBytes_;      // the same, unless the fields name it or leave out the path
   bool showAbsent_;
   bool hasNotes_;
+  bool endsLine_;
 };
 
 JsonObjects::JsonObjects(Form const& form)
@@ -110,7 +111,8 @@ JsonObjects::JsonObjects(Form const& form)
           {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"), fieldNamed("position")})),
       bytesOfErrors_(membersOf({fieldNamed("pathBytes")})),
       showAbsent_(form.showAbsent.value_or(true)),
-      hasNotes_(form.hasNotes) {
+      hasNotes_(form.hasNotes),
+      endsLine_(form.kind == FormKind::Jsonl) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
   members_ = membersOf(fields);
   if (holds(fields, "path") && !holds(fields, "pathBytes")) {
@@ -137,6 +139,7 @@ std::string JsonObjects::operator()(Outcome const& outcome) const {
     object.append(1, object.empty() ? '{' : ',').append(notesOf(outcome));
   }
   object += object.empty() ? "{}" : "}";
+  object += endsLine_ ? "\n" : "";
   return object;
 }
 

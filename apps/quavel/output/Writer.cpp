@@ -76,24 +76,21 @@ void SortingWriter::end() {
   next_->end();
 }
 
-std::unique_ptr<Writer> makeUnsorted(Form const& form, Output& output) {
-  auto const write = [&output](TextOf textOf, char const* start, char const* separator) {
-    return std::make_unique<TextWriter>(output, std::move(textOf), start, separator);
-  };
+std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
   switch (form.kind) {
     case FormKind::Json:
       output.enclose("[", "\n]\n");
-      return write(jsonObjects(form), "\n", ",\n");
+      return std::make_unique<TextWriter>(output, jsonObjects(form), "\n", ",\n");
     case FormKind::Jsonl:
-      return write([object = jsonObjects(form)](Outcome const& o) { return object(o) + '\n'; }, "",
-                   "");
+      return std::make_unique<TextWriter>(output, jsonObjects(form), "", "");
     case FormKind::Csv:
       output.add(csvHeader(form));
-      return write(csvRows(form), "", "");
+      return std::make_unique<TextWriter>(output, csvRows(form), "", "");
     case FormKind::Card:
-      return write([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
+      return std::make_unique<TextWriter>(
+          output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
     default:
-      return form.hasNotes ? write(explanationOf, "", "\n") : makeTable(form, output);
+      return std::make_unique<TextWriter>(output, explanationOf, "", "\n");
   }
 }
 
@@ -114,7 +111,8 @@ void Writer::prepareSafely(Outcome& outcome) const {
 }
 
 std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
-  auto writer = makeUnsorted(form, output);
+  bool const isTable = form.kind == FormKind::Automatic && !form.hasNotes;
+  auto writer = isTable ? makeTable(form, output) : makeText(form, output);
   if (form.sort == nullptr) {
     return writer;
   }
