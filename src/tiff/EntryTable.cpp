@@ -1,5 +1,7 @@
 #include "tiff/EntryTable.h"
 
+#include <algorithm>
+
 #include "journal/Journal.h"
 #include "journal/Reading.h"
 #include "stream/Bytes.h"
@@ -14,6 +16,9 @@ namespace {
 // 1 KB at hand.
 constexpr std::size_t kFirstCapacity = 112;
 
+// An entry count is only a claim.
+constexpr std::size_t kMaxReservedRows = 256;
+
 }  // namespace
 
 bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
@@ -27,6 +32,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     return false;
   }
 
+  rows_.reserve(std::min({std::size_t{entryCount_}, wanted.count(), kMaxReservedRows}));
   values_.reserve(kFirstCapacity);
   EntryWalk walk(stream, entryCount_);
   for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
@@ -79,7 +85,6 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
 }
 
 bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIFDOffset) {
-  rows_.reserve(tags.size());
   WantedTags wanted(tags.begin(), tags.size());
   if (!read(stream, wanted)) {
     return false;

@@ -36,6 +36,9 @@ class WantedTags {
     return areAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
   }
 
+  /// How many are still to be met; more than a directory holds when all are wanted.
+  std::size_t count() const { return areAll_ ? SIZE_MAX : left_; }
+
   /// Whether there is a list and all that it names was met.
   bool areMet() const { return left_ == 0 && !areAll_; }
 
