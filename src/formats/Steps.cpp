@@ -16,36 +16,6 @@ constexpr unsigned short kTiffMagic = 42;
 // Stored in a record, it cannot be told from a number that is not there.
 constexpr std::int32_t kAbsentNumber = -1;
 
-/// An entry that a reader has found in a directory of its own: "0x0132 DateTime at 0xe6 (230) in
-/// IFD0".
-struct FoundEntry {
-  Directory const& directory;
-  unsigned short tag;
-};
-
-EntryTable::Row const* rowOf(Directory const& directory, unsigned short tag) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  return own == nullptr ? nullptr : own->table.find(tag);
-}
-
-void append(std::string& out, FoundEntry entry) {
-  if (auto const* const row = rowOf(entry.directory, entry.tag)) {
-    append(out, PlacedEntry{ReaderDirectory::of(*entry.directory)->table, *row});
-  }
-}
-
-/// What such an entry holds: "2 SHORT values".
-struct EntryContent {
-  Directory const& directory;
-  unsigned short tag;
-};
-
-void append(std::string& out, EntryContent content) {
-  if (auto const* const row = rowOf(content.directory, content.tag)) {
-    append(out, TypedCount{row->count, row->typeCode});
-  }
-}
-
 }  // namespace
 
 bool findNumber(Directory const& directory, unsigned short tag, ValuePointer& value) {
@@ -163,24 +133,27 @@ void noteNoEntry(Directory const& directory, unsigned short tag) {
   }
 }
 
+// Below, a directory without a row is a host's, of whose reads nobody keeps notes.
+
 void noteNoValue(Directory const& directory, unsigned short tag, char const* pattern) {
-  Journal* const journal = journalOf(directory);
-  if (journal != nullptr && fieldOf(tag) != nullptr) {
-    noteAbsent(journal, {fieldOf(tag)}, QVReason::NoValue, pattern, FoundEntry{directory, tag},
-               EntryContent{directory, tag});
+  auto const* const own = ReaderDirectory::of(*directory);
+  auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
+  if (row != nullptr && fieldOf(tag) != nullptr) {
+    noteAbsent(own->table.journal(), {fieldOf(tag)}, QVReason::NoValue, pattern,
+               PlacedEntry{own->table, *row}, TypedCount{row->count, row->typeCode});
   }
 }
 
 bool refuseContent(Directory const& directory, unsigned short tag, char const* wanted) {
-  auto const* const row = rowOf(directory, tag);
-  bool const isUndefined = row != nullptr && row->typeCode == kUndefinedCode;
-  if (isUndefined) {
-    return refuse(journalOf(directory), QVReason::MalformedEntry, row->position,
-                  "{} is of type UNDEFINED; one number wanted", FoundEntry{directory, tag});
+  auto const* const own = ReaderDirectory::of(*directory);
+  auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
+  if (row == nullptr) {
+    return false;
   }
-  return refuse(journalOf(directory), QVReason::MalformedEntry, positionOf(directory, tag),
-                "{} holds {}; {}", FoundEntry{directory, tag}, EntryContent{directory, tag},
-                wanted);
+  bool const isUndefined = row->typeCode == kUndefinedCode;
+  return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
+                isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
+                PlacedEntry{own->table, *row}, TypedCount{row->count, row->typeCode}, wanted);
 }
 
 bool isReducedImage(ValuePointer newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
@@ -203,21 +176,12 @@ bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::in
 }
 
 void append(std::string& out, NamedDirectory named) {
-  if (auto const* const own = ReaderDirectory::of(*named.directory)) {
-    append(out, PlacedDirectory{own->table});
-  } else {
-    out += "the directory";
-  }
+  append(out, PlacedDirectory{ReaderDirectory::of(*named.directory)->table});
 }
 
 std::int64_t positionOf(Directory const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return own == nullptr ? -1 : own->table.position();
-}
-
-std::int64_t positionOf(Directory const& directory, unsigned short tag) {
-  auto const* const row = rowOf(directory, tag);
-  return row == nullptr ? -1 : row->position;
 }
 
 }  // namespace quavel::detail

@@ -71,15 +71,14 @@ bool isReducedImage(ValuePointer newSubfileType);
 /// NewSubfileType is absent or not a single value, or the image is a reduced one.
 bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::int32_t& height);
 
-/// "IFD0 at 8", or "the directory" for a host's.
+/// A reader's own directory: "IFD0 at 8".
 struct NamedDirectory {
   Directory const& directory;
 };
 void append(std::string& out, NamedDirectory named);
 
-/// Where a directory, or its first entry with the tag, begins in the file; -1 when unknown.
+/// Where a directory begins in the file; -1 for a host's.
 std::int64_t positionOf(Directory const& directory);
-std::int64_t positionOf(Directory const& directory, unsigned short tag);
 
 }  // namespace quavel::detail
 

@@ -4,6 +4,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 #include "quavel/QVStream.h"
 
@@ -20,29 +21,17 @@ inline std::uint16_t reversed(std::uint16_t bits) { return __builtin_bswap16(bit
 inline std::uint32_t reversed(std::uint32_t bits) { return __builtin_bswap32(bits); }
 inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bits); }
 
-/// The unsigned integer as wide as a number, whose bytes are reversed without a look at what they
-/// mean.
-template <std::size_t kSize>
-struct BitsOf;
-template <>
-struct BitsOf<2> {
-  using Type = std::uint16_t;
-};
-template <>
-struct BitsOf<4> {
-  using Type = std::uint32_t;
-};
-template <>
-struct BitsOf<8> {
-  using Type = std::uint64_t;
-};
-
+/// Reverses a number by the unsigned integer as wide as it, without a look at what its bytes mean.
 template <class Number>
 void reverseBytes(Number* number) {
-  typename BitsOf<sizeof(Number)>::Type bits;
-  std::memcpy(&bits, number, sizeof(Number));
+  constexpr std::size_t kSize = sizeof(Number);
+  std::conditional_t<kSize == 2, std::uint16_t,
+                     std::conditional_t<kSize == 4, std::uint32_t, std::uint64_t>>
+      bits;
+  static_assert(sizeof(bits) == kSize);
+  std::memcpy(&bits, number, kSize);
   bits = reversed(bits);
-  std::memcpy(number, &bits, sizeof(Number));
+  std::memcpy(number, &bits, kSize);
 }
 
 template <class Number>

@@ -128,35 +128,22 @@ std::uint32_t bitsOf(Value const& value) { return to32Bits<std::int32_t>(value);
 }  // namespace
 
 bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream) {
-  switch (type) {
-    case EntryValueType::BYTE:
+  switch (sizeOfValueOfType(type)) {
+    case 1:
       return readInto(*this, *stream, &QVStream::readByte);
-    case EntryValueType::ASCII:
-      return readInto(*this, *stream, &QVStream::readChar);
-    case EntryValueType::SHORT:
+    case 2:
       return readInto(*this, *stream, &QVStream::readShort);
-    case EntryValueType::LONG:
+    case 4:
       return readInto(*this, *stream, &QVStream::readLong);
-    case EntryValueType::RATIONAL:
+    case 8:
+      if (type == EntryValueType::DOUBLE) {
+        return readInto(*this, *stream, &QVStream::readDouble);
+      }
       return readInto(*this, *stream, &QVStream::readLong) &&
-             readInto(*this, *stream, &QVStream::readLong, 4);
-    case EntryValueType::SBYTE:
-      return readInto(*this, *stream, &QVStream::readSByte);
-    case EntryValueType::SSHORT:
-      return readInto(*this, *stream, &QVStream::readSShort);
-    case EntryValueType::SLONG:
-      return readInto(*this, *stream, &QVStream::readSLong);
-    case EntryValueType::SRATIONAL:
-      return readInto(*this, *stream, &QVStream::readSLong) &&
-             readInto(*this, *stream, &QVStream::readSLong, 4);
-    case EntryValueType::FLOAT:
-      return readInto(*this, *stream, &QVStream::readFloat);
-    case EntryValueType::DOUBLE:
-      return readInto(*this, *stream, &QVStream::readDouble);
-    case EntryValueType::UNDEFINED:
-      return false;
+             readInto(*this, *stream, &QVStream::readLong, 4);  // a fraction is two numbers
+    default:
+      return false;  // UNDEFINED, or what is not a type: `type` is public
   }
-  return false;  // `type` is public: it may hold what is no type
 }
 
 unsigned int QVTiffImageFileDirectoryEntryValue::sizeOfValueOfType(EntryValueType const& type) {
