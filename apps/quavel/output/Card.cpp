@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <sstream>
 
 #include "output/Forms.h"
 #include "terminal/Escape.h"
@@ -11,30 +12,13 @@ constexpr std::size_t kLabelWidth = 17;
 
 /// What a person looks for first comes first.
 Fields cardFields() {
+  std::istringstream names(
+      "captureDate model lensModel exposureTime fNumber iso focalLength focalLengthIn35mmFilm "
+      "exposureBiasValue meteringMode whiteBalance width height orientation isRaw "
+      "dateTimeOriginal dateTimeDigitized dateTime hasShootingInfo apertureValue "
+      "shutterSpeedValue apexFNumber apexExposureTime");
   Fields fields;
-  for (auto const* name : {"captureDate",
-                           "model",
-                           "lensModel",
-                           "exposureTime",
-                           "fNumber",
-                           "iso",
-                           "focalLength",
-                           "focalLengthIn35mmFilm",
-                           "exposureBiasValue",
-                           "meteringMode",
-                           "whiteBalance",
-                           "width",
-                           "height",
-                           "orientation",
-                           "isRaw",
-                           "dateTimeOriginal",
-                           "dateTimeDigitized",
-                           "dateTime",
-                           "hasShootingInfo",
-                           "apertureValue",
-                           "shutterSpeedValue",
-                           "apexFNumber",
-                           "apexExposureTime"}) {
+  for (std::string name; names >> name;) {
     fields.push_back(fieldNamed(name));
   }
   return fields;
