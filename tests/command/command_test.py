@@ -308,6 +308,10 @@ class Inputs(CommandTest):
         self.assertEqual((file["path"], file["reason"]), ("./c.tif", "cannot-open"))
         self.assertIn("check its permissions", file["error"])
 
+    def test_list_that_breaks_off_is_told(self):
+        lost, = self.objects("--files-from", "/proc/self/mem", status=1)  # nothing lies at its start
+        self.assertEqual((lost["path"], lost["reason"]), ("/proc/self/mem", "unreadable-list"))
+
     def test_order_is_the_inputs_whatever_the_jobs(self):
         names = [f"{i * 7919 % 1000:03}.tif" for i in range(1000)]
         for i, name in enumerate(names):
