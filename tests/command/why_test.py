@@ -14,9 +14,14 @@ SAMPLES = os.environ.get("QUAVEL_SAMPLES")
 WIDTH, HEIGHT, SUBFILE, MODEL, DATE, SUBIFDS, EXIF = (
     0x100, 0x101, 0xFE, 0x110, 0x132, 0x14A, 0x8769)
 ORIGINAL, FOCAL, PIXEL_X = 0x9003, 0x920A, 0xA002
-CUT, KIND, ENTRY, VALUES, BOX, PART, IMAGE = (
-    "cut-short", "other-kind", "malformed-entry", "too-many-values", "malformed-box",
-    "missing-part", "wrong-image")
+# The reason for programs, and what the photo's owner is told first.
+CUT = "cut-short", "cut short: "
+KIND = "other-kind", "another kind of file, or damaged: "
+ENTRY = "malformed-entry", "damaged or badly written: "
+BOX = "malformed-box", "damaged or badly written: "
+VALUES = "too-many-values", "beyond what is read of one file: "
+PART = "missing-part", "a part is missing: "
+IMAGE = "wrong-image", "of a layout that is not read: "
 ASCII, SHORT, LONG, RATIONAL, UNDEFINED, SRATIONAL = 2, 3, 4, 5, 7, 10
 
 
@@ -180,12 +185,12 @@ class WhyTest(unittest.TestCase):
         return path
 
     def test_names_the_step_that_failed(self):
-        for extension, reason, content, words in REFUSED:
+        for extension, (reason, lead), content, words in REFUSED:
             with self.subTest(words):
                 path = self.write("x." + extension, content)
                 status, text = self.why(path)
                 self.assertEqual(status, 1)
-                self.assertIn("no record: ", text.splitlines()[0])
+                self.assertIn("no record: " + lead, text.splitlines()[0])
                 self.assertIn(words, text.splitlines()[0])
                 found, = self.objects(path)
                 self.assertEqual(text.splitlines()[0], f"{path}: no record: {found['error']}.")
