@@ -4,8 +4,8 @@
 #include <algorithm>
 #include <thread>
 
-#include "Escape.h"
-#include "Photo.h"
+#include "photo/Photo.h"
+#include "terminal/Escape.h"
 
 namespace app {
 
@@ -20,7 +20,7 @@ constexpr char kFooter[] =
     "  quavel --csv --sort captureDate ~/Photos > photos.csv\n"
     "  quavel --jsonl --fields path,iso,fNumber ~/Photos | jq .iso\n"
     "  find . -mtime -7 -name '*.nef' -print0 | quavel -0 --files-from -\n"
-    "Fields are the record's names, such as model, or path, captureDate, error: see quavel(1).\n"
+    "Fields are the record's names, such as model, or path, captureDate, reason: see quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
 /// Shows an option's argument and no more: what excludes what is told when it matters.
@@ -34,13 +34,6 @@ class ShortFormatter : public CLI::Formatter {
     return "Usage: quavel [OPTIONS] PATH...    photos, and folders with photos\n";
   }
   std::string make_positionals(CLI::App const* /*app*/) const override { return {}; }
-};
-
-/// The texts of the arguments before they are checked.
-struct Texts {
-  std::vector<std::string> fields;  // each a list
-  std::optional<std::string> sort;
-  std::optional<std::string> absent;
 };
 
 std::string fieldNames() {
@@ -80,11 +73,11 @@ std::string refuseEmpty(std::string const& argument) {
 }
 
 void addInputs(CLI::App& command, Options& options) {
-  command.add_option("PATH", options.paths, "Photos and folders of photos")->type_name("");
-  auto* const list = command.add_option("--files-from", options.filesFrom,
+  command.add_option("PATH", options.inputs.paths, "Photos and folders of photos")->type_name("");
+  auto* const list = command.add_option("--files-from", options.inputs.list,
                                         "Read the photos' paths from a file; -: standard input");
   list->type_name("FILE")->check(refuseEmpty);
-  command.add_flag("-0,--null", options.isNulSeparated, "Paths in that file end with a NUL")
+  command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
       ->needs(list);
   auto* const standardInput =
       command.add_flag("--stdin", options.fromStdin, "Read one image from standard input");
@@ -92,40 +85,57 @@ void addInputs(CLI::App& command, Options& options) {
       command.add_option("--extension", options.extension, "The kind of that image, such as nef");
   extension->type_name("EXT")->needs(standardInput);
   standardInput->needs(extension)->excludes(list);
-  command.add_option("--why", options.why, "Tell why a file gives no record, or lacks fields")
-      ->type_name("FILE")
-      ->check(refuseEmpty);
 }
 
-void addForms(CLI::App& command, FormKind& form) {
+void addForms(CLI::App& command, Form& form) {
+  auto* const why =
+      command.add_flag("--why", form.hasNotes, "Tell why files give no record, or lack fields");
   std::vector<CLI::Option*> forms;
-  struct Row {
-    char const* name;
-    FormKind kind;
-    char const* text;
-  };
-  for (Row const& row : {Row{"--card", FormKind::Card, "A labelled card for every photo"},
-                         Row{"--json", FormKind::Json, "One JSON array, exact values"},
-                         Row{"--jsonl", FormKind::Jsonl, "One JSON object a line, as they come"},
-                         Row{"--csv", FormKind::Csv, "CSV (RFC 4180) with a header row"}}) {
+  auto const add = [&](char const* name, FormKind kind, char const* text) {
     auto* const flag = command.add_flag_callback(
-        row.name, [&form, kind = row.kind] { form = kind; }, row.text);
+        name, [&form, kind] { form.kind = kind; }, text);
     flag->group("Forms (otherwise a table, or a card when there is one photo)");
     for (auto* const other : forms) {
       flag->excludes(other);
     }
     forms.push_back(flag);
-  }
+    return flag;
+  };
+  add("--card", FormKind::Card, "A labelled card for every photo")->excludes(why);
+  add("--json", FormKind::Json, "One JSON array, exact values");
+  add("--jsonl", FormKind::Jsonl, "One JSON object a line, as they come");
+  add("--csv", FormKind::Csv, "CSV (RFC 4180) with a header row")->excludes(why);
 }
 
-void addChoices(CLI::App& command, Options& options, Texts& texts) {
-  command.add_option("--fields", texts.fields, "Show these fields, in this order")
+void addChoices(CLI::App& command, Options& options) {
+  Form& form = options.form;
+  auto const setFields = [&form](std::vector<std::string> const& lists) {
+    for (auto const& list : lists) {
+      addFields(list, form.fields);
+    }
+  };
+  auto const setSort = [&form](std::string const& name) {
+    form.sort = wantedField("--sort", name);
+  };
+  auto const setAbsent = [&form](std::string const& choice) {
+    if (choice != "skip" && choice != "show") {
+      throw CLI::ValidationError("--absent: give skip or show");
+    }
+    form.showAbsent = choice == "show";
+  };
+  command
+      .add_option_function<std::vector<std::string>>("--fields", setFields,
+                                                     "Show these fields, in this order")
       ->expected(1, CLI::detail::expected_max_vector_size)
       ->allow_extra_args(false)
       ->type_name("A,B,..");
-  command.add_option("--sort", texts.sort, "Sort by a field; all records are kept until the end")
+  command
+      .add_option_function<std::string>("--sort", setSort,
+                                        "Sort by a field; all records are kept until the end")
       ->type_name("FIELD");
-  command.add_option("--absent", texts.absent, "Absent values: skip or show (CSV always shows)")
+  command
+      .add_option_function<std::string>("--absent", setAbsent,
+                                        "Absent values: skip or show (CSV always shows)")
       ->type_name("skip|show");
   command.add_option("--jobs", options.jobs, "Files read at a time [the processors]")
       ->type_name("N")
@@ -133,32 +143,19 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
 }
 
-void check(Options& options, Texts const& texts) {
-  for (auto const& list : texts.fields) {
-    addFields(list, options.fields);
-  }
-  if (texts.sort) {
-    options.sort = wantedField("--sort", *texts.sort);
-  }
-  if (texts.absent && texts.absent != "skip" && texts.absent != "show") {
-    throw CLI::ValidationError("--absent: give skip or show");
-  }
-  if (texts.absent) {
-    options.showAbsent = texts.absent == "show";
-  }
+void check(Options& options) {
   if (options.fromStdin) {
     options.extension = extensionOf("." + options.extension);
-    if (!isPhotoExtension(options.extension)) {
-      throw CLI::ValidationError("--extension: give one of: " + extensionList());
+    std::string const unknown = whyUnknown(options.extension);
+    if (!unknown.empty()) {
+      throw CLI::ValidationError("--extension: " + unknown);
     }
   }
-  bool const hasPaths = !options.paths.empty() || !options.filesFrom.empty();
-  if (!options.why.empty()) {
-    if (hasPaths || options.fromStdin || options.form != FormKind::Automatic) {
-      throw CLI::ValidationError("--why explains one file in words: give no other and no form");
-    }
-    return;
+  Form const& form = options.form;
+  if (form.isExplanation() && (!form.fields.empty() || form.showAbsent)) {
+    throw CLI::ValidationError("--fields and --absent: with --why, add --json or --jsonl");
   }
+  bool const hasPaths = !options.inputs.paths.empty() || !options.inputs.list.empty();
   if (hasPaths == options.fromStdin) {
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
                                         : "no photos given: name files or folders");
@@ -179,7 +176,6 @@ std::string helpOf(CLI::App const& command) {
 ParsedOptions parseOptions(int argc, char const* const* argv) {
   ParsedOptions parsed;
   Options& options = parsed.options;
-  Texts texts;
   CLI::App command("Shows what cameras stored in their photos.", "quavel");
   command.set_version_flag("--version", "quavel " QUAVEL_COMMAND_VERSION, "Show the version");
   command.set_help_flag("-h,--help", "Show this help");
@@ -189,10 +185,10 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   options.jobs = std::clamp(std::thread::hardware_concurrency(), 1U, kMostJobs);
   addInputs(command, options);
   addForms(command, options.form);
-  addChoices(command, options, texts);
+  addChoices(command, options);
   try {
     command.parse(argc, argv);
-    check(options, texts);
+    check(options);
   } catch (CLI::CallForHelp const&) {
     parsed.status = kSuccess;
     parsed.output = helpOf(command);

@@ -3,9 +3,9 @@
 
 #include <optional>
 #include <string>
-#include <vector>
 
-#include "Field.h"
+#include "input/Source.h"
+#include "output/Form.h"
 
 namespace app {
 
@@ -13,23 +13,13 @@ constexpr int kSuccess = 0;
 constexpr int kSomeFailed = 1;
 constexpr int kWrongUsage = 2;
 
-enum class FormKind { Automatic, Card, Json, Jsonl, Csv };
-
 struct Options {
-  std::vector<std::string> paths;
-  std::string filesFrom;  ///< Empty: no list.
-  bool isNulSeparated = false;
+  Inputs inputs;
   bool fromStdin = false;
-  std::string why;        ///< The one file to explain; empty: none.
   std::string extension;  ///< Of what standard input holds, in lower case.
-  FormKind form = FormKind::Automatic;
-  Fields fields;                   ///< Empty: those of the form.
-  Field const* sort = nullptr;     ///< Null: the order of the input.
-  std::optional<bool> showAbsent;  ///< Not set: as the form does.
+  Form form;
   unsigned jobs = 1;
   bool isQuiet = false;
-
-  bool isMachineForm() const { return form != FormKind::Automatic && form != FormKind::Card; }
 };
 
 /// What the arguments amount to.

@@ -2,7 +2,7 @@
 
 #include <system_error>
 
-#include "Interrupt.h"
+#include "terminal/Interrupt.h"
 
 namespace app {
 

@@ -11,7 +11,7 @@
 #include <thread>
 #include <vector>
 
-#include "Outcome.h"
+#include "photo/Outcome.h"
 
 namespace app {
 

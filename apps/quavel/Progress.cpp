@@ -8,9 +8,9 @@
 #include <string>
 #include <system_error>
 
-#include "Console.h"
-#include "Interrupt.h"
-#include "Source.h"
+#include "input/Source.h"
+#include "terminal/Console.h"
+#include "terminal/Interrupt.h"
 
 namespace app {
 
@@ -72,14 +72,14 @@ void Progress::tick() {
 }
 
 void Progress::startCounting() {
-  if (!isRereadable(options_.filesFrom)) {
+  if (!isRereadable(options_.inputs.list)) {
     return;
   }
   interrupt::Shield const shield;
   try {
     counter_ = std::thread([this] {
       try {
-        Source source(options_, [](auto&&...) {});
+        Source source(options_.inputs, [](auto&&...) {});
         Input input;
         std::size_t count = 0;
         while (!isEnding_ && source.next(input)) {
@@ -111,7 +111,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  if (options_.isQuiet || (files == 1 && failures_ == 0)) {
+  bool const isToldAll = failures_ == 0 || options_.form.isExplanation();
+  if (options_.isQuiet || (files == 1 && isToldAll)) {
     return;
   }
   double const seconds = secondsSince(start_);

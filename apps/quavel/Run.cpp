@@ -6,11 +6,11 @@
 #include <optional>
 #include <system_error>
 
-#include "Photo.h"
 #include "Pipeline.h"
 #include "Progress.h"
-#include "Source.h"
-#include "Writer.h"
+#include "input/Source.h"
+#include "output/Writer.h"
+#include "photo/Photo.h"
 
 namespace app {
 
@@ -36,39 +36,40 @@ class Runner {
   void emit(Outcome&& outcome);
   void emitAll();
   int end();
-  void report(std::string const& path, std::string const& problem, bool isFailure);
 
   Options const& options_;
   Output& output_;
   Console& console_;
   std::unique_ptr<Writer> writer_;
+  Detail detail_;
   Progress progress_;
   Pipeline pipeline_;
   std::size_t batchSize_ = 1;
-  bool missedPhotos_ = false;
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
     : options_(options),
       output_(output),
       console_(console),
-      writer_(makeWriter(options, output)),
+      writer_(makeWriter(options.form, output)),
+      detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
       pipeline_(options.jobs, [this](Batch& batch) { work(batch); }) {}
 
 int Runner::run() {
   if (options_.fromStdin) {
-    Outcome outcome = readStandardInput(options_.extension);
+    Outcome outcome = readStandardInput(options_.extension, detail_);
     writer_->prepareSafely(outcome);
     emit(std::move(outcome));
     return end();
   }
   std::optional<Source> source;
   try {
-    source.emplace(options_, [this](std::string const& path, std::string const& problem,
-                                    bool isFailure) { report(path, problem, isFailure); });
+    source.emplace(options_.inputs, [this](std::string const& path, std::string const& why) {
+      console_.sayOf(path, why);
+    });
   } catch (std::system_error const& error) {
-    console_.sayOf(options_.filesFrom, "the list cannot be opened: " + error.code().message());
+    console_.sayOf(options_.inputs.list, "the list cannot be opened: " + error.code().message());
     return kWrongUsage;
   }
   return runSource(*source);
@@ -108,7 +109,7 @@ void Runner::work(Batch& batch) const {
   auto const start = std::chrono::steady_clock::now();
   batch.outcomes.reserve(batch.inputs.size());
   for (auto& input : batch.inputs) {
-    Outcome outcome = readPhoto(std::move(input));
+    Outcome outcome = readPhoto(std::move(input), detail_);
     writer_->prepareSafely(outcome);
     batch.bytes += outcome.text.size();
     batch.outcomes.push_back(std::move(outcome));
@@ -135,9 +136,11 @@ void Runner::emitOldest() {
 }
 
 void Runner::emit(Outcome&& outcome) {
-  progress_.count(outcome.error.empty());
-  if (!outcome.error.empty() && !(options_.isQuiet && options_.isMachineForm())) {
-    console_.sayOf(outcome.path, outcome.error);
+  Form const& form = options_.form;
+  progress_.count(!outcome.problem);
+  bool const isTold = form.isExplanation() || (options_.isQuiet && form.isForMachines());
+  if (outcome.problem && !isTold) {
+    console_.sayOf(outcome.path, outcome.problem.text);
   }
   writer_->add(std::move(outcome));
 }
@@ -147,12 +150,7 @@ int Runner::end() {
   output_.flush();
   console_.hideProgress();
   progress_.sumUp();
-  return progress_.failures() > 0 || missedPhotos_ ? kSomeFailed : kSuccess;
-}
-
-void Runner::report(std::string const& path, std::string const& problem, bool isFailure) {
-  console_.sayOf(path, problem);
-  missedPhotos_ = missedPhotos_ || isFailure;
+  return progress_.failures() > 0 ? kSomeFailed : kSuccess;
 }
 
 }  // namespace

@@ -1,9 +1,9 @@
 #ifndef QUAVEL_APPS_RUN_H
 #define QUAVEL_APPS_RUN_H
 
-#include "Console.h"
 #include "Options.h"
-#include "Output.h"
+#include "output/Output.h"
+#include "terminal/Console.h"
 
 namespace app {
 

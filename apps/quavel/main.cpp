@@ -4,16 +4,14 @@
 
 #include <exception>
 #include <new>
-#include <sstream>
 #include <string>
 #include <system_error>
 
-#include "Console.h"
-#include "Interrupt.h"
 #include "Options.h"
-#include "Output.h"
 #include "Run.h"
-#include "Why.h"
+#include "output/Output.h"
+#include "terminal/Console.h"
+#include "terminal/Interrupt.h"
 
 namespace {
 
@@ -33,18 +31,7 @@ void holdStandardStreams() {
   }
 }
 
-int explain(std::string const& path, app::Output& output) {
-  std::ostringstream text;
-  bool const hasRecord = app::explainFile(path, text);
-  output.add(text.str());
-  output.flush();
-  return hasRecord ? app::kSuccess : app::kSomeFailed;
-}
-
 int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
-  if (!parsed.status && !parsed.options.why.empty()) {
-    return explain(parsed.options.why, output);
-  }
   if (!parsed.status) {
     return app::run(parsed.options, output, console);
   }

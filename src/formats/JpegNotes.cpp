@@ -5,8 +5,8 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  if (journal != nullptr) {
-    std::int64_t const size = journal->dataSize;
+  if (journal != nullptr && journal->wantsAll()) {
+    std::int64_t const size = journal->dataSize();
     notePassed(journal, position, "end of the data at {}, where the walk ends",
                Offset{size < 0 ? position : std::min(position, size)});
   }

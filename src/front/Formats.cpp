@@ -1,7 +1,5 @@
 #include "front/Formats.h"
 
-#include <sys/stat.h>
-
 #include <algorithm>
 #include <cerrno>
 #include <new>
@@ -82,17 +80,14 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
                 "the extension \"{}\" names no format; these do: {}", quoted, known);
 }
 
-/// Learns what notes tell of an open file; or why it is not open.
+/// Lets the journal ask the open file for its size, or states why it is not open.
 bool examine(QVFStream const& file, Journal& journal) {
   if (file.fd == -1) {
     journal.systemError = errno;
     return refuse(&journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
                   std::generic_category().message(journal.systemError));
   }
-  struct stat status = {};
-  if (::fstat(file.fd, &status) == 0 && S_ISREG(status.st_mode)) {
-    journal.dataSize = status.st_size;
-  }
+  journal.fd = file.fd;
   return true;
 }
 

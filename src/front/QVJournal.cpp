@@ -39,7 +39,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
 std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t length,
                                             std::string const& extension) {
   detail::Journal journal(detail_);
-  journal.dataSize = static_cast<std::int64_t>(length);
+  journal.knownSize = static_cast<std::int64_t>(length);
   auto record =
       detail::readStream(std::make_shared<QVMStream>(buffer, length), extension, &journal);
   keep(journal);

@@ -1,5 +1,7 @@
 #include "journal/Journal.h"
 
+#include <sys/stat.h>
+
 #include <algorithm>
 #include <system_error>
 #include <utility>
@@ -34,7 +36,7 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
                         Words words) {
-  if (dataSize == 0) {
+  if (dataSize() == 0) {
     refuse(QVReason::Empty, -1, "the file is empty", {});
     return;
   }
@@ -43,19 +45,27 @@ void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* p
           cutText(position + count)});
 }
 
+std::int64_t Journal::dataSize() {
+  struct stat status = {};
+  if (knownSize < 0 && fd != -1 && ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode)) {
+    knownSize = status.st_size;
+  }
+  return knownSize;
+}
+
 QVReason Journal::cutReason() const {
   return systemError != 0 ? QVReason::ReadError : QVReason::CutShort;
 }
 
-std::string Journal::cutText(std::int64_t end) const {
+std::string Journal::cutText(std::int64_t end) {
   if (systemError != 0) {
     return "reading fails: " + std::generic_category().message(systemError);
   }
-  if (dataSize < 0) {
+  if (dataSize() < 0) {
     return "the data ends before that";
   }
-  return end <= dataSize ? "reading there fails"
-                         : composed("the file ends at {}", {Offset{dataSize}});
+  return end <= dataSize() ? "reading there fails"
+                           : composed("the file ends at {}", {Offset{dataSize()}});
 }
 
 void Journal::passed(std::int64_t position, char const* pattern, Words words) {

@@ -37,14 +37,17 @@ class Journal {
   /// Whether a refusal was stated.
   bool isRefused() const { return isRefused_; }
 
+  /// The size of the data in bytes, which the file is not asked for earlier; -1: not known.
+  std::int64_t dataSize();
   /// Why bytes that end at a position cannot be read: as a reason, and in words.
   QVReason cutReason() const;
-  std::string cutText(std::int64_t end) const;
+  std::string cutText(std::int64_t end);
 
   std::vector<QVNote> notes;
   std::uint64_t furtherSteps = 0;
-  std::int64_t dataSize = -1;  ///< In bytes; -1: not known.
-  int systemError = 0;         ///< The `errno` of what failed; 0: nothing did.
+  int fd = -1;                  ///< Of the file that is read; -1: it is none.
+  std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
+  int systemError = 0;          ///< The `errno` of what failed; 0: nothing did.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);

@@ -1,5 +1,7 @@
 #include "journal/Words.h"
 
+#include <string_view>
+
 namespace quavel::detail {
 
 namespace {
@@ -72,15 +74,14 @@ void append(std::string& out, QuotedBytes bytes) {
 std::string composed(char const* pattern, std::initializer_list<Word> words) {
   std::string text;
   auto const* word = words.begin();
-  for (char const* at = pattern; *at != '\0'; ++at) {
-    if (at[0] == '{' && at[1] == '}' && word != words.end()) {
-      word->appendTo(text);
-      ++word;
-      ++at;
-    } else {
-      text += *at;
-    }
+  std::string_view rest = pattern;
+  for (auto at = rest.find("{}"); at != rest.npos && word != words.end(); at = rest.find("{}")) {
+    text += rest.substr(0, at);
+    word->appendTo(text);
+    ++word;
+    rest.remove_prefix(at + 2);
   }
+  text += rest;
   text.resize(text.size() < kMaxTextLength ? text.size() : kMaxTextLength);
   return text;
 }

@@ -20,6 +20,7 @@ from pathlib import Path
 
 COMMAND = os.environ["QUAVEL_COMMAND"]
 SAMPLES = os.environ.get("QUAVEL_SAMPLES")
+COMMAND_SOURCE = Path(__file__).resolve().parents[2] / "apps/quavel"
 
 ASCII, SHORT, RATIONAL, SRATIONAL = 2, 3, 5, 10
 
@@ -106,7 +107,8 @@ class Forms(CommandTest):
         self.assertEqual(float32(first["exposureBiasValue"]), float32(-1 / 3))
         self.assertEqual((first["lensModel"], first["apertureValue"]), (None, None))
         self.assertEqual(second["captureDate"], "2020:07:06 15:32:17")
-        self.assertEqual(set(third), {"path", "error"})
+        self.assertEqual(list(third), ["path", "error", "reason", "position"])
+        self.assertEqual((third["reason"], third["position"]), ("other-kind", 0))
         for record, row in zip(array, self.rows(".", status=1)):
             for key, value in record.items():
                 if isinstance(value, float):
@@ -176,7 +178,7 @@ class Forms(CommandTest):
     def test_completions_know_the_fields(self):
         self.put("a.tif", photo())
         header = self.run_quavel("--csv", "a.tif").stdout.decode().splitlines()[0].split(",")
-        folder = Path(__file__).resolve().parents[2] / "apps/quavel/completions"
+        folder = COMMAND_SOURCE / "completions"
         for name, pattern in (("quavel", r"_fields='([^']*)'"), ("_quavel", r"fields=\(([^)]*)\)"),
                               ("quavel.fish", r"set -l fields ((?:[^\n]*\\\n)*[^\n]*)")):
             found = re.search(pattern, (folder / name).read_text(encoding="utf-8"))
@@ -185,10 +187,10 @@ class Forms(CommandTest):
     @unittest.skipUnless(shutil.which("bash"), "needs bash")
     def test_bash_completes_values_and_names(self):
         self.put("-a.tif", b"")
-        script = Path(__file__).resolve().parents[2] / "apps/quavel/completions/quavel"
+        script = COMMAND_SOURCE / "completions/quavel"
         for words, expected in ((["--absent", "=", "sh"], "show"), (["--absent", "="], "skip show"),
                                 (["--absent", "s"], "skip show"), (["--fields", "=", "iso,mod"], "iso,model"),
-                                (["--cs"], "--csv"), (["--", "-"], "-a.tif"), (["--", "--sort", "i"], "")):
+                                (["--why", "--cs"], "--csv"), (["--", "-"], "-a.tif"), (["--", "--sort", "i"], "")):
             run = 'compopt() { :; }; . "$0"; COMP_WORDS=(quavel "$@"); COMP_CWORD=$#; _quavel; ' \
                   'echo "${COMPREPLY[*]}"'
             done = subprocess.run(["bash", "-c", run, script, *words], cwd=self.folder,
@@ -259,7 +261,7 @@ class Inputs(CommandTest):
         walked = [p for p in found if not p.startswith("in/up/")]
         self.assertEqual(walked, ["in/a/z.JPG", "in/b.tif", "in/far/x.TIFF", "in/gone.tif",
                                   "in/l.tif"])
-        for name in (b"pipe.jpg: is no regular file", b"in/self: is a symbolic link",
+        for name in (b"pipe.jpg: is not a regular file", b"in/self: is a symbolic link",
                      b"in/far2: another", b"in/up/in: symbolic-link loop"):
             self.assertIn(name, done.stderr)
 
@@ -271,16 +273,26 @@ class Inputs(CommandTest):
         self.put("folder/a.tif", photo())
         listed = b"pipe.jpg\nempty.nef\ncut.nef\n\nnotes.txt\nmissing.jpg\nfolder\n" + b"a" * 5000 + b"\nb\0c"
         done = self.run_quavel("--jsonl", "--files-from", "-", input=listed, status=1)
-        errors = [json.loads(line)["error"] for line in done.stdout.splitlines()]
-        for part, error in zip(("FIFO", "is empty", "no whole .nef", "extension", "No such file", "folder",
-                                "longer than a path", "NUL"), errors, strict=True):
-            self.assertIn(part, error)
-            self.assertIn(error.encode(), done.stderr)
+        manual = (COMMAND_SOURCE / "quavel.1").read_text(encoding="utf-8")
+        for line, part, reason, position in zip(
+                done.stdout.splitlines(),
+                ("a FIFO, not a regular file", "is empty; copy it", "cut short: ", "tiff tif dng nef cr2 raf arw jpeg "
+                 "jpg nrw 3fr cr3", "No such file or directory; check the name", "a folder; give it as an argument",
+                 "longer than a path", "NUL"),
+                ("special-file", "empty", "cut-short", "unknown-extension", "cannot-open", "folder",
+                 "bad-path", "bad-path"), (None, None, 22, None, None, None, None, None), strict=True):
+            found = json.loads(line)
+            self.assertIn(part, found["error"])
+            self.assertIn(found["error"].encode(), done.stderr)
+            self.assertNotIn("--why", found["error"])
+            self.assertEqual((found["reason"], found["position"]), (reason, position))
+            self.assertIn("\n" + reason + "\t", manual)
         self.assertIn(b"8 files, 0 records, 8 without", done.stderr)
         self.assertEqual(self.run_quavel("-q", "--jsonl", "empty.nef", status=1).stderr, b"")
 
-    def test_unreadable_folder_is_told(self):
+    def test_what_the_system_refuses_is_told(self):
         self.put("a/b.tif", photo())
+        os.chmod(self.put("c.tif", photo()), 0)
         self.folder.chmod(0o755)
         (self.folder / "a").chmod(0)
         self.addCleanup((self.folder / "a").chmod, 0o700)
@@ -291,6 +303,14 @@ class Inputs(CommandTest):
         except PermissionError:
             self.skipTest("the command lies where only root can run it")
         self.assertIn(b"Permission denied", self.run_quavel(".", status=1, **options).stderr)
+        folder, file = self.objects(".", status=1, **options)
+        self.assertEqual((folder["path"], folder["reason"]), ("./a", "unreadable-folder"))
+        self.assertEqual((file["path"], file["reason"]), ("./c.tif", "cannot-open"))
+        self.assertIn("check its permissions", file["error"])
+
+    def test_list_that_breaks_off_is_told(self):
+        lost, = self.objects("--files-from", "/proc/self/mem", status=1)  # nothing lies at its start
+        self.assertEqual((lost["path"], lost["reason"]), ("/proc/self/mem", "unreadable-list"))
 
     def test_order_is_the_inputs_whatever_the_jobs(self):
         names = [f"{i * 7919 % 1000:03}.tif" for i in range(1000)]
@@ -315,9 +335,11 @@ class Inputs(CommandTest):
                           ["--fields", "iso,iso", "x"], ["-0", "x"], ["--jobs", "0", "x"],
                           ["--stdin", "--extension", "txt"], ["--stdin", "--extension", "nef", "x"],
                           ["--absent", "no", "x"], ["--files-from", "missing"], ["--nonsense"],
-                          ["--files-from", "."], ["--files-from", "-"], ["--why", ""],
+                          ["--files-from", "."], ["--files-from", "-"], ["--why"],
                           ["--files-from", ""], ["--sort", "", "x"],
                           ["--absent", "", "x"], ["--fields", "iso,,model", "x"],
+                          ["--why", "--csv", "x"], ["--why", "--card", "x"],
+                          ["--why", "--fields", "iso", "x"], ["--why", "--absent", "show", "x"],
                           ["--fields", "", "x"], ["--fields", "iso,", "x"]):
             done = self.run_quavel(*arguments, status=2, preexec_fn=lambda: os.close(0))
             self.assertRegex(done.stderr, rb"^quavel: .")

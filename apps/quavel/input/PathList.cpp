@@ -1,0 +1,113 @@
+#include "input/PathList.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <system_error>
+
+#include "photo/Reasons.h"
+
+namespace app {
+
+namespace {
+
+constexpr std::size_t kStep = std::size_t{1} << 16;
+constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system takes none longer
+
+/// What the first read would say, before anything is put out. 0, or the system's error.
+int whyUnreadable(int fd) {
+  struct stat status = {};
+  int const flags = ::fcntl(fd, F_GETFL);
+  if (flags == -1 || (flags & O_ACCMODE) == O_WRONLY) {
+    return EBADF;
+  }
+  return ::fstat(fd, &status) == 0 && S_ISDIR(status.st_mode) ? EISDIR : 0;
+}
+
+}  // namespace
+
+PathList::PathList(std::string const& name, char separator)
+    : fd_(name == "-" ? STDIN_FILENO : ::open(name.c_str(), O_RDONLY | O_CLOEXEC)),
+      separator_(separator) {
+  if (int const problem = fd_ == -1 ? errno : whyUnreadable(fd_)) {
+    if (fd_ > STDIN_FILENO) {
+      ::close(fd_);
+    }
+    throw std::system_error(problem, std::generic_category());
+  }
+}
+
+PathList::~PathList() {
+  if (fd_ != STDIN_FILENO) {
+    ::close(fd_);
+  }
+}
+
+bool PathList::isReady() {
+  if (atEnd_ || buffer_.find(separator_, start_) != std::string::npos) {
+    return true;
+  }
+  pollfd waiting = {fd_, POLLIN, 0};
+  return ::poll(&waiting, 1, 0) == 1;
+}
+
+bool PathList::next(Input& input) {
+  std::string path;
+  while (path.empty()) {
+    auto const end = buffer_.find(separator_, start_);
+    if (end == std::string::npos) {
+      if (refill()) {
+        continue;
+      }
+      path = buffer_.substr(start_);
+      start_ = buffer_.size();
+      break;
+    }
+    path = buffer_.substr(start_, end - start_);
+    start_ = end + 1;
+  }
+  input = entry(std::move(path));
+  return !input.path.empty();
+}
+
+bool PathList::refill() {
+  if (atEnd_) {
+    return false;
+  }
+  buffer_.erase(0, start_);
+  start_ = 0;
+  if (buffer_.size() > 2 * kLongestPath) {
+    buffer_.resize(kLongestPath + 1);  // refused anyhow: its rest need not be kept
+  }
+  std::size_t const size = buffer_.size();
+  buffer_.resize(size + kStep);
+  ssize_t count = 0;
+  do {
+    count = ::read(fd_, &buffer_[size], kStep);
+  } while (count == -1 && errno == EINTR);
+  error = count == -1 ? errno : 0;
+  atEnd_ = count <= 0;
+  buffer_.resize(size + (count > 0 ? static_cast<std::size_t>(count) : 0));
+  return !atEnd_;
+}
+
+Input PathList::entry(std::string path) const {
+  Input input;
+  if (path.find('\0') != std::string::npos) {
+    input.problem = {reason::kBadPath,
+                     "the path holds a NUL; if the list is NUL-separated, add -0"};
+  } else if (path.size() > kLongestPath) {
+    input.problem = {reason::kBadPath,
+                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
+  }
+  input.path = std::move(path);
+  if (input.problem && input.path.size() > kLongestPath) {
+    input.path.resize(kLongestPath);
+  }
+  return input;
+}
+
+}  // namespace app

@@ -1,0 +1,56 @@
+#ifndef QUAVEL_APPS_WALK_H
+#define QUAVEL_APPS_WALK_H
+
+#include <sys/types.h>
+
+#include <functional>
+#include <optional>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "photo/Outcome.h"
+
+namespace app {
+
+/// Takes a path that is passed over, and why.
+using Report = std::function<void(std::string const& path, std::string const& why)>;
+
+/// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
+/// are followed; one that leads back to a folder above it, or to where another link led before, is
+/// reported and passed over. Holds no more than the names of the folders it is inside of.
+class Walk {
+ public:
+  Walk(std::string const& folder, Report report);
+
+  /// The next photo, or a folder that cannot be read, with the problem; false at the end.
+  bool next(Input& input);
+
+ private:
+  using Identity = std::pair<dev_t, ino_t>;
+  struct Level {
+    std::string path;  // with a "/" at the end
+    Identity identity;
+    std::string names;  // each a type, a name and a NUL, in the order of the disk
+    std::vector<std::size_t> starts;
+    std::size_t next = 0;
+  };
+
+  void enter(std::string const& path, bool isLink);
+  bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
+  void readNames(void* folder, Level& level);
+  void miss(std::string const& path, int error);
+  void addName(Level& level, char type, char const* name);
+  bool visit(char type, std::string path, Input& input);
+  bool visitUnknown(std::string path, Input& input);
+
+  Report report_;
+  std::vector<Level> levels_;
+  std::set<Identity> linked_;
+  std::optional<Input> missed_;
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_WALK_H

@@ -1,0 +1,50 @@
+#include <algorithm>
+#include <sstream>
+
+#include "output/Forms.h"
+#include "terminal/Escape.h"
+
+namespace app {
+
+namespace {
+
+constexpr std::size_t kLabelWidth = 17;
+
+/// What a person looks for first comes first.
+Fields cardFields() {
+  std::istringstream names(
+      "captureDate model lensModel exposureTime fNumber iso focalLength focalLengthIn35mmFilm "
+      "exposureBiasValue meteringMode whiteBalance width height orientation isRaw "
+      "dateTimeOriginal dateTimeDigitized dateTime hasShootingInfo apertureValue "
+      "shutterSpeedValue apexFNumber apexExposureTime");
+  Fields fields;
+  for (std::string name; names >> name;) {
+    fields.push_back(fieldNamed(name));
+  }
+  return fields;
+}
+
+}  // namespace
+
+std::string cardOf(Form const& form, Outcome const& outcome) {
+  if (!outcome.record) {
+    return {};
+  }
+  static Fields const all = cardFields();
+  std::string card;
+  if (form.fields.empty()) {
+    card = escaped(outcome.path) + "\n";
+  }
+  for (auto const* field : form.fields.empty() ? all : form.fields) {
+    std::string const text = inWords(*field, outcome);
+    if (text.empty() && !form.showAbsent.value_or(!form.fields.empty())) {
+      continue;
+    }
+    std::string label = field->label;
+    label.resize(std::max(kLabelWidth, label.size() + 1), ' ');
+    card += "  " + label + (text.empty() ? "-" : text) + "\n";
+  }
+  return card;
+}
+
+}  // namespace app

@@ -1,0 +1,37 @@
+#ifndef QUAVEL_APPS_FORMS_H
+#define QUAVEL_APPS_FORMS_H
+
+#include <functional>
+#include <memory>
+#include <string>
+
+#include "output/Writer.h"
+
+namespace app {
+
+/// What a form shows of one file. Called on any thread.
+using TextOf = std::function<std::string(Outcome const&)>;
+
+/// The card of a file that gave a record, labelled lines for people; empty for any other.
+std::string cardOf(Form const& form, Outcome const& outcome);
+
+/// Why a file gives no record, or which fields its record leaves absent and why: a verdict, then
+/// some lines of detail.
+std::string explanationOf(Outcome const& outcome);
+
+/// Comma-separated values by RFC 4180: a row for each file below the header row. Absent values are
+/// empty.
+std::string csvHeader(Form const& form);
+TextOf csvRows(Form const& form);
+
+/// JSON objects, each on one line, which ends in the form of JSON lines. An infinity, which JSON
+/// has no number for, is the text "Infinity" or "-Infinity"; the notes are an array.
+TextOf jsonObjects(Form const& form);
+
+/// A table for people, laid out page by page so that no more than a page is ever held. On a
+/// terminal it fits the width; elsewhere nothing is cut. A single file becomes a card.
+std::unique_ptr<Writer> makeTable(Form const& form, Output& output);
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_FORMS_H

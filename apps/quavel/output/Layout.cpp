@@ -1,0 +1,85 @@
+#include "output/Layout.h"
+
+#include <algorithm>
+
+#include "terminal/Text.h"
+
+namespace app {
+
+namespace {
+
+constexpr std::size_t kGap = 2;
+
+std::size_t lineWidth(Widths const& widths) {
+  std::size_t sum = 0;
+  for (auto const width : widths) {
+    sum += width == 0 ? 0 : width + kGap;
+  }
+  return sum == 0 ? 0 : sum - kGap;
+}
+
+/// Shortens the widest columns first, each down to its least, until the line fits or none gives.
+void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t line) {
+  while (lineWidth(widths) > line) {
+    std::size_t widest = columns.size();
+    for (std::size_t i = 0; i < columns.size(); ++i) {
+      bool const canGive = widths[i] > columns[i].least;
+      if (canGive && (widest == columns.size() || widths[i] > widths[widest])) {
+        widest = i;
+      }
+    }
+    if (widest == columns.size()) {
+      return;
+    }
+    --widths[widest];
+  }
+}
+
+/// The shown column of the highest rank, or the number of columns.
+std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& widths) {
+  std::size_t found = columns.size();
+  for (std::size_t i = 0; i < columns.size(); ++i) {
+    bool const isBetter =
+        widths[i] > 0 && columns[i].rank > (found == columns.size() ? 0 : columns[found].rank);
+    found = isBetter ? i : found;
+  }
+  return found;
+}
+
+}  // namespace
+
+Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
+  while (true) {
+    Widths widths = natural;
+    if (line == kUnlimited) {
+      return widths;
+    }
+    // No column needs more than the whole line; the cut also bounds the loop below.
+    std::transform(widths.begin(), widths.end(), widths.begin(),
+                   [line](std::size_t width) { return std::min(width, line); });
+    shorten(columns, widths, line);
+    std::size_t const dispensable = mostDispensable(columns, widths);
+    if (lineWidth(widths) <= line || dispensable == columns.size()) {
+      return widths;
+    }
+    natural[dispensable] = 0;
+  }
+}
+
+std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
+                   std::vector<std::string> const& cells) {
+  std::string line;
+  std::size_t gap = 0;
+  for (std::size_t i = 0; i < columns.size(); ++i) {
+    if (widths[i] == 0) {
+      continue;
+    }
+    std::string const text =
+        columns[i].keepsEnd ? keepEnd(cells[i], widths[i]) : keepStart(cells[i], widths[i]);
+    line.append(gap, ' ').append(text);
+    gap = widths[i] - std::min(widths[i], app::cells(text)) + kGap;
+  }
+  return line + '\n';
+}
+
+}  // namespace app

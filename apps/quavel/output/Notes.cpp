@@ -1,0 +1,72 @@
+#include <algorithm>
+#include <utility>
+
+#include "output/Forms.h"
+#include "photo/Photo.h"
+#include "terminal/Escape.h"
+
+namespace app {
+
+namespace {
+
+using quavel::QVNote;
+using quavel::QVNoteKind;
+
+std::string verdictOf(Outcome const& outcome) {
+  std::string const start = escaped(outcome.path) + ": ";
+  if (outcome.problem) {
+    return start + "no record: " + escaped(outcome.problem.text) + ".\n";
+  }
+  std::string kind = extensionOf(outcome.path);
+  std::transform(kind.begin(), kind.end(), kind.begin(),
+                 [](char c) { return 'a' <= c && c <= 'z' ? static_cast<char>(c - 32) : c; });
+  return start + "a record" + (kind.empty() ? "" : ", read as " + kind) + ".\n";
+}
+
+/// A line for each note of a kind.
+std::string linesOf(std::vector<QVNote> const& notes, QVNoteKind kind, char const* start,
+                    char const* end) {
+  std::string lines;
+  for (auto const& note : notes) {
+    if (note.kind == kind) {
+      lines.append(start).append(escaped(note.text)).append(end);
+    }
+  }
+  return lines;
+}
+
+/// A line for each reason for which fields are absent.
+std::string absencesOf(std::vector<QVNote> const& notes) {
+  std::vector<std::pair<std::string, std::string>> namesByText;
+  for (auto const& note : notes) {
+    if (note.kind != QVNoteKind::Absence) {
+      continue;
+    }
+    auto const known = std::find_if(namesByText.begin(), namesByText.end(),
+                                    [&note](auto const& row) { return row.first == note.text; });
+    if (known == namesByText.end()) {
+      namesByText.emplace_back(note.text, note.field);
+    } else {
+      known->second.append(", ").append(note.field);
+    }
+  }
+  std::string lines;
+  for (auto const& [text, names] : namesByText) {
+    lines.append("  absent: ").append(names).append(": ").append(escaped(text)).append("\n");
+  }
+  return lines;
+}
+
+}  // namespace
+
+std::string explanationOf(Outcome const& outcome) {
+  std::string text =
+      verdictOf(outcome) + linesOf(outcome.notes, QVNoteKind::Step, "  read: ", "\n");
+  if (outcome.furtherSteps != 0) {
+    text += "  read: " + std::to_string(outcome.furtherSteps) + " more\n";
+  }
+  return text + linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n") +
+         absencesOf(outcome.notes);
+}
+
+}  // namespace app

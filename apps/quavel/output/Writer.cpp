@@ -1,0 +1,122 @@
+#include "output/Writer.h"
+
+#include <algorithm>
+#include <exception>
+
+#include "output/Forms.h"
+#include "photo/Reasons.h"
+
+namespace app {
+
+namespace {
+
+bool isAbsent(Value const& value) { return std::holds_alternative<std::monostate>(value); }
+
+/// Shows each file by a text of its own, with `start` before the first one and `separator` before
+/// the others.
+class TextWriter : public Writer {
+ public:
+  TextWriter(Output& output, TextOf textOf, std::string start, std::string separator)
+      : output_(output),
+        textOf_(std::move(textOf)),
+        start_(std::move(start)),
+        separator_(std::move(separator)) {}
+
+  void prepare(Outcome& outcome) const override {
+    outcome.text = textOf_(outcome);
+    outcome.record.reset();
+    outcome.notes.clear();
+  }
+  void add(Outcome&& outcome) override {
+    if (!outcome.text.empty()) {
+      output_.add(outcome.text.insert(0, start_));
+      start_ = separator_;
+    }
+  }
+  void end() override { output_.finish(); }
+
+ private:
+  Output& output_;
+  TextOf textOf_;
+  std::string start_;
+  std::string separator_;
+};
+
+/// Keeps all outcomes and hands them to another writer in the order of a field.
+class SortingWriter : public Writer {
+ public:
+  SortingWriter(Field const& field, std::unique_ptr<Writer> next)
+      : field_(field), next_(std::move(next)) {}
+
+  void prepare(Outcome&) const override {}
+  void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
+  void end() override;
+
+ private:
+  Field const& field_;
+  std::unique_ptr<Writer> next_;
+  std::vector<Outcome> outcomes_;
+};
+
+void SortingWriter::end() {
+  auto const value = field_.value;
+  std::stable_sort(outcomes_.begin(), outcomes_.end(), [value](Outcome const& a, Outcome const& b) {
+    Value const left = value(a);
+    Value const right = value(b);
+    if (isAbsent(left) || isAbsent(right)) {
+      return !isAbsent(left) && isAbsent(right);  // what has no value comes last
+    }
+    return left < right;
+  });
+  for (auto& outcome : outcomes_) {
+    next_->prepareSafely(outcome);
+    next_->add(std::move(outcome));
+    outcome = {};
+  }
+  next_->end();
+}
+
+std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
+  switch (form.kind) {
+    case FormKind::Json:
+      output.enclose("[", "\n]\n");
+      return std::make_unique<TextWriter>(output, jsonObjects(form), "\n", ",\n");
+    case FormKind::Jsonl:
+      return std::make_unique<TextWriter>(output, jsonObjects(form), "", "");
+    case FormKind::Csv:
+      output.add(csvHeader(form));
+      return std::make_unique<TextWriter>(output, csvRows(form), "", "");
+    case FormKind::Card:
+      return std::make_unique<TextWriter>(
+          output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
+    default:
+      return std::make_unique<TextWriter>(output, explanationOf, "", "\n");
+  }
+}
+
+}  // namespace
+
+Writer::~Writer() = default;
+
+void Writer::prepareSafely(Outcome& outcome) const {
+  try {
+    prepare(outcome);
+  } catch (std::exception const& error) {
+    Outcome failed;
+    failed.path = std::move(outcome.path);
+    failed.problem = reason::failure(error);
+    outcome = std::move(failed);
+    prepare(outcome);
+  }
+}
+
+std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
+  bool const isTable = form.kind == FormKind::Automatic && !form.hasNotes;
+  auto writer = isTable ? makeTable(form, output) : makeText(form, output);
+  if (form.sort == nullptr) {
+    return writer;
+  }
+  return std::make_unique<SortingWriter>(*form.sort, std::move(writer));
+}
+
+}  // namespace app

@@ -1,0 +1,44 @@
+#ifndef QUAVEL_APPS_FIELD_H
+#define QUAVEL_APPS_FIELD_H
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+#include "photo/Outcome.h"
+
+namespace app {
+
+/// An exact value; the first alternative is absence. Texts are UTF-8.
+using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
+
+/// Something that can be told of a file.
+struct Field {
+  std::string_view name;  ///< As --fields and the machine forms call it.
+  char const* label;      ///< As the card and the table call it.
+  Value (*value)(Outcome const&);
+  std::string (*words)(Value const&);  ///< Of a value that is not absent.
+};
+
+using Fields = std::vector<Field const*>;
+
+/// All fields: path, captureDate, the record's members in their order, then error, reason,
+/// position and pathBytes.
+std::vector<Field> const& allFields();
+/// Null when there is no such field.
+Field const* fieldNamed(std::string_view name);
+/// The fields of a file that gave a record: those up to error.
+Fields recordFields();
+
+/// The field for people: in words, on one line, safe for a terminal and at most 200 cells long
+/// (a path is never cut). Empty when absent.
+std::string inWords(Field const& field, Outcome const& outcome);
+
+/// Digits that read back to the same float.
+std::string exact(float value);
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_FIELD_H

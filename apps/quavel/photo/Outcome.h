@@ -1,0 +1,43 @@
+#ifndef QUAVEL_APPS_OUTCOME_H
+#define QUAVEL_APPS_OUTCOME_H
+
+#include <quavel/QVJournal.h>
+#include <quavel/QVMetadata.h>
+
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace app {
+
+/// Why a file gives no record.
+struct Problem {
+  explicit operator bool() const { return !reason.empty(); }
+
+  std::string reason;          ///< For programs: the name of a QVReason, or a code of Reasons.h.
+  std::string text;            ///< For the photo's owner, as what follows "path: " in a message.
+  std::int64_t position = -1;  ///< In the file; -1: of no place in particular.
+};
+
+/// One file to read.
+struct Input {
+  std::string path;
+  bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
+  Problem problem;       ///< Why it cannot even be tried, if so.
+};
+
+/// What became of one file.
+struct Outcome {
+  std::string path;
+  std::shared_ptr<quavel::QVMetadata> record;  ///< Null when there is none, or no more needed.
+  Problem problem;                             ///< When there is no record.
+  std::vector<quavel::QVNote> notes;           ///< When they are wanted.
+  std::uint64_t furtherSteps = 0;              ///< Those that the notes leave out.
+  std::string text;                            ///< As the chosen form shows it, once prepared.
+  std::vector<std::string> cells;              ///< The same for the table.
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_OUTCOME_H

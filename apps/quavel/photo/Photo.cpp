@@ -1,0 +1,141 @@
+#include "photo/Photo.h"
+
+#include <quavel/QVReader.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <exception>
+#include <set>
+#include <utility>
+
+#include "photo/Reasons.h"
+
+namespace app {
+
+namespace {
+
+using quavel::QVJournal;
+
+constexpr std::size_t kLargestInput = std::size_t{1} << 30;
+
+Problem irregular(mode_t mode) {
+  if (S_ISDIR(mode)) {
+    return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
+  }
+  char const* const kind = S_ISFIFO(mode) ? "FIFO" : S_ISSOCK(mode) ? "socket" : "device";
+  return {reason::kSpecialFile,
+          std::string("a ") + kind + ", not a regular file; give a photo, or use --stdin"};
+}
+
+/// Why the library is not to be given the path, if so.
+Problem whyUnfit(Input const& input) {
+  struct stat status = {};
+  if (input.problem || input.isPhoto) {
+    return input.problem;
+  }
+  if (::stat(input.path.c_str(), &status) == -1) {
+    return reason::cannotOpen(errno);
+  }
+  return S_ISREG(status.st_mode) ? Problem() : irregular(status.st_mode);
+}
+
+/// All bytes of standard input, or the problem.
+std::string readAll(Problem& problem) {
+  constexpr std::size_t kStep = std::size_t{1} << 16;
+  std::string bytes;
+  while (bytes.size() <= kLargestInput) {
+    std::size_t const size = bytes.size();
+    bytes.resize(size + kStep);
+    ssize_t const count = ::read(STDIN_FILENO, &bytes[size], kStep);
+    bytes.resize(size + (count > 0 ? static_cast<std::size_t>(count) : 0));
+    if (count == 0) {
+      return bytes;
+    }
+    if (count == -1 && errno != EINTR) {
+      problem = reason::cannotRead(errno);
+      return bytes;
+    }
+  }
+  problem = {reason::kTooLong, "longer than 1 GiB; give the file's path instead"};
+  return bytes;
+}
+
+/// Fills the outcome with what `read` gives, unless there is a problem already.
+template <class Read>
+void fill(Outcome& outcome, Detail detail, Read read) {
+  if (outcome.problem) {
+    return;
+  }
+  QVJournal journal(detail);
+  outcome.record = read(journal);
+  if (auto const* const refusal = journal.refusal()) {
+    outcome.problem = reason::refusal(*refusal);
+  }
+  if (detail == Detail::All) {
+    outcome.notes = journal.notes();
+    outcome.furtherSteps = journal.furtherSteps();
+  }
+}
+
+}  // namespace
+
+std::string extensionOf(std::string_view path) {
+  auto const dot = path.rfind('.');
+  std::string extension(dot == std::string_view::npos ? "" : path.substr(dot + 1));
+  std::transform(extension.begin(), extension.end(), extension.begin(),
+                 [](char c) { return 'A' <= c && c <= 'Z' ? static_cast<char>(c + 32) : c; });
+  return extension;
+}
+
+bool isPhotoExtension(std::string const& extension) {
+  static quavel::QVReader const library("");
+  // The library answers with a record, which costs too much for each name of a large folder.
+  thread_local std::set<std::string> known;
+  if (known.count(extension) != 0) {
+    return true;
+  }
+  bool const isKnown = library.createMetadata(extension) != nullptr;
+  if (isKnown) {
+    known.insert(extension);
+  }
+  return isKnown;
+}
+
+std::string whyUnknown(std::string const& extension) {
+  if (isPhotoExtension(extension)) {
+    return {};
+  }
+  QVJournal journal(Detail::Refusals);
+  journal.read(nullptr, 0, extension);
+  return journal.refusal()->text;
+}
+
+Outcome readPhoto(Input input, Detail detail) {
+  Outcome outcome;
+  outcome.problem = whyUnfit(input);
+  outcome.path = std::move(input.path);
+  try {
+    fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });
+  } catch (std::exception const& error) {
+    outcome.problem = reason::failure(error);
+  }
+  return outcome;
+}
+
+Outcome readStandardInput(std::string const& extension, Detail detail) {
+  Outcome outcome;
+  outcome.path = "-";
+  try {
+    std::string bytes = readAll(outcome.problem);
+    auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
+    fill(outcome, detail,
+         [&](QVJournal& journal) { return journal.read(buffer, bytes.size(), extension); });
+  } catch (std::exception const& error) {
+    outcome.problem = reason::failure(error);
+  }
+  return outcome;
+}
+
+}  // namespace app

@@ -1,0 +1,31 @@
+#ifndef QUAVEL_APPS_PHOTO_H
+#define QUAVEL_APPS_PHOTO_H
+
+#include <quavel/QVJournal.h>
+
+#include <string>
+#include <string_view>
+
+#include "photo/Outcome.h"
+
+namespace app {
+
+using Detail = quavel::QVJournal::Detail;
+
+/// What follows the last ".", in lower case; empty when there is no ".".
+std::string extensionOf(std::string_view path);
+/// Whether an extension in lower case names a format.
+bool isPhotoExtension(std::string const& extension);
+/// Why an extension names none; empty when it does.
+std::string whyUnknown(std::string const& extension);
+
+/// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
+/// The outcome holds notes when all of them are wanted.
+Outcome readPhoto(Input input, Detail detail);
+
+/// Reads one image from standard input, under the path "-".
+Outcome readStandardInput(std::string const& extension, Detail detail);
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_PHOTO_H

@@ -1,0 +1,84 @@
+#include "photo/Reasons.h"
+
+#include <cerrno>
+#include <new>
+#include <system_error>
+
+namespace app::reason {
+
+namespace {
+
+using quavel::QVJournal;
+using quavel::QVReason;
+
+/// What the owner can do about a system's error.
+char const* advice(int error) {
+  switch (error) {
+    case ENOENT:
+    case ENOTDIR:
+      return "; check the name";
+    case EACCES:
+    case EPERM:
+      return "; check its permissions and those of its folders";
+    case EMFILE:
+    case ENFILE:
+      return "; try fewer --jobs";
+    case EIO:
+      return "; check the disk";
+    default:
+      return "";
+  }
+}
+
+/// What a reason means, before the facts. Those that say it themselves have none.
+char const* leadOf(QVReason reason) {
+  switch (reason) {
+    case QVReason::ReadError:
+      return "cannot be read: ";
+    case QVReason::CutShort:
+      return "cut short: ";
+    case QVReason::OtherKind:
+      return "another kind of file, or damaged: ";
+    case QVReason::MalformedEntry:
+    case QVReason::MalformedBox:
+      return "damaged or badly written: ";
+    case QVReason::MissingPart:
+      return "a part is missing: ";
+    case QVReason::WrongImage:
+      return "of a layout that is not read: ";
+    case QVReason::TooManyValues:
+    case QVReason::TooMuchWork:
+      return "beyond what is read of one file: ";
+    default:
+      return "";
+  }
+}
+
+}  // namespace
+
+std::string systemText(int error) { return std::generic_category().message(error); }
+
+Problem cannotOpen(int error) {
+  return {QVJournal::reasonName(QVReason::CannotOpen),
+          "the file cannot be opened: " + systemText(error) + advice(error)};
+}
+
+Problem cannotRead(int error) {
+  return {QVJournal::reasonName(QVReason::ReadError),
+          "cannot be read: " + systemText(error) + advice(error)};
+}
+
+Problem failure(std::exception const& error) {
+  if (dynamic_cast<std::bad_alloc const*>(&error) != nullptr) {
+    return {kOutOfMemory, "not enough memory for it"};
+  }
+  return {kUnexpected, std::string("unexpected: ") + error.what()};
+}
+
+Problem refusal(quavel::QVNote const& note) {
+  char const* const end =
+      note.reason == QVReason::Empty ? "; copy it anew from its source" : advice(note.systemError);
+  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + end, note.position};
+}
+
+}  // namespace app::reason

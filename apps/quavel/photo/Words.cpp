@@ -1,0 +1,121 @@
+#include "photo/Words.h"
+
+#include <cmath>
+#include <cstddef>
+#include <cstdio>
+
+namespace app::words {
+
+namespace {
+
+/// The number with up to `digits` decimals, without trailing zeros.
+std::string decimal(float value, int digits) {
+  if (std::isinf(value)) {
+    return value < 0 ? "-∞" : "∞";
+  }
+  if (!(std::fabs(value) < 1e7F)) {
+    char text[32];
+    std::snprintf(text, sizeof text, "%g", static_cast<double>(value));
+    return text;
+  }
+  char text[32];
+  std::snprintf(text, sizeof text, "%.*f", digits, static_cast<double>(value));
+  std::string result = text;
+  if (result.find('.') != std::string::npos) {
+    result.erase(result.find_last_not_of('0') + 1);
+    result.erase(result.find_last_not_of('.') + 1);
+  }
+  return result == "-0" ? "0" : result;
+}
+
+template <std::size_t count>
+std::string named(char const* const (&names)[count], std::int32_t value) {
+  if (value < 0 || static_cast<std::size_t>(value) >= count) {
+    return "not standard (" + std::to_string(value) + ")";
+  }
+  return names[value];
+}
+
+void append(std::string& text, std::string const& part) {
+  if (!text.empty() && !part.empty()) {
+    text += ' ';
+  }
+  text += part;
+}
+
+}  // namespace
+
+std::string yesNo(bool value) { return value ? "yes" : "no"; }
+
+std::string date(std::string const& value) {
+  std::string result = value;
+  if (value.size() >= 10 && value[4] == ':' && value[7] == ':' &&
+      value.find_first_not_of("0123456789: ") == std::string::npos) {
+    result[4] = '-';
+    result[7] = '-';
+  }
+  return result;
+}
+
+std::string orientation(std::int32_t value) {
+  static constexpr char const* kNames[] = {"upright",         "mirrored",         "turn 180",
+                                           "mirrored, 180",   "mirrored, 270 CW", "turn 90 CW",
+                                           "mirrored, 90 CW", "turn 270 CW"};
+  return value == 0 ? "not standard (0)" : named(kNames, value - 1);
+}
+
+std::string meteringMode(std::int32_t value) {
+  static constexpr char const* kNames[] = {
+      "unknown", "average", "center-weighted average", "spot", "multi-spot", "pattern", "partial"};
+  return value == 255 ? "other" : named(kNames, value);
+}
+
+std::string whiteBalance(std::int32_t value) {
+  static constexpr char const* kNames[] = {"automatic", "manual"};
+  return named(kNames, value);
+}
+
+std::string exposureTime(float seconds) {
+  // Cameras show the fraction up to 1/4 s and decimals from 0.3 s on.
+  if (seconds > 1e-6F && seconds < 0.26F) {
+    return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";
+  }
+  return decimal(seconds, seconds < 0.1F ? 9 : 1) + " s";
+}
+
+std::string fNumber(float value) { return "f/" + decimal(value, value < 1 ? 2 : 1); }
+
+std::string apex(float value) { return decimal(value, 2) + " APEX"; }
+
+std::string exposureBias(float value) { return (value > 0 ? "+" : "") + decimal(value, 2) + " EV"; }
+
+std::string focalLength(float millimetres) { return decimal(millimetres, 1) + " mm"; }
+
+std::string size(quavel::QVMetadata const& record) {
+  if (record.width == -1 && record.height == -1) {
+    return {};
+  }
+  auto const side = [](std::int32_t value) {
+    return value == -1 ? std::string("?") : std::to_string(value);
+  };
+  return side(record.width) + "x" + side(record.height);
+}
+
+std::string exposure(quavel::QVMetadata const& record) {
+  std::string text;
+  if (!std::isnan(record.exposureTime)) {
+    append(text, exposureTime(record.exposureTime));
+  }
+  if (!std::isnan(record.fNumber)) {
+    append(text, fNumber(record.fNumber));
+  }
+  if (record.iso != -1) {
+    append(text, "ISO " + std::to_string(record.iso));
+  }
+  if (!std::isnan(record.focalLength)) {
+    append(text, focalLength(record.focalLength));
+  }
+  return text;
+}
+
+}  // namespace app::words
