@@ -86,7 +86,9 @@ class QUAVEL_EXPORT QVStream {
   struct CurrentReading {
     CurrentReading() = default;
     CurrentReading(CurrentReading const& /*other*/) {}
-    CurrentReading& operator=(CurrentReading const& /*other*/) { return *this; }
+    CurrentReading& operator=(CurrentReading const& /*other*/) {  // NOLINT(*-self-assignment)
+      return *this;
+    }
 
     detail::Reading* current = nullptr;
   };

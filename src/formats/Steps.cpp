@@ -2,9 +2,7 @@
 
 #include "quavel/QVMetadata.h"
 #include "quavel/QVStream.h"
-#include "quavel/QVTiffHeader.h"
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
-#include "tiff/HeaderStep.h"
 #include "tiff/Tags.h"
 
 namespace quavel::detail {

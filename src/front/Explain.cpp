@@ -57,7 +57,7 @@ constexpr FieldRow kFields[] = {
 QVNote absence(FieldRow const& row, Format const& format, Journal const& journal) {
   QVNote note = {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, "", 0};
   if ((row.families & format.family) == 0) {
-    note.text = row.families == kCr3 ? "only CR3 files give it"
+    note.text = row.families == kCr3 ? "given by CR3 files only"
                                      : composed("never taken from {} files", {format.kind});
     return note;
   }

@@ -6,6 +6,8 @@
 #include <system_error>
 #include <utility>
 
+#include "journal/Reading.h"
+
 namespace quavel::detail {
 
 namespace {
@@ -98,6 +100,24 @@ QVNote const* Journal::absenceOf(char const* field) const {
   auto const found = std::find_if(absences_.begin(), absences_.end(),
                                   [field](QVNote const& note) { return note.field == field; });
   return found == absences_.end() ? nullptr : &*found;
+}
+
+void noteReadError(QVStream const& stream, int error) {
+  if (Journal* const journal = journalOf(stream)) {
+    journal->systemError = error;
+  }
+}
+
+bool Reading::refuseWork(Work work) const {
+  static constexpr char const* kNames[] = {
+      "open more than {} directories", "walk over more than {} directory entries",
+      "take more than {} values of directory entries", "step over more than {} segments or boxes"};
+  auto const index = static_cast<std::size_t>(work);
+  auto const bound = static_cast<std::int64_t>(kMaxWork[index]);
+  return journal != nullptr
+             ? refuse(journal, QVReason::TooMuchWork, -1, "the file makes the reader {}",
+                      composed(kNames[index], {bound}))
+             : false;
 }
 
 }  // namespace quavel::detail

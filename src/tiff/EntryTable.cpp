@@ -4,9 +4,10 @@
 
 #include "journal/Journal.h"
 #include "journal/Reading.h"
+#include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "stream/Bytes.h"
 #include "tiff/EntryWalk.h"
-#include "tiff/HostEntry.h"
+#include "tiff/ReaderDirectory.h"
 
 namespace quavel::detail {
 
@@ -90,9 +91,9 @@ bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIF
     return false;
   }
   if (!stream.readLong(nextIFDOffset)) {
-    return refuseCut(journal_, position_ + kEntryCountSize + kEntrySize * entryCount_,
+    return refuseCut(journal_, position_ + kEntryCountSize + std::int64_t{kEntrySize} * entryCount_,
                      sizeof(*nextIFDOffset),
-                     "the offset of the next directory, behind the {} entries of {}", entryCount_,
+                     "the offset of the next directory, after the {} entries of {}", entryCount_,
                      PlacedDirectory{*this});
   }
   notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{*this},
@@ -126,6 +127,14 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
                 "{}: its {} would begin at {} and end at {}, but {}", PlacedEntry{*this, row},
                 TypedCount{row.count, row.typeCode}, Offset{begin}, Offset{end},
                 journal_->cutText(end));
+}
+
+Entry findEntry(Directory const& directory, unsigned short tag) {
+  if (auto const* const own = ReaderDirectory::of(*directory)) {
+    return own->table.entry(tag);
+  }
+  auto const entry = directory->entryForTag(tag);
+  return entry ? Entry(*entry) : Entry();
 }
 
 void append(std::string& out, PlacedDirectory directory) {

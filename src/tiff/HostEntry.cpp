@@ -1,4 +1,3 @@
-#include "tiff/HostEntry.h"
 
 #include <cstring>
 #include <utility>

@@ -3,8 +3,7 @@
 #include "journal/Journal.h"
 #include "journal/Reading.h"
 #include "stream/Bytes.h"
-#include "tiff/HeaderStep.h"
-#include "tiff/TiffWords.h"
+#include "tiff/ReaderDirectory.h"
 
 namespace quavel {
 

@@ -5,9 +5,7 @@
 
 #include "quavel/QVStream.h"
 #include "stream/Bytes.h"
-#include "tiff/Entry.h"
-#include "tiff/HostEntry.h"
-#include "tiff/RawEntry.h"
+#include "tiff/EntryTable.h"
 
 namespace quavel {
 

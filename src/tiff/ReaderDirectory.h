@@ -3,6 +3,7 @@
 
 #include <memory>
 
+#include "quavel/QVTiffHeader.h"
 #include "quavel/QVTiffImageFileDirectory.h"
 #include "tiff/Entry.h"
 #include "tiff/EntryTable.h"
@@ -31,6 +32,11 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
 
   EntryTable table;
 };
+
+/// `QVTiffHeader::read` for the header of a structure that notes call "the Exif segment", say; null
+/// for that of a whole file.
+bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
+                    QVTiffHeader& header);
 
 /// The entry kept for the tag, or none.
 Entry findEntry(Directory const& directory, unsigned short tag);

@@ -70,7 +70,7 @@ REFUSED = [
      "TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF"),
     ("dng", KIND, b"PK\3\4" + bytes(12), "TIFF header at 0 begins with 50 4b, not with 49 49"),
     ("cr2", CUT, b"II*\0\x08\0", "TIFF header at 0: 4 bytes wanted at 4, but the file ends at 6"),
-    ("tif", CUT, tiff(number(WIDTH, 1))[:-4], "offset of the next directory, behind the 1 entries "
+    ("tif", CUT, tiff(number(WIDTH, 1))[:-4], "offset of the next directory, after the 1 entries "
      "of IFD0 at 8: 4 bytes wanted at 0x16 (22), but the file ends at 0x16 (22)"),
     ("tif", CUT, tiff(number(1, 1), number(2, 2))[:23], "entry 2 of 2 of IFD0 at 8: 2 bytes wanted "
      "at 0x16 (22), but"),
@@ -153,7 +153,7 @@ SAMPLE_REASONS = {
     "nef-03.nef": "entry 11 of 28 of IFD0 at 8",
     "raf-01.raf": "the TIFF header of the raw section",
     "raf-02.raf": "the TIFF header of the raw section",
-    "tif-01.tif": "the offset of the next directory, behind the 15 entries of IFD0",
+    "tif-01.tif": "the offset of the next directory, after the 15 entries of IFD0",
     "tif-04.tif": "magic 43, not 42",
     "tiff-02.tiff": "magic 43, not 42",
 }
