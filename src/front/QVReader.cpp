@@ -10,14 +10,13 @@
 #include "quavel/QVCR2Image.h"
 #include "quavel/QVCR3Image.h"
 #include "quavel/QVDNGImage.h"
-#include "quavel/QVFStream.h"
 #include "quavel/QVJPEGImage.h"
 #include "quavel/QVMStream.h"
 #include "quavel/QVNRWImage.h"
 #include "quavel/QVNefImage.h"
 #include "quavel/QVRafImage.h"
 #include "quavel/QVTiffImage.h"
-#include "stream/ReadAheadStream.h"
+#include "stream/PositionedFile.h"
 
 namespace quavel {
 
@@ -63,9 +62,7 @@ std::shared_ptr<QVMetadata> readRecord(QVReader const& reader, std::string const
 QVReader::QVReader(std::string const& path) {
   std::string extension = getPathExtension(path);
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
-  auto file = std::make_shared<QVFStream>(path);
-  metadata =
-      readRecord(*this, extension, std::make_shared<detail::ReadAheadStream>(std::move(file)));
+  metadata = readRecord(*this, extension, detail::openReadAhead(path));
 }
 
 QVReader::QVReader(unsigned char* buffer, unsigned long const& length,
