@@ -216,7 +216,9 @@ TEST(ReadAheadStream, AnswersFromItsBlockAndMovesByOneSeekAndOneRead) {
   expectAt(32767, 2, 1);  // what goes on is fetched in blocks as long as the first
   expectAt(50000, 3, 2);
   expectAt(54095, 3, 2);
-  expectAt(10, 4, 3);
+  expectAt(10, 3, 2);  // the first block is kept
+  expectAt(20000, 4, 3);
+  expectAt(50000, 5, 4);
 
   Bytes whole(bytes.size(), '\1');
   stream.setOffset(0);

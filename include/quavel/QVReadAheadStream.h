@@ -11,13 +11,14 @@
 namespace quavel {
 
 /// Another stream, read a block at a time, for a source that pays for each request: the many small
-/// reads of a reader are served from the block that was fetched last. Ends and seeks as a file
-/// does: a seek past the end succeeds, one before the start is refused.
+/// reads of a reader are served from the first block, which is kept, and from the one fetched last.
+/// Ends and seeks as a file does: a seek past the end succeeds, one before the start is refused.
 class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
  public:
   /// Position 0 is the source's offset 0. The source must be able to seek, and is used by nobody
   /// else from then on. Its first block is `firstBlockSize` bytes long, each later one
-  /// `nextBlockSize`; 0 is taken for 1. Keeps the larger of the two in memory.
+  /// `nextBlockSize`, or as long as the longer of the two where it goes on from the block before;
+  /// 0 is taken for 1. Needs memory for two of the longer.
   QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                     std::size_t nextBlockSize);
   ~QVReadAheadStream() override;
@@ -32,20 +33,26 @@ class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
   void setOffset(long const& offset) override;
 
  private:
-  std::size_t copyFromBlock(std::uint8_t* destination, std::size_t count);
-  void fetchBlock(std::size_t needed);
-  std::int64_t readSource(std::size_t count);
+  struct Block {
+    std::unique_ptr<std::uint8_t[]> bytes;  // null until it is needed
+    std::int64_t start = 0;                 // absolute, as all positions here
+    std::size_t size = 0;                   // bytes that are there
+  };
+
+  std::size_t copyFrom(Block const& block, std::uint8_t* destination, std::size_t count);
+  std::size_t copyFetched(std::uint8_t* destination, std::size_t count);
+  void fetch(Block& block, std::size_t wanted, std::size_t needed);
+  void fetchNext(std::size_t needed);
+  std::int64_t readSource(Block const& block, std::size_t count);
   bool sourceAccepts(std::int64_t target);
 
   std::shared_ptr<QVStream> source_;
-  std::size_t nextSize_;                   // bytes to ask for: the first block's, then the others'
-  std::size_t laterSize_;                  //
-  std::size_t capacity_;                   // of `block_`
-  std::unique_ptr<std::uint8_t[]> block_;  // not initialised
-  std::int64_t position_ = 0;              // absolute, as all positions here
-  std::int64_t sourcePosition_ = -1;       // where the source stands; -1: not known
-  std::int64_t blockStart_ = 0;
-  std::size_t blockSize_ = 0;  // bytes that are there
+  std::size_t firstSize_;
+  std::size_t nextSize_;
+  std::int64_t position_ = 0;
+  std::int64_t sourcePosition_ = -1;  // where the source stands; -1: not known
+  Block first_;
+  Block last_;
 };
 
 }  // namespace quavel

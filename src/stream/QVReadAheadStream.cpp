@@ -12,18 +12,16 @@ namespace quavel {
 QVReadAheadStream::QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                                      std::size_t nextBlockSize)
     : source_(std::move(source)),
-      nextSize_(std::max<std::size_t>(firstBlockSize, 1)),
-      laterSize_(std::max<std::size_t>(nextBlockSize, 1)),
-      capacity_(std::max(nextSize_, laterSize_)),
-      block_(new std::uint8_t[capacity_]) {}
+      firstSize_(std::max<std::size_t>(firstBlockSize, 1)),
+      nextSize_(std::max<std::size_t>(nextBlockSize, 1)) {}
 
 QVReadAheadStream::~QVReadAheadStream() = default;
 
 std::int64_t QVReadAheadStream::readBuffer(std::uint8_t* destination, std::size_t count) {
-  std::size_t delivered = copyFromBlock(destination, count);
+  std::size_t delivered = copyFetched(destination, count);
   while (delivered < count) {
-    fetchBlock(count - delivered);
-    std::size_t const copied = copyFromBlock(destination + delivered, count - delivered);
+    fetchNext(count - delivered);
+    std::size_t const copied = copyFetched(destination + delivered, count - delivered);
     if (copied == 0) {
       break;
     }
@@ -53,37 +51,53 @@ bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
   return sourcePosition_ == target;
 }
 
-std::size_t QVReadAheadStream::copyFromBlock(std::uint8_t* destination, std::size_t count) {
-  auto const skipped = static_cast<std::uint64_t>(position_ - blockStart_);
-  if (position_ < blockStart_ || skipped >= blockSize_) {
+std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_t count) {
+  std::size_t const copied = copyFrom(first_, destination, count);
+  return copied != 0 ? copied : copyFrom(last_, destination, count);
+}
+
+std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destination,
+                                        std::size_t count) {
+  auto const skipped = static_cast<std::uint64_t>(position_ - block.start);
+  if (position_ < block.start || skipped >= block.size) {
     return 0;
   }
-  std::size_t const copied = std::min(count, blockSize_ - skipped);
-  detail::copyBytes(destination, block_.get() + skipped, copied);
+  std::size_t const copied = std::min(count, block.size - skipped);
+  detail::copyBytes(destination, block.bytes.get() + skipped, copied);
   position_ += static_cast<std::int64_t>(copied);
   return copied;
 }
 
-void QVReadAheadStream::fetchBlock(std::size_t needed) {
-  // Data that goes on where the last block ended is likely to go on further.
-  bool const isContinued = blockSize_ > 0 && sourcePosition_ == position_;
-  std::size_t const wanted = isContinued ? capacity_ : nextSize_;
-  nextSize_ = laterSize_;
-  blockSize_ = 0;  // whatever happens from here on, what was there is overwritten
-  std::int64_t delivered = readSource(wanted);
-  if (delivered < 0) {
-    // What is broken may lie beyond the bytes that are needed.
-    delivered = readSource(std::min(needed, capacity_));
+void QVReadAheadStream::fetchNext(std::size_t needed) {
+  if (!first_.bytes) {
+    first_.bytes.reset(new std::uint8_t[firstSize_]);
+    fetch(first_, firstSize_, needed);
+    return;
   }
-  blockStart_ = position_;
-  blockSize_ = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));
+  std::size_t const longest = std::max(firstSize_, nextSize_);
+  if (!last_.bytes) {
+    last_.bytes.reset(new std::uint8_t[longest]);
+  }
+  // Data that goes on where the source stands is likely to go on further.
+  fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
 }
 
-std::int64_t QVReadAheadStream::readSource(std::size_t count) {
+void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
+  block.size = 0;  // whatever happens from here on, what was there is overwritten
+  std::int64_t delivered = readSource(block, wanted);
+  if (delivered < 0) {
+    // What is broken may lie beyond the bytes that are needed.
+    delivered = readSource(block, std::min(needed, wanted));
+  }
+  block.start = position_;
+  block.size = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));
+}
+
+std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
   if (std::exchange(sourcePosition_, -1) != position_) {
     source_->setOffset(static_cast<long>(position_));
   }
-  std::int64_t const delivered = source_->readBuffer(block_.get(), count);
+  std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
   // A count beyond what was asked for is not one; nor is a position beyond the last there can be.
   if (delivered < 0 || static_cast<std::uint64_t>(delivered) > count ||
       delivered > std::numeric_limits<std::int64_t>::max() - position_) {
