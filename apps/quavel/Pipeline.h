@@ -1,6 +1,7 @@
 #ifndef QUAVEL_APPS_PIPELINE_H
 #define QUAVEL_APPS_PIPELINE_H
 
+#include <atomic>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -25,7 +26,9 @@ struct Batch {
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-/// Works on batches on some threads and hands them back in the order they came in.
+/// Works on batches on some threads and hands them back in the order they came in. As many threads
+/// as processors do while the files are cached. Once the work waits for the disk, there are as many
+/// as jobs, so that the disk never waits for the work.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
@@ -46,11 +49,14 @@ class Pipeline {
   bool isOldestDone();
 
  private:
-  void start();
-  void workOn(Batch& batch) const;
+  std::size_t limit() const;
+  void startThread();
+  void workOn(Batch& batch);
   void runThread();
 
   unsigned jobs_;
+  unsigned busyJobs_;  // while nothing has to wait
+  std::atomic<bool> isWaiting_;
   Work work_;
   std::vector<std::thread> threads_;
   std::deque<std::unique_ptr<Batch>> order_;  // of the caller's thread alone
