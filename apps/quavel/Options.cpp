@@ -12,8 +12,7 @@ namespace app {
 namespace {
 
 constexpr unsigned kMostJobs = 256;
-// Reading waits for the disk, so more than the processors pay off: on a cold disk 32 are several
-// times as fast as 2, more gain little, and none of them costs anything once the files are cached.
+// For files that are not cached: there 32 are several times as fast as 2, and more gain little.
 constexpr unsigned kUsualJobs = 32;
 
 constexpr char kFooter[] =
@@ -130,7 +129,7 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
       ->type_name("FIELD");
   command.add_option("--absent", texts.absent, "Absent values: skip or show (CSV always shows)")
       ->type_name("skip|show");
-  command.add_option("--jobs", options.jobs, "Files read at a time [32, or the processors]")
+  command.add_option("--jobs", options.jobs, "Most files read at a time [32, or the processors]")
       ->type_name("N")
       ->check(CLI::Range(1U, kMostJobs));
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
