@@ -107,8 +107,8 @@ void Pipeline::workOn(Batch& batch) {
     batch.failure = std::current_exception();
   }
   // Cached files are read without waiting. Others wait for the disk once each, or more often.
-  if (2 * (countWaits() - before) > static_cast<long>(batch.inputs.size())) {
-    isWaiting_ = true;
+  if (kTellsWaits) {
+    isWaiting_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }
 }
 

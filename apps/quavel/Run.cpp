@@ -18,7 +18,7 @@ namespace {
 
 constexpr std::size_t kLargestBatch = 64;
 // A batch is to be short enough for the output to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.02;
+constexpr double kLongBatch = 0.002;
 constexpr std::size_t kWideBatch = std::size_t{1} << 20;
 
 /// One run over the files of a source.
