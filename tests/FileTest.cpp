@@ -12,6 +12,7 @@
 #include <fstream>
 #include <functional>
 #include <thread>
+#include <utility>
 
 #include "support/Fixtures.h"
 
@@ -74,6 +75,16 @@ TEST_F(FileTest, IsReadInOneReadWithOneAdvice) {
   EXPECT_FALSE(QVReader("/nonexistent/photo.jpg").metadata);
   EXPECT_EQ(theSystem.reads, 0);
   EXPECT_TRUE(theSystem.advice.empty());
+}
+
+TEST_F(FileTest, TakesAnotherReadForWhatLiesBeyond16KB) {
+  for (auto const& [size, reads] : {std::pair{16000, 1}, {20000, 2}}) {
+    Bytes const bytes = "\xff\xd8" + segment(0xffe1, Bytes(size, 'x')) + sof0();
+    TemporaryFile const file(bytes, "jpg");
+    theSystem = {};
+    EXPECT_EQ(describePath(file), "width=4000 height=3000");
+    EXPECT_EQ(theSystem.reads, reads);
+  }
 }
 
 /// Read without any buffer; fails as the system does.

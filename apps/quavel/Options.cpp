@@ -129,7 +129,10 @@ void addChoices(CLI::App& command, Options& options, Texts& texts) {
       ->type_name("FIELD");
   command.add_option("--absent", texts.absent, "Absent values: skip or show (CSV always shows)")
       ->type_name("skip|show");
-  command.add_option("--jobs", options.jobs, "Most files read at a time [32, or the processors]")
+  command
+      .add_option_function<unsigned>(
+          "--jobs", [&options](unsigned jobs) { options.jobs = options.cachedJobs = jobs; },
+          "Files read at a time [the processors; 32 if cold]")
       ->type_name("N")
       ->check(CLI::Range(1U, kMostJobs));
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
@@ -188,7 +191,8 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.footer(kFooter);
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
-  options.jobs = std::clamp(std::thread::hardware_concurrency(), kUsualJobs, kMostJobs);
+  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, kMostJobs);
+  options.jobs = std::max(options.cachedJobs, kUsualJobs);
   addInputs(command, options);
   addForms(command, options.form);
   addChoices(command, options, texts);

@@ -26,7 +26,8 @@ struct Options {
   Fields fields;                   ///< Empty: those of the form.
   Field const* sort = nullptr;     ///< Null: the order of the input.
   std::optional<bool> showAbsent;  ///< Not set: as the form does.
-  unsigned jobs = 1;
+  unsigned jobs = 1;               ///< Files read at a time when reading waits for the disk.
+  unsigned cachedJobs = 1;         ///< When it does not; at most `jobs`.
   bool isQuiet = false;
 
   bool isMachineForm() const { return form != FormKind::Automatic && form != FormKind::Card; }

@@ -26,11 +26,8 @@ long countWaits() { return 0; }
 
 }  // namespace
 
-Pipeline::Pipeline(unsigned jobs, Work work)
-    : jobs_(jobs),
-      busyJobs_(std::clamp(std::thread::hardware_concurrency(), 1U, jobs)),
-      isWaiting_(!kTellsWaits),
-      work_(std::move(work)) {}
+Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
+    : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {}
 
 Pipeline::~Pipeline() {
   {

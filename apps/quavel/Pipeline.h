@@ -26,15 +26,15 @@ struct Batch {
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-/// Works on batches on some threads and hands them back in the order they came in. As many threads
-/// as processors do while the files are cached. Once the work waits for the disk, there are as many
-/// as jobs, so that the disk never waits for the work.
+/// Works on batches on some threads and hands them back in the order they came in. There are
+/// as many as `jobs` while the work waits for the disk, so that the disk never waits for the work,
+/// and as many as `busyJobs` while it keeps the processors busy.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
   /// With one job the work is done by the caller of `submit`.
-  Pipeline(unsigned jobs, Work work);
+  Pipeline(unsigned jobs, unsigned busyJobs, Work work);
   /// Drops what has not begun and waits for what has.
   ~Pipeline();
   Pipeline(Pipeline const&) = delete;
@@ -55,7 +55,7 @@ class Pipeline {
   void runThread();
 
   unsigned jobs_;
-  unsigned busyJobs_;  // while nothing has to wait
+  unsigned busyJobs_;
   std::atomic<bool> isWaiting_;
   Work work_;
   std::vector<std::thread> threads_;

@@ -54,7 +54,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       console_(console),
       writer_(makeWriter(options, output)),
       progress_(console, options),
-      pipeline_(options.jobs, [this](Batch& batch) { work(batch); }) {}
+      pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }) {}
 
 int Runner::run() {
   if (options_.fromStdin) {
