@@ -72,6 +72,8 @@ TEST_F(FileTest, IsReadInOneReadWithOneAdvice) {
     }
   }
   theSystem = {};
+  TemporaryFile const unknown("anything", "txt");
+  EXPECT_FALSE(QVReader(unknown.path).metadata);
   EXPECT_FALSE(QVReader("/nonexistent/photo.jpg").metadata);
   EXPECT_EQ(theSystem.reads, 0);
   EXPECT_TRUE(theSystem.advice.empty());

@@ -32,19 +32,17 @@ struct ReadAheadFile {
 
 }  // namespace
 
-PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {
+PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
+
+void PositionedFile::advise() {
 #ifdef POSIX_FADV_RANDOM
+  ++reads_;
   // Left to itself, a system fetches several times what is asked for at a file's start. One that
   // takes no advice does so still.
-  if (fd != -1) {
+  if (reads_ == 1) {
     ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM);
   }
-#endif
-}
-
-void PositionedFile::foresee() {
-#ifdef POSIX_FADV_WILLNEED
-  if (++reads_ == kReadsOfAWalk) {
+  if (reads_ == kReadsOfAWalk) {
     ::posix_fadvise(fd, static_cast<off_t>(position_), kForeseen, POSIX_FADV_WILLNEED);
   }
 #endif
@@ -54,7 +52,7 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
   if (fd == -1) {
     return 0;
   }
-  foresee();
+  advise();
   ssize_t delivered = ::pread(fd, destination, count, static_cast<off_t>(position_));
   if (delivered == -1 && errno == ESPIPE) {
     delivered = ::read(fd, destination, count);

@@ -23,7 +23,7 @@ class PositionedFile : public QVFStream {
   void setOffset(long const& offset) override;
 
  private:
-  void foresee();
+  void advise();
 
   std::int64_t position_ = 0;  // absolute
   int reads_ = 0;
