@@ -16,7 +16,7 @@ constexpr int kReadsOfAWalk = 16;
 constexpr off_t kForeseen = off_t{4} << 20;
 
 // The metadata of most files lies in the first block. What lies beyond is a directory here and a
-// segment there. docs/speed.md has the measurements behind both sizes.
+// segment there. docs/speed.md tells how both sizes were measured.
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
