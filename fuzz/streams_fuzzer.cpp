@@ -89,6 +89,13 @@ int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
     record = nullptr;
   }
   fuzz::require(fuzz::isSame(record, byPath.metadata), "a path is read as its file is");
+  auto const again = std::make_shared<QVFStream>(written.path);
+  std::shared_ptr<QVStream> ahead = std::make_shared<QVReadAheadStream>(again, size % 97, size % 7);
+  auto recordAhead = byPath.createMetadata(input.extension);
+  if (recordAhead && !recordAhead->read(ahead)) {
+    recordAhead = nullptr;
+  }
+  fuzz::require(fuzz::isSame(recordAhead, record), "blocks of any size change nothing");
   // Of the walks, that of boxes alone looks at the position it has sought.
   if (!file->hasLeft || input.extension != "cr3") {
     fuzz::require(fuzz::isSame(record, byMemory.metadata), "a file is read as its bytes are");

@@ -2,6 +2,8 @@
 #include <sys/stat.h>
 
 #include <algorithm>
+#include <cerrno>
+#include <stdexcept>
 
 #include "support/Edits.h"
 #include "support/JournalLaw.h"
@@ -17,14 +19,6 @@ std::string brokenLaw(Bytes bytes, std::string const& extension) {
   bool const isSame =
       describe(record) == describe(QVReader(data, bytes.size(), extension).metadata);
   return isSame ? test::brokenLaw(journal, record.get()) : "another record";
-}
-
-/// What `read` is refused for; a null text when it is not.
-QVNote refusalOf(Bytes bytes, std::string const& extension) {
-  QVJournal journal;
-  auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
-  journal.read(data, bytes.size(), extension);
-  return journal.refusal() == nullptr ? QVNote() : *journal.refusal();
 }
 
 TEST(Journal, KeepsItsLawOnPrefixesAndChangedBytes) {
@@ -64,63 +58,18 @@ TEST(Journal, SaysOfNoFieldThatAFormatGivesThatItNeverDoes) {
   }
 }
 
-struct Row {
-  std::string extension;
-  Bytes bytes;
-  QVReason reason;
-  std::int64_t position;
-  std::string text;  ///< The sentence, or its beginning.
-};
-
-TEST(Journal, StatesWhatItRefusesAndWhere) {
-  Directory shortNef = nef();
-  shortNef.set(longs(kLength, {106}));
-  Directory twoOrientations = plainTiff();
-  twoOrientations.set(shorts(kOrientation, {1, 1}));
-  Directory numberForDate = plainTiff();
-  numberForDate.set(longs(kDateTime, {7}));
-  Bytes const cmt1Box = box("CMT1", tiff(kMM, cmt1()));
-  Row const rows[] = {
-      {"tif", "", QVReason::Empty, -1, "the file is empty"},
-      {"tif", "II*", QVReason::CutShort, 2,
-       "the TIFF header at 0: 2 bytes wanted at 2, but the file ends at 3"},
-      {"tif", "PK\3\4....", QVReason::OtherKind, 0,
-       "the TIFF header at 0 begins with 50 4b, not with 49 49 (\"II\") or 4d 4d (\"MM\")"},
-      {"dng", Bytes("MM\0+", 4) + Bytes(4, '\0'), QVReason::OtherKind, 0,
-       "the TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF, which is not read"},
-      {"nef", tiff(kII, shortNef), QVReason::WrongImage, 8,
-       "IFD0 at 8 declares 160 x 106; a NEF's first directory must be 160 x 120"},
-      {"cr2", tiff(kII, twoOrientations), QVReason::MalformedEntry, -2, "0x0112 Orientation at "},
-      {"nrw", tiff(kMM, numberForDate), QVReason::MalformedEntry, -2, "0x0132 DateTime at "},
-      {"jpg", Bytes(4, '\0'), QVReason::OtherKind, 0,
-       "the file begins with 00 00, not with ff d8 (SOI)"},
-      {"raf", "FUJIFILN" + Bytes(200, '\0'), QVReason::OtherKind, 0,
-       "the file begins with 46 55 4a 49 46 49 4c 4e, not with \"FUJIFILM\""},
-      {"cr3", box("ftyp", "crx ") + Bytes("\0\0\0\7m\1ov", 8), QVReason::MalformedBox, 12,
-       "the m\\x01ov box at 0xc (12) before a moov box was met has size 7; at least its header's "
-       "8 bytes are wanted"},
-      {"cr3", box("moov", uuidBox(cmt1Box) + uuidBox("", Bytes(16, 'f'))), QVReason::MissingPart,
-       -2, "the last uuid box of the moov box at 0, the uuid box at "},
-      {"png", "x", QVReason::UnknownExtension, -1,
-       "the extension \"png\" names no format; these do: tiff tif dng nef cr2 raf arw jpeg jpg "
-       "nrw 3fr cr3"},
-  };
-  for (Row const& row : rows) {
-    QVNote const refusal = refusalOf(row.bytes, row.extension);
-    EXPECT_EQ(refusal.text.substr(0, row.text.size()), row.text);
-    EXPECT_EQ(std::string(QVJournal::reasonName(refusal.reason)),
-              QVJournal::reasonName(row.reason));
-    if (row.position != -2) {
-      EXPECT_EQ(refusal.position, row.position) << row.text;
-    }
-  }
-}
-
 TEST(Journal, TellsWhyAFileOnDiskCannotBeRead) {
   QVJournal journal(QVJournal::Detail::Refusals);
   EXPECT_FALSE(journal.read("/nowhere/x.jpg"));
   EXPECT_EQ(journal.refusal()->reason, QVReason::CannotOpen);
   EXPECT_EQ(journal.refusal()->text, "the file cannot be opened: No such file or directory");
+  EXPECT_EQ(journal.refusal()->systemError, ENOENT);
+
+  TemporaryFile const cut("II*", "tif");
+  EXPECT_FALSE(journal.read(cut.path));
+  EXPECT_EQ(journal.refusal()->text,
+            "the TIFF header at 0: 2 bytes wanted at 2, but the file ends at 3");
+  EXPECT_EQ(journal.refusal()->systemError, 0);
 
   TemporaryFile const photo(fixtures()[0].bytes(kII), fixtures()[0].extension);
   auto const record = journal.read(photo.path);
@@ -133,6 +82,7 @@ TEST(Journal, TellsWhyAFileOnDiskCannotBeRead) {
   EXPECT_FALSE(journal.read(folder));
   ::rmdir(folder.c_str());
   EXPECT_EQ(journal.refusal()->reason, QVReason::ReadError);
+  EXPECT_EQ(journal.refusal()->systemError, EISDIR);
   EXPECT_NE(journal.refusal()->text.find("Is a directory"), std::string::npos);
 }
 
@@ -152,6 +102,58 @@ TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItsStreamToOthers) {
   EXPECT_EQ(journal.notes().size(), count);
 }
 
+/// A host's record that reads the same stream as something else on the way.
+struct Nested : QVJPEGImage {
+  explicit Nested(std::shared_ptr<QVStream> const& source) : stream(source) {}
+  bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override {
+    ByteOrder const order = stream->byteOrder;
+    std::int64_t const base = stream->baseOffset;
+    long const offset = stream->getOffset();
+    EXPECT_FALSE(QVJournal().read(stream, "tif"));
+    stream->byteOrder = order;
+    stream->baseOffset = base;
+    stream->setOffset(offset);
+    EXPECT_TRUE(ifd->entries);
+    return QVJPEGImage::storeInfoFromExifIFD(ifd);
+  }
+  std::shared_ptr<QVStream> stream;
+};
+
+TEST(Journal, OfAReadInsideAnotherIsItsOwn) {
+  Bytes const exif = exifSegment(tiff(kII, jpegExif()));
+  Source photo("\xff\xd8" + exif + exif + sof0());
+  Nested record(photo.stream);
+  EXPECT_TRUE(record.read(photo.stream));
+}
+
+/// Fails at its third read: throws, or delivers nothing.
+struct Failing : QVMStream {
+  Failing(Bytes& bytes, bool isThrowing)
+      : QVMStream(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size()),
+        throws(isThrowing) {}
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    if (++reads < 3) {
+      return QVMStream::readBuffer(destination, count);
+    }
+    return throws ? throw std::runtime_error("gone") : -1;
+  }
+  bool throws;
+  int reads = 0;
+};
+
+TEST(Journal, HoldsNothingOfAnEarlierFileWhenAStreamFails) {
+  Bytes bytes = fixtures()[0].bytes(kII);
+  QVJournal journal;
+  EXPECT_FALSE(journal.read(nullptr, 0, "jpg"));
+  EXPECT_THROW(journal.read(std::make_shared<Failing>(bytes, true), "tif"), std::runtime_error);
+  EXPECT_TRUE(journal.notes().empty());
+  EXPECT_FALSE(journal.read(std::make_shared<Failing>(bytes, false), "tif"));
+  EXPECT_EQ(journal.refusal()->reason, QVReason::ReadError);
+  EXPECT_EQ(journal.refusal()->text,
+            "the TIFF header at 0: 4 bytes wanted at 4, but reading fails");
+  EXPECT_EQ(journal.refusal()->systemError, 0);
+}
+
 TEST(Journal, CountsTheStepsThatItDoesNotKeep) {
   Bytes others;
   for (int i = 0; i < 20; ++i) {
@@ -165,47 +167,6 @@ TEST(Journal, CountsTheStepsThatItDoesNotKeep) {
                                    [](auto const& n) { return n.kind == QVNoteKind::Step; });
   EXPECT_EQ(static_cast<std::uint64_t>(steps) + journal.furtherSteps(), 21U);
   EXPECT_EQ(steps, 8);
-}
-
-TEST(Journal, HintsAtWhatExplainsTheOutcome) {
-  struct HintRow {
-    std::string extension;
-    Bytes bytes;
-    QVReason reason;
-    std::string text;
-  };
-  Directory image = plainTiff();
-  HintRow const rows[] = {
-      {"jpg",
-       box("ftyp",
-           "he\x1b"
-           "c"),
-       QVReason::OtherContent,
-       R"(The file looks like an ISO base media file of brand "he\x1bc"; its extension has it read )"
-       "as JPEG"},
-      {"nef", "\x89PNG....", QVReason::OtherContent,
-       "The file looks like a PNG file; its extension has it read as NEF"},
-      {"jpg", "\xff\xd8" + segment(0xffc2, Bytes(9, '\0')), QVReason::NotBaseline,
-       "The frame at 2 is progressive (SOF2); only a baseline frame (SOF0) gives a size"},
-      {"jpg", "\xff\xd8" + segment(0xffda, "ab"), QVReason::PictureData,
-       "Before the scan at 2 no APP1 was met; the walk goes on through picture data, taken as "
-       "segments"},
-      {"raf", rafFile(Bytes(40, 'x'), tiff(kII, rafRawSection())), QVReason::OtherOpening,
-       "The embedded JPEG at "},
-      {"dng", tiff(kII, {{shorts(kNewSubfileType, {1}), pointer(kSubIFDs, {Directory()})}}),
-       QVReason::PassedOver, "SubIFD 1 of 1 at "},
-  };
-  for (HintRow const& row : rows) {
-    QVJournal journal;
-    Bytes bytes = row.bytes;
-    journal.read(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size(), row.extension);
-    bool const isThere =
-        std::any_of(journal.notes().begin(), journal.notes().end(), [&](QVNote const& note) {
-          return note.kind == QVNoteKind::Hint && note.reason == row.reason &&
-                 note.text.compare(0, row.text.size(), row.text) == 0;
-        });
-    EXPECT_TRUE(isThere) << row.text;
-  }
 }
 
 }  // namespace

@@ -121,6 +121,22 @@ TEST(Metadata, LetsAHostKeepPartsOfTheExifDirectory) {
   expectToKeep<QVRafImage>("raf");
 }
 
+/// Looks at what a host sees of an Exif directory.
+struct Spy : QVTiffImage {
+  bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override {
+    EXPECT_EQ(ifd->nextIFDOffset, 77U);
+    auto const offset = ifd->entryForTag(kOffsetTimeOriginal);
+    EXPECT_TRUE(offset && offset->bytes && offset->bytes->size() == 3);
+    return true;
+  }
+};
+
+TEST(Metadata, ShowsAHostTheWholeExifDirectory) {
+  Directory exif = {{claim(kOffsetTimeOriginal, kUndefined, 3, 0)}, 77};
+  Source source(tiff(kII, {{pointer(kExif, {exif})}}));
+  EXPECT_TRUE(Spy().read(source.stream));
+}
+
 TEST(Metadata, TakesDatesFromAHostsDirectory) {
   auto const ifd = std::make_shared<QVTiffImageFileDirectory>();
   QVTiffImage record;

@@ -1,14 +1,17 @@
 #include <gtest/gtest.h>
 
-#include "stream/ReadAheadStream.h"
+#include <climits>
+#include <filesystem>
+
+#include "stream/PositionedFile.h"
 #include "support/Fixtures.h"
 
 namespace quavel::test {
 namespace {
 
-enum class Kind { kFile, kReadAhead, kMemory };
+enum class Kind { kFile, kPositionedFile, kReadAhead, kTinyBlocks, kByPath, kMemory };
 
-/// The same bytes as a file, as a file read ahead, and as memory.
+/// The same bytes as a file, as a file read ahead in several ways, and as memory.
 class StreamTest : public testing::TestWithParam<Kind> {
  protected:
   std::shared_ptr<QVStream> open(Bytes const& bytes) {
@@ -18,11 +21,19 @@ class StreamTest : public testing::TestWithParam<Kind> {
       return std::make_shared<QVMStream>(memory, data.size());
     }
     file = std::make_unique<TemporaryFile>(bytes, "bin");
-    std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file->path);
-    if (GetParam() == Kind::kReadAhead) {
-      stream = std::make_shared<detail::ReadAheadStream>(stream);
+    std::shared_ptr<QVStream> const plain = std::make_shared<QVFStream>(file->path);
+    switch (GetParam()) {
+      case Kind::kPositionedFile:
+        return std::make_shared<detail::PositionedFile>(file->path);
+      case Kind::kReadAhead:
+        return std::make_shared<QVReadAheadStream>(plain, 16384, 4096);
+      case Kind::kTinyBlocks:
+        return std::make_shared<QVReadAheadStream>(plain, 0, 3);
+      case Kind::kByPath:
+        return detail::openReadAhead(file->path);
+      default:
+        return plain;
     }
-    return stream;
   }
 
   Bytes data;
@@ -30,7 +41,8 @@ class StreamTest : public testing::TestWithParam<Kind> {
 };
 
 INSTANTIATE_TEST_SUITE_P(Streams, StreamTest,
-                         testing::Values(Kind::kFile, Kind::kReadAhead, Kind::kMemory));
+                         testing::Values(Kind::kFile, Kind::kPositionedFile, Kind::kReadAhead,
+                                         Kind::kTinyBlocks, Kind::kByPath, Kind::kMemory));
 
 TEST_P(StreamTest, StartsAtTheBeginningInBigEndianOrder) {
   auto const stream = open("\x12\x34");
@@ -136,116 +148,48 @@ TEST(MemoryStream, EndsEverySeekOutsideAtTheEnd) {
   EXPECT_EQ(stream.offset, 0U);
 }
 
-TEST(FileStream, SeeksPastTheEndAndRefusesToSeekBeforeTheStart) {
+TEST(FileStream, SeeksAlikeHoweverItIsRead) {
   TemporaryFile const file("abc", "bin");
+  constexpr std::int64_t kLargeFile = 5000000000;
+  std::filesystem::resize_file(file.path, kLargeFile);  // a hole
   QVFStream plain(file.path);
-  detail::ReadAheadStream ahead(std::make_shared<QVFStream>(file.path));
-  for (QVStream* const stream : {static_cast<QVStream*>(&plain), static_cast<QVStream*>(&ahead)}) {
-    stream->setOffset(100);
-    EXPECT_EQ(stream->getOffset(), 100);
-    stream->setOffset(-1);
-    EXPECT_EQ(stream->getOffset(), 100);
-    unsigned char byte = 0;
-    EXPECT_FALSE(stream->readByte(&byte));
-    stream->setOffset(2);
-    EXPECT_TRUE(stream->readByte(&byte));
-    EXPECT_EQ(byte, 'c');
-  }
-}
-
-/// Counts what is asked of a file, and fails the reads from a given one on.
-struct CountingStream : QVFStream {
-  using QVFStream::QVFStream;
-  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
-    return ++reads >= firstFailure ? -1 : QVFStream::readBuffer(destination, count);
-  }
-  void setOffset(long const& offset) override {
-    ++seeks;
-    QVFStream::setOffset(offset);
-  }
-  int reads = 0;
-  int seeks = 0;
-  int firstFailure = 100;
-};
-
-TEST(ReadAheadStream, AnswersFromItsWindowAndMovesByOneSeekAndOneRead) {
-  Bytes bytes(100000, '\0');
-  for (std::size_t i = 0; i < bytes.size(); ++i) {
-    bytes[i] = static_cast<char>(i % 251);
-  }
-  TemporaryFile const file(bytes, "bin");
-  auto const source = std::make_shared<CountingStream>(file.path);
-  detail::ReadAheadStream stream(source);
-  auto const expectAt = [&](long offset, int reads, int seeks) {
-    unsigned char byte = 0;
-    stream.setOffset(offset);
-    EXPECT_TRUE(stream.readByte(&byte));
-    EXPECT_EQ(byte, offset % 251);
-    EXPECT_EQ(source->reads, reads) << offset;
-    EXPECT_EQ(source->seeks, seeks) << offset;
-  };
-  expectAt(0, 1, 0);
-  expectAt(16383, 1, 0);
-  expectAt(16384, 2, 0);  // the source stands there already
-  expectAt(50000, 3, 1);
-  expectAt(54095, 3, 1);
-  expectAt(10, 4, 2);
-
-  Bytes whole(bytes.size(), '\1');
-  stream.setOffset(0);
-  EXPECT_EQ(stream.readBuffer(reinterpret_cast<std::uint8_t*>(whole.data()), whole.size()),
-            static_cast<std::int64_t>(bytes.size()));
-  EXPECT_EQ(whole, bytes);
-}
-
-/// Takes no position beyond a limit, and fails reads that touch a broken byte.
-struct PartlyBrokenStream : QVMStream {
-  using QVMStream::QVMStream;
-  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
-    return offset + count > 9000 ? -1 : QVMStream::readBuffer(destination, count);
-  }
-  void setOffset(long const& newOffset) override {
-    if (newOffset <= 0xeffffff0) {
-      QVMStream::setOffset(newOffset);
+  detail::PositionedFile positioned(file.path);
+  QVReadAheadStream ahead(std::make_shared<QVFStream>(file.path), 100, 10);
+  auto const byPath = detail::openReadAhead(file.path);
+  for (std::int64_t const base : {std::int64_t{0}, std::int64_t{1}, kLargeFile}) {
+    for (long const offset : {100L, -1L, 1L, 0x7fffffffL, 0x80000000L, 4999999990L, 5000000000L,
+                              LONG_MAX, LONG_MIN, 2L}) {
+      plain.baseOffset = base;
+      plain.setOffset(offset);
+      long const position = plain.getOffset();
+      unsigned char expected = 0;
+      bool const isRead = plain.readByte(&expected);
+      for (QVStream* const other :
+           {static_cast<QVStream*>(&positioned), static_cast<QVStream*>(&ahead), byPath.get()}) {
+        SCOPED_TRACE(std::to_string(base) + " + " + std::to_string(offset));
+        other->baseOffset = base;
+        other->setOffset(offset);
+        EXPECT_EQ(other->getOffset(), position);
+        unsigned char byte = 0;
+        EXPECT_EQ(other->readByte(&byte), isRead);
+        EXPECT_EQ(byte, expected);
+      }
     }
   }
-};
-
-TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {
-  Bytes bytes(20000, 'x');
-  auto const source = std::make_shared<PartlyBrokenStream>(
-      reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
-  detail::ReadAheadStream stream(source);
-  stream.setOffset(100);
-  stream.setOffset(0xfffffff0);
-  EXPECT_EQ(stream.getOffset(), 100);
-  unsigned int number = 0;
-  EXPECT_TRUE(stream.readLong(&number));
-  EXPECT_EQ(number, 0x78787878U);
-  stream.setOffset(8998);
-  EXPECT_FALSE(stream.readLong(&number));
-}
-
-TEST(ReadAheadStream, TakesAReadErrorForTheEnd) {
-  TemporaryFile const file(Bytes(20000, 'x'), "bin");
-  auto const source = std::make_shared<CountingStream>(file.path);
-  source->firstFailure = 2;
-  detail::ReadAheadStream stream(source);
-  unsigned int number = 0;
-  EXPECT_TRUE(stream.readLong(&number));
-  stream.setOffset(16382);
-  EXPECT_FALSE(stream.readLong(&number));
-  EXPECT_EQ(stream.getOffset(), 16384);
 }
 
 TEST(FileStream, IsEmptyWhenTheFileCannotBeOpened) {
-  QVFStream stream("/nonexistent/photo.jpg");
-  EXPECT_EQ(stream.fd, -1);
-  unsigned char byte = 0;
-  EXPECT_FALSE(stream.readByte(&byte));
-  stream.baseOffset = 7;
-  stream.setOffset(3);
-  EXPECT_EQ(stream.getOffset(), -7);
+  QVFStream plain("/nonexistent/photo.jpg");
+  detail::PositionedFile positioned("/nonexistent/photo.jpg");
+  for (QVFStream* const stream : {&plain, static_cast<QVFStream*>(&positioned)}) {
+    EXPECT_EQ(stream->fd, -1);
+    unsigned char byte = 0;
+    EXPECT_FALSE(stream->readByte(&byte));
+    stream->baseOffset = 7;
+    stream->setOffset(3);
+    EXPECT_FALSE(stream->readByte(&byte));
+  }
+  EXPECT_EQ(plain.getOffset(), -7);
 }
 
 TEST(Stream, SwapsOnlyWhatTheHostDoesNotHave) {

@@ -18,7 +18,8 @@ struct Options {
   bool fromStdin = false;
   std::string extension;  ///< Of what standard input holds, in lower case.
   Form form;
-  unsigned jobs = 1;
+  unsigned jobs = 1;        ///< Files read at a time when reading waits for the disk.
+  unsigned cachedJobs = 1;  ///< When it does not; at most `jobs`.
   bool isQuiet = false;
 };
 

@@ -1,12 +1,33 @@
 #include "Pipeline.h"
 
+#include <sys/resource.h>
+
+#include <algorithm>
 #include <system_error>
 
 #include "terminal/Interrupt.h"
 
 namespace app {
 
-Pipeline::Pipeline(unsigned jobs, Work work) : jobs_(jobs), work_(std::move(work)) {}
+namespace {
+
+#ifdef RUSAGE_THREAD
+constexpr bool kTellsWaits = true;
+/// How often the calling thread gave up the processor to wait for something, such as the disk.
+long countWaits() {
+  rusage usage = {};
+  ::getrusage(RUSAGE_THREAD, &usage);
+  return usage.ru_nvcsw;
+}
+#else
+constexpr bool kTellsWaits = false;
+long countWaits() { return 0; }
+#endif
+
+}  // namespace
+
+Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
+    : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {}
 
 Pipeline::~Pipeline() {
   {
@@ -23,9 +44,10 @@ Pipeline::~Pipeline() {
 void Pipeline::submit(std::unique_ptr<Batch> batch) {
   Batch* const work = batch.get();
   order_.push_back(std::move(batch));
-  // A single file is not worth threads: they start with the second batch.
-  if (jobs_ > 1 && threads_.empty() && hasBegun_) {
-    start();
+  // A single file is not worth threads: they start with the second batch, one for each batch that
+  // is under way.
+  if (jobs_ > 1 && hasBegun_ && threads_.size() < std::min<std::size_t>(limit(), order_.size())) {
+    startThread();
   }
   hasBegun_ = true;
   if (threads_.empty()) {
@@ -59,25 +81,31 @@ bool Pipeline::isOldestDone() {
   return !order_.empty() && order_.front()->isDone;
 }
 
-bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * std::size_t{jobs_}); }
+bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * limit()); }
 
-void Pipeline::start() {
+std::size_t Pipeline::limit() const { return isWaiting_ ? jobs_ : busyJobs_; }
+
+void Pipeline::startThread() {
   interrupt::Shield const shield;
   try {
-    while (threads_.size() < jobs_) {
-      threads_.emplace_back([this] { runThread(); });
-    }
+    threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
     // The system grants no more: those that run do all the work, or the caller does.
-    jobs_ = threads_.empty() ? 1 : static_cast<unsigned>(threads_.size());
+    jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
+    busyJobs_ = std::min(busyJobs_, jobs_);
   }
 }
 
-void Pipeline::workOn(Batch& batch) const {
+void Pipeline::workOn(Batch& batch) {
+  long const before = countWaits();
   try {
     work_(batch);
   } catch (...) {
     batch.failure = std::current_exception();
+  }
+  // Cached files are read without waiting. Others wait for the disk once each, or more often.
+  if (kTellsWaits) {
+    isWaiting_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }
 }
 

@@ -1,6 +1,7 @@
 #ifndef QUAVEL_APPS_PIPELINE_H
 #define QUAVEL_APPS_PIPELINE_H
 
+#include <atomic>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -25,13 +26,15 @@ struct Batch {
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-/// Works on batches on some threads and hands them back in the order they came in.
+/// Works on batches on some threads and hands them back in the order they came in. There are
+/// as many as `jobs` while the work waits for the disk, so that the disk never waits for the work,
+/// and as many as `busyJobs` while it keeps the processors busy.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
   /// With one job the work is done by the caller of `submit`.
-  Pipeline(unsigned jobs, Work work);
+  Pipeline(unsigned jobs, unsigned busyJobs, Work work);
   /// Drops what has not begun and waits for what has.
   ~Pipeline();
   Pipeline(Pipeline const&) = delete;
@@ -46,11 +49,14 @@ class Pipeline {
   bool isOldestDone();
 
  private:
-  void start();
-  void workOn(Batch& batch) const;
+  std::size_t limit() const;
+  void startThread();
+  void workOn(Batch& batch);
   void runThread();
 
   unsigned jobs_;
+  unsigned busyJobs_;
+  std::atomic<bool> isWaiting_;
   Work work_;
   std::vector<std::thread> threads_;
   std::deque<std::unique_ptr<Batch>> order_;  // of the caller's thread alone

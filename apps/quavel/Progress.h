@@ -3,7 +3,9 @@
 
 #include <atomic>
 #include <chrono>
+#include <condition_variable>
 #include <cstddef>
+#include <mutex>
 #include <thread>
 
 #include "Options.h"
@@ -32,6 +34,7 @@ class Progress {
   using Clock = std::chrono::steady_clock;
 
   void startCounting();
+  void countFiles();
   std::string line(double seconds) const;
 
   Console& console_;
@@ -42,7 +45,9 @@ class Progress {
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
   std::thread counter_;
-  std::atomic<bool> isEnding_{false};
+  std::mutex mutex_;
+  std::condition_variable hasEnded_;
+  bool isEnding_ = false;
   std::atomic<std::size_t> total_{0};  // 0 until it is known
 };
 

@@ -18,7 +18,7 @@ namespace {
 
 constexpr std::size_t kLargestBatch = 64;
 // A batch is to be short enough for the output to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.02;
+constexpr double kLongBatch = 0.002;
 constexpr std::size_t kWideBatch = std::size_t{1} << 20;
 
 /// One run over the files of a source.
@@ -54,7 +54,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       writer_(makeWriter(options.form, output)),
       detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
-      pipeline_(options.jobs, [this](Batch& batch) { work(batch); }) {}
+      pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }) {}
 
 int Runner::run() {
   if (options_.fromStdin) {

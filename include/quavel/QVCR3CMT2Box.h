@@ -44,8 +44,8 @@ class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
   /// @}
 
  private:
-  bool storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  bool storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+  QUAVEL_NO_EXPORT bool storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
+  QUAVEL_NO_EXPORT bool storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 
 }  // namespace quavel

@@ -18,10 +18,10 @@ class QUAVEL_EXPORT QVCR3Image : public QVMetadata {
   bool read(std::shared_ptr<QVStream>& stream) override;
 
  private:
-  bool storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& moovBox,
-                         std::int64_t position);
-  void storeInfoFromCMT1(QVCR3CMT1Box& cmt1);
-  void storeInfoFromCMT2(QVCR3CMT2Box& cmt2);
+  QUAVEL_NO_EXPORT bool storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& moovBox,
+                                          std::int64_t position);
+  QUAVEL_NO_EXPORT void storeInfoFromCMT1(QVCR3CMT1Box& cmt1);
+  QUAVEL_NO_EXPORT void storeInfoFromCMT2(QVCR3CMT2Box& cmt2);
 };
 
 }  // namespace quavel

@@ -17,7 +17,7 @@ class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
   std::shared_ptr<QVCR3UUIDBox> uuidBox;  ///< The last `uuid` child, of any identifier; or null.
 
  private:
-  bool readChildren(std::shared_ptr<QVStream>& stream, long start, long end);
+  QUAVEL_NO_EXPORT bool readChildren(std::shared_ptr<QVStream>& stream, long start, long end);
 };
 
 }  // namespace quavel

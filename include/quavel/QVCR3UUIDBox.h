@@ -30,7 +30,7 @@ class QUAVEL_EXPORT QVCR3UUIDBox : public QVCR3Box {
  private:
   friend class QVCR3Image;
 
-  bool readChildren(std::shared_ptr<QVStream>& stream, long end);
+  QUAVEL_NO_EXPORT bool readChildren(std::shared_ptr<QVStream>& stream, long end);
 
   std::int64_t position_ = 0;  // of the box read last, in the file
 };

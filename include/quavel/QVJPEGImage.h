@@ -41,11 +41,13 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  private:
   struct Walk;
 
-  bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker, Walk& walk);
-  bool readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk);
-  static bool readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk);
-  void reconcileSizeWith(Walk const& walk);
-  static void noteWhatIsMissing(detail::Journal* journal, Walk const& walk);
+  QUAVEL_NO_EXPORT bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
+                                    Walk& walk);
+  QUAVEL_NO_EXPORT bool readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk);
+  QUAVEL_NO_EXPORT static bool readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk);
+  QUAVEL_NO_EXPORT void reconcileSizeWith(Walk const& walk);
+  QUAVEL_NO_EXPORT static void noteHints(detail::Journal* journal, Walk const& walk);
+  QUAVEL_NO_EXPORT static void noteWhatIsMissing(detail::Journal* journal, Walk const& walk);
 };
 
 }  // namespace quavel

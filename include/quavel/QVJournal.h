@@ -80,7 +80,7 @@ class QUAVEL_EXPORT QVJournal {
   std::shared_ptr<QVMetadata> read(std::string const& path);
   std::shared_ptr<QVMetadata> read(unsigned char* buffer, std::size_t length,
                                    std::string const& extension);
-  /// The same from a stream of the host's own, which must stand at the file's first byte.
+  /// The same from a stream of the host's own, not null, which must stand at the file's first byte.
   std::shared_ptr<QVMetadata> read(std::shared_ptr<QVStream> stream, std::string const& extension);
 
   /// What the last read left, in the order in which it happened: steps, a refusal or limit, hints,
@@ -95,7 +95,8 @@ class QUAVEL_EXPORT QVJournal {
   static char const* reasonName(QVReason reason);
 
  private:
-  void keep(detail::Journal& journal);
+  QUAVEL_NO_EXPORT detail::Journal begin();
+  QUAVEL_NO_EXPORT void keep(detail::Journal& journal);
 
   Detail detail_;
   std::vector<QVNote> notes_;

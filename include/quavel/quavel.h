@@ -20,6 +20,7 @@
 #include "quavel/QVNRWImage.h"
 #include "quavel/QVNefImage.h"
 #include "quavel/QVRafImage.h"
+#include "quavel/QVReadAheadStream.h"
 #include "quavel/QVReader.h"
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffHeader.h"

@@ -1,4 +1,5 @@
 #include "formats/JpegWalk.h"
+#include "tiff/Tags.h"
 
 namespace quavel {
 
@@ -13,17 +14,22 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
 }
 
 void detail::noteSize(Directory const& exifIFD, int width, int height) {
-  if (width < 0 || height < 0) {
-    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
-               "{} does not give both sides", NamedDirectory{exifIFD});
-  } else {
-    noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
-               "{} declares {} x {}; only more than 500 a side counts", NamedDirectory{exifIFD},
-               width, height);
-  }
+  bool const hasWidth =
+      findEntry(exifIFD, tag::ImageWidth) || findEntry(exifIFD, tag::PixelXDimension);
+  bool const hasHeight =
+      findEntry(exifIFD, tag::ImageLength) || findEntry(exifIFD, tag::PixelYDimension);
+  noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
+             hasWidth && hasHeight
+                 ? "{} declares {} x {}; only more than 500 a side counts, and less than 2^31"
+                 : "{} does not give both sides",
+             NamedDirectory{exifIFD}, static_cast<std::uint32_t>(width),
+             static_cast<std::uint32_t>(height));
 }
 
 void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
+  if (journal == nullptr || !journal->wantsAll()) {
+    return;
+  }
   QVNote const* const exif = journal->absenceOf("width");
   std::string const exifText = exif == nullptr ? "no Exif IFD gives a size" : exif->text;
   std::string const frameText =
@@ -37,6 +43,9 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
                    ? "no Exif segment among those up to SOF0 and an APP1, where the walk ends"
                    : "no Exif segment (APP1) was met");
   }
+}
+
+void QVJPEGImage::noteHints(Journal* journal, Walk const& walk) {
   if (walk.otherFrame >= 0) {
     noteHint(journal, QVReason::NotBaseline, walk.otherFrame,
              "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
@@ -46,7 +55,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
     noteHint(journal, QVReason::PictureData, walk.scan,
              "Before the scan at {} no {} was met; the walk goes on through picture data, taken as "
              "segments",
-             Offset{walk.scan}, walk.sawAPP1 ? "SOF0" : "APP1");
+             Offset{walk.scan}, walk.missingAtScan);
   }
 }
 

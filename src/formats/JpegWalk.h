@@ -17,6 +17,7 @@ struct QVJPEGImage::Walk {
   std::int64_t frame = -1;
   std::int64_t otherFrame = -1;  ///< A progressive one.
   std::int64_t scan = -1;        ///< Where picture data begins.
+  char const* missingAtScan = "";
 };
 
 namespace detail {

@@ -78,14 +78,14 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
       break;
     }
     if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk)) {
+      noteHints(journal, walk);
       return false;
     }
   }
 
   reconcileSizeWith(walk);
-  if (journal != nullptr) {
-    noteWhatIsMissing(journal, walk);
-  }
+  noteWhatIsMissing(journal, walk);
+  noteHints(journal, walk);
   return true;
 }
 
@@ -112,6 +112,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   }
   if (marker == kSOS && walk.scan < 0) {
     walk.scan = walk.start;
+    walk.missingAtScan = walk.sawAPP1 ? "SOF0" : walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
   }
   // After the start of the scan, the same two bytes are picture data.
   if (marker == kSOF2 && walk.scan < 0) {
@@ -161,9 +162,11 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk) {
   }
   notePassed(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
              Offset{walk.start}, width, height);
+  if (walk.frame < 0 || width > walk.frameWidth || height > walk.frameHeight) {
+    walk.frame = walk.start;
+  }
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
-  walk.frame = walk.start;
   walk.sawSOF0 = true;
   return true;
 }
@@ -214,7 +217,9 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
-  noteSize(ifd, exifWidth, exifHeight);
+  if (journalOf(ifd) != nullptr) {
+    noteSize(ifd, exifWidth, exifHeight);
+  }
   if (exifWidth > kLargestThumbnailSide && exifHeight > kLargestThumbnailSide) {
     width = exifWidth;
     height = exifHeight;

@@ -47,8 +47,7 @@ void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   if (journal == nullptr || !journal->wantsAll()) {
     return;
   }
-  stream.baseOffset = 0;
-  stream.setOffset(static_cast<long>(imageOffset));
+  stream.setOffset(static_cast<long>(imageOffset - stream.baseOffset));
   std::array<std::uint8_t, kTiffHeaderInImage> opening = {};
   std::size_t const received = readUpTo(stream, opening.data(), opening.size());
   if (received != 0 && !opensWithExif(opening)) {

@@ -108,9 +108,11 @@ constexpr Signature kSignatures[] = {
     {0, 8, "\0\0\0\0\0\0\0\0", "a file that was emptied with zeros", 0},
 };
 
-void noteOtherContent(Format const& format, QVStream& stream, Journal& journal) {
-  stream.baseOffset = 0;
-  stream.setOffset(0);
+}  // namespace
+
+void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start,
+                      Journal& journal) {
+  stream.setOffset(static_cast<long>(start - stream.baseOffset));
   std::array<std::uint8_t, kOpeningSize> opening;
   std::size_t const size = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
@@ -122,25 +124,16 @@ void noteOtherContent(Format const& format, QVStream& stream, Journal& journal) 
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       std::string const kind =
           hasBrand ? composed("{} of brand \"{}\"", {&row.kind[0], brand}) : row.kind;
-      noteHint(&journal, QVReason::OtherContent, 0,
+      noteHint(&journal, QVReason::OtherContent, start,
                "The file looks like {}; its extension has it read as {}", kind, format.kind);
     }
     return;
   }
 }
 
-}  // namespace
-
-void explain(Format const& format, QVStream& stream, QVMetadata const* record, Journal& journal) {
-  if (!journal.wantsAll()) {
-    return;
-  }
-  noteOtherContent(format, stream, journal);
-  if (record == nullptr) {
-    return;
-  }
+void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
   for (auto const& row : kFields) {
-    if (row.isAbsent(*record)) {
+    if (row.isAbsent(record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

@@ -13,13 +13,12 @@
 #include "quavel/QVCR2Image.h"
 #include "quavel/QVCR3Image.h"
 #include "quavel/QVDNGImage.h"
-#include "quavel/QVFStream.h"
 #include "quavel/QVJPEGImage.h"
 #include "quavel/QVNRWImage.h"
 #include "quavel/QVNefImage.h"
 #include "quavel/QVRafImage.h"
 #include "quavel/QVTiffImage.h"
-#include "stream/ReadAheadStream.h"
+#include "stream/PositionedFile.h"
 
 namespace quavel::detail {
 
@@ -80,17 +79,6 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
                 "the extension \"{}\" names no format; these do: {}", quoted, known);
 }
 
-/// Lets the journal ask the open file for its size, or states why it is not open.
-bool examine(QVFStream const& file, Journal& journal) {
-  if (file.fd == -1) {
-    journal.systemError = errno;
-    return refuse(&journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
-                  std::generic_category().message(journal.systemError));
-  }
-  journal.fd = file.fd;
-  return true;
-}
-
 }  // namespace
 
 std::string extensionOf(std::string const& path) {
@@ -111,11 +99,18 @@ Format const* formatOf(std::string_view extension) {
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) {
   std::string extension = extensionOf(path);
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
-  auto file = std::make_shared<QVFStream>(path);
-  if (journal != nullptr && !examine(*file, *journal)) {
+  int fd = -1;
+  auto stream = openReadAhead(path, &fd);
+  if (journal != nullptr && fd == -1) {
+    journal->systemError = errno;
+    refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
+           std::generic_category().message(journal->systemError));
     return nullptr;
   }
-  return readStream(std::make_shared<ReadAheadStream>(std::move(file)), extension, journal);
+  if (journal != nullptr) {
+    journal->fd = fd;
+  }
+  return readStream(std::move(stream), extension, journal);
 }
 
 std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
@@ -125,15 +120,19 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     refuseExtension(journal, extension);
     return nullptr;
   }
-  ReadScope const scope(*stream);
-  scope.reading().journal = journal;
-  scope.reading().isOwnRecord = true;
+  ReadScope const scope(*stream, journal);
+  bool const wantsAll = journal != nullptr && journal->wantsAll();
+  std::int64_t const start = wantsAll ? positionOf(*stream) : 0;
   auto record = format->makeRecord();
-  bool const isRead = record->read(stream);
-  if (journal != nullptr) {
-    explain(*format, *stream, isRead ? record.get() : nullptr, *journal);
+  if (!record->read(stream)) {
+    record = nullptr;
   }
-  return isRead ? record : nullptr;
+  if (wantsAll && record) {
+    noteAbsences(*format, *record, *journal);
+  } else if (wantsAll) {
+    noteOtherContent(*format, *stream, start, *journal);
+  }
+  return record;
 }
 
 }  // namespace quavel::detail

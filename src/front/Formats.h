@@ -1,6 +1,7 @@
 #ifndef QUAVEL_SRC_FRONT_FORMATS_H
 #define QUAVEL_SRC_FRONT_FORMATS_H
 
+#include <cstdint>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -31,9 +32,11 @@ std::string extensionOf(std::string const& path);
 /// The format of an extension in lower case, or null.
 Format const* formatOf(std::string_view extension);
 
-/// Completes the notes of a read that has ended: what the content looks like when that does not fit
-/// the format, and, of a record, why each absent field is absent. `record` is null after a failure.
-void explain(Format const& format, QVStream& stream, QVMetadata const* record, Journal& journal);
+/// Notes why each absent field of the record is absent.
+void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
+
+/// Notes what a refused file, which begins at a position, looks like if it does not fit the format.
+void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);

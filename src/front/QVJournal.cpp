@@ -30,7 +30,7 @@ char const* QVJournal::reasonName(QVReason reason) {
 QVJournal::QVJournal(Detail detail) : detail_(detail) {}
 
 std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
-  detail::Journal journal(detail_);
+  detail::Journal journal = begin();
   auto record = detail::readPath(path, &journal);
   keep(journal);
   return record;
@@ -38,7 +38,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
 
 std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t length,
                                             std::string const& extension) {
-  detail::Journal journal(detail_);
+  detail::Journal journal = begin();
   journal.knownSize = static_cast<std::int64_t>(length);
   auto record =
       detail::readStream(std::make_shared<QVMStream>(buffer, length), extension, &journal);
@@ -48,7 +48,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
 
 std::shared_ptr<QVMetadata> QVJournal::read(std::shared_ptr<QVStream> stream,
                                             std::string const& extension) {
-  detail::Journal journal(detail_);
+  detail::Journal journal = begin();
   auto record = detail::readStream(std::move(stream), extension, &journal);
   keep(journal);
   return record;
@@ -59,6 +59,12 @@ QVNote const* QVJournal::refusal() const {
     return note.kind == QVNoteKind::Refusal || note.kind == QVNoteKind::Limit;
   });
   return found == notes_.end() ? nullptr : &*found;
+}
+
+detail::Journal QVJournal::begin() {
+  notes_.clear();  // a stream of the host's may throw
+  furtherSteps_ = 0;
+  return detail::Journal(detail_);
 }
 
 void QVJournal::keep(detail::Journal& journal) {

@@ -33,7 +33,8 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
   isRefused_ = true;
   QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
   add(kind, reason, position, composed(pattern, words));
-  notes.back().systemError = systemError;
+  bool const isOfSystem = reason == QVReason::CannotOpen || reason == QVReason::ReadError;
+  notes.back().systemError = isOfSystem ? systemError : 0;
 }
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
@@ -56,12 +57,13 @@ std::int64_t Journal::dataSize() {
 }
 
 QVReason Journal::cutReason() const {
-  return systemError != 0 ? QVReason::ReadError : QVReason::CutShort;
+  return hasReadFailed ? QVReason::ReadError : QVReason::CutShort;
 }
 
 std::string Journal::cutText(std::int64_t end) {
-  if (systemError != 0) {
-    return "reading fails: " + std::generic_category().message(systemError);
+  if (hasReadFailed) {
+    return systemError == 0 ? "reading fails"
+                            : "reading fails: " + std::generic_category().message(systemError);
   }
   if (dataSize() < 0) {
     return "the data ends before that";
@@ -102,9 +104,10 @@ QVNote const* Journal::absenceOf(char const* field) const {
   return found == absences_.end() ? nullptr : &*found;
 }
 
-void noteReadError(QVStream const& stream, int error) {
+void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
   if (Journal* const journal = journalOf(stream)) {
-    journal->systemError = error;
+    journal->hasReadFailed = delivered < 0;
+    journal->systemError = delivered < 0 ? error : 0;
   }
 }
 

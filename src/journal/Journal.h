@@ -47,6 +47,7 @@ class Journal {
   std::uint64_t furtherSteps = 0;
   int fd = -1;                  ///< Of the file that is read; -1: it is none.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
+  bool hasReadFailed = false;   ///< The last read of bytes did, for another cause than their end.
   int systemError = 0;          ///< The `errno` of what failed; 0: nothing did.
 
  private:

@@ -18,7 +18,7 @@ enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
 /// boxes come before the wanted one; but a file can lead to the same large directory again and
 /// again. The bounds lie far above what cameras write.
 inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
-    std::uint64_t{1} << 16U,  // directories opened
+    std::uint64_t{1} << 14U,  // directories opened, each with up to eleven values far apart
     std::uint64_t{1} << 24U,  // entries walked over
     std::uint64_t{1} << 20U,  // values taken: with the directories that hold them, below 32 MB
     std::uint64_t{1} << 24U,  // segments or boxes: 32 MB of zeros in a JPEG stay below
@@ -45,20 +45,22 @@ class Reading {
   std::array<std::uint64_t, 4> done_ = {};
 };
 
-/// The time during which a stream serves a read. What is called on the way, by readers or by a
-/// host's own code, joins the read instead of beginning another.
+/// The time during which a stream serves a read. What readers or a host's own code call on the way
+/// joins the read instead of beginning another.
 class ReadScope {
  public:
-  explicit ReadScope(QVStream& stream) : stream_(stream) {
-    if (stream_.reading_.current == nullptr) {
+  explicit ReadScope(QVStream& stream) : stream_(stream), outer_(stream.reading_.current) {
+    if (outer_ == nullptr) {
       stream_.reading_.current = &own_;
     }
   }
-  ~ReadScope() {
-    if (stream_.reading_.current == &own_) {
-      stream_.reading_.current = nullptr;
-    }
+  /// For a record of the library's own: a read by itself, even inside another.
+  ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
+    own_.journal = journal;
+    own_.isOwnRecord = true;
+    stream_.reading_.current = &own_;
   }
+  ~ReadScope() { stream_.reading_.current = outer_; }
   ReadScope(ReadScope const&) = delete;
   ReadScope& operator=(ReadScope const&) = delete;
 
@@ -66,6 +68,7 @@ class ReadScope {
 
  private:
   QVStream& stream_;
+  Reading* outer_;
   Reading own_;
 };
 
@@ -78,8 +81,9 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Remembers the `errno` of a read of the system's that failed, for the refusal that follows.
-void noteReadError(QVStream const& stream, int error);
+/// Remembers for the refusal that may follow whether bytes could be read, and the system's error,
+/// if it is known, when they could not.
+void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.
 inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }

@@ -6,6 +6,7 @@
 #include <cstring>
 #include <type_traits>
 
+#include "journal/Reading.h"
 #include "quavel/QVStream.h"
 
 namespace quavel::detail {
@@ -68,7 +69,10 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
   while (there < count) {
     std::int64_t const delivered = stream.readBuffer(destination + there, count - there);
     if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - there) {
-      break;  // a count beyond what was asked for is no count
+      if (delivered != 0) {
+        noteReadResult(stream, -1, 0);  // a count beyond what was asked for is not one
+      }
+      break;
     }
     there += static_cast<std::size_t>(delivered);
   }

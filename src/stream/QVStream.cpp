@@ -1,5 +1,6 @@
 #include "quavel/QVStream.h"
 
+#include "journal/Reading.h"
 #include "stream/Bytes.h"
 
 namespace quavel {
@@ -19,7 +20,11 @@ void reverseUnlessHostIs(ByteOrder order, QVStream const& stream, Number* number
 template <class Number>
 bool readNumber(QVStream& stream, Number* number) {
   auto* const bytes = reinterpret_cast<std::uint8_t*>(number);
-  if (stream.readBuffer(bytes, sizeof(Number)) != static_cast<std::int64_t>(sizeof(Number))) {
+  std::int64_t const delivered = stream.readBuffer(bytes, sizeof(Number));
+  if (delivered != static_cast<std::int64_t>(sizeof(Number))) {
+    if (delivered < 0) {
+      detail::noteReadResult(stream, delivered, 0);
+    }
     return false;
   }
   if constexpr (sizeof(Number) > 1) {

@@ -29,7 +29,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     return refuseCut(journal_, position_, kEntryCountSize, "the entry count of {}",
                      PlacedDirectory{*this});
   }
-  if (!reading.spend(Work::Directories, 1) || !reading.spend(Work::Entries, entryCount_)) {
+  if (!reading.spend(Work::Directories, 1)) {
     return false;
   }
 
@@ -60,7 +60,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
 
   // The entries may have left the stream anywhere.
   stream.setOffset(walk.end());
-  return true;
+  return reading.spend(Work::Entries, walk.number() - 1);
 }
 
 std::int64_t EntryTable::positionOf(EntryWalk const& walk) const {

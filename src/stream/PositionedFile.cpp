@@ -1,0 +1,88 @@
+#include "stream/PositionedFile.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+
+#include "quavel/QVReadAheadStream.h"
+
+namespace quavel::detail {
+
+namespace {
+
+// Photos take one to four reads, those that are walked through their image data dozens.
+constexpr int kReadsOfAWalk = 16;
+constexpr off_t kForeseen = off_t{4} << 20;
+
+// The metadata of most files lies in the first block. What lies beyond is a directory here and a
+// segment there. docs/speed.md tells how both sizes were measured.
+constexpr std::size_t kFirstBlockSize = 16384;
+constexpr std::size_t kNextBlockSize = 2048;
+
+/// Both streams in one allocation.
+struct ReadAheadFile {
+  explicit ReadAheadFile(std::string const& path) : file(path) {}
+
+  PositionedFile file;
+  // Shares the ownership of nothing: the file lives as long as this does.
+  QVReadAheadStream ahead{std::shared_ptr<QVStream>(std::shared_ptr<void>(), &file),
+                          kFirstBlockSize, kNextBlockSize};
+};
+
+}  // namespace
+
+PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
+
+void PositionedFile::advise() {
+#ifdef POSIX_FADV_RANDOM
+  ++reads_;
+  // Left to itself, a system fetches several times what is asked for at a file's start. One that
+  // takes no advice does so still.
+  if (reads_ == 1) {
+    ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM);
+  }
+  if (reads_ == kReadsOfAWalk) {
+    ::posix_fadvise(fd, static_cast<off_t>(position_), kForeseen, POSIX_FADV_WILLNEED);
+  }
+#endif
+}
+
+std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t count) {
+  if (fd == -1) {
+    return 0;
+  }
+  advise();
+  ssize_t delivered = ::pread(fd, destination, count, static_cast<off_t>(position_));
+  if (delivered == -1 && errno == ESPIPE) {
+    delivered = ::read(fd, destination, count);
+  }
+  position_ += delivered > 0 ? delivered : 0;
+  return delivered;
+}
+
+long PositionedFile::getOffset() {
+  return static_cast<long>(static_cast<std::uint64_t>(position_) -
+                           static_cast<std::uint64_t>(baseOffset));
+}
+
+void PositionedFile::setOffset(long const& offset) {
+  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
+                                                static_cast<std::uint64_t>(offset));
+  bool const isAccepted = target <= kSurelyAccepted
+                              ? target >= 0
+                              : ::lseek(fd, static_cast<off_t>(target), SEEK_SET) == target;
+  if (isAccepted) {
+    position_ = target;
+  }
+}
+
+std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd) {
+  auto const whole = std::make_shared<ReadAheadFile>(path);
+  if (fd != nullptr) {
+    *fd = whole->file.fd;
+  }
+  return {whole, &whole->ahead};
+}
+
+}  // namespace quavel::detail

@@ -1,0 +1,38 @@
+#ifndef QUAVEL_SRC_STREAM_POSITIONEDFILE_H
+#define QUAVEL_SRC_STREAM_POSITIONEDFILE_H
+
+#include <memory>
+#include <string>
+
+#include "quavel/QVFStream.h"
+
+namespace quavel::detail {
+
+/// Some file systems refuse positions beyond a limit of their own, none a smaller one.
+inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
+
+/// A file for a few reads here and there: a read takes its position along, so that a seek costs
+/// nothing, and the system is asked not to read on by itself. A file that takes many reads is
+/// walked to its end, and the system is asked to fetch what follows. A pipe is read front to back.
+class PositionedFile : public QVFStream {
+ public:
+  explicit PositionedFile(std::string const& path);
+
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;
+  long getOffset() override;
+  void setOffset(long const& offset) override;
+
+ private:
+  void advise();
+
+  std::int64_t position_ = 0;  // absolute
+  int reads_ = 0;
+};
+
+/// The file at `path` as every reader by path gets it: positioned, and read ahead. `fd` gets its
+/// descriptor, to be asked only; -1: it cannot be opened, and `errno` says why.
+std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
+
+}  // namespace quavel::detail
+
+#endif  // QUAVEL_SRC_STREAM_POSITIONEDFILE_H

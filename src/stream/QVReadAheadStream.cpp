@@ -1,0 +1,114 @@
+#include "quavel/QVReadAheadStream.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <limits>
+#include <utility>
+
+#include "journal/Reading.h"
+#include "stream/Bytes.h"
+#include "stream/PositionedFile.h"
+
+namespace quavel {
+
+QVReadAheadStream::QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
+                                     std::size_t nextBlockSize)
+    : source_(std::move(source)),
+      firstSize_(std::max<std::size_t>(firstBlockSize, 1)),
+      nextSize_(std::max<std::size_t>(nextBlockSize, 1)) {}
+
+QVReadAheadStream::~QVReadAheadStream() = default;
+
+std::int64_t QVReadAheadStream::readBuffer(std::uint8_t* destination, std::size_t count) {
+  std::size_t delivered = copyFetched(destination, count);
+  while (delivered < count) {
+    fetchNext(count - delivered);
+    std::size_t const copied = copyFetched(destination + delivered, count - delivered);
+    if (copied == 0) {
+      break;
+    }
+    delivered += copied;
+  }
+  return static_cast<std::int64_t>(delivered);
+}
+
+long QVReadAheadStream::getOffset() {
+  return static_cast<long>(static_cast<std::uint64_t>(position_) -
+                           static_cast<std::uint64_t>(baseOffset));
+}
+
+void QVReadAheadStream::setOffset(long const& offset) {
+  // Unsigned, a sum out of range wraps around instead of being undefined.
+  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
+                                                static_cast<std::uint64_t>(offset));
+  if (target < 0 || (target > detail::kSurelyAccepted && !sourceAccepts(target))) {
+    return;
+  }
+  position_ = target;
+}
+
+bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
+  source_->setOffset(static_cast<long>(target));
+  sourcePosition_ = source_->getOffset();
+  return sourcePosition_ == target;
+}
+
+std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_t count) {
+  std::size_t const copied = copyFrom(first_, destination, count);
+  return copied != 0 ? copied : copyFrom(last_, destination, count);
+}
+
+std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destination,
+                                        std::size_t count) {
+  auto const skipped = static_cast<std::uint64_t>(position_ - block.start);
+  if (position_ < block.start || skipped >= block.size) {
+    return 0;
+  }
+  std::size_t const copied = std::min(count, block.size - skipped);
+  detail::copyBytes(destination, block.bytes.get() + skipped, copied);
+  position_ += static_cast<std::int64_t>(copied);
+  return copied;
+}
+
+void QVReadAheadStream::fetchNext(std::size_t needed) {
+  if (!first_.bytes) {
+    first_.bytes.reset(new std::uint8_t[firstSize_]);
+    fetch(first_, firstSize_, needed);
+    return;
+  }
+  std::size_t const longest = std::max(firstSize_, nextSize_);
+  if (!last_.bytes) {
+    last_.bytes.reset(new std::uint8_t[longest]);
+  }
+  // Data that goes on where the source stands is likely to go on further.
+  fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
+}
+
+void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
+  block.size = 0;  // whatever happens from here on, what was there is overwritten
+  errno = 0;       // a source of the host's need not tell why it fails
+  std::int64_t delivered = readSource(block, wanted);
+  if (delivered < 0) {
+    // What is broken may lie beyond the bytes that are needed.
+    delivered = readSource(block, std::min(needed, wanted));
+  }
+  detail::noteReadResult(*this, delivered, errno);
+  block.start = position_;
+  block.size = static_cast<std::size_t>(std::max<std::int64_t>(delivered, 0));
+}
+
+std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
+  if (std::exchange(sourcePosition_, -1) != position_) {
+    source_->setOffset(static_cast<long>(position_));
+  }
+  std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
+  // A count beyond what was asked for is not one; nor is a position beyond the last there can be.
+  if (delivered < 0 || static_cast<std::uint64_t>(delivered) > count ||
+      delivered > std::numeric_limits<std::int64_t>::max() - position_) {
+    return -1;
+  }
+  sourcePosition_ = position_ + delivered;
+  return delivered;
+}
+
+}  // namespace quavel

@@ -1,0 +1,166 @@
+// A program of its own: it puts itself between the library and the system's calls on files.
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <thread>
+#include <utility>
+
+#include "support/Fixtures.h"
+
+namespace {
+
+/// What the system does from now on.
+struct System {
+  std::size_t mostAtOnce = SIZE_MAX;  // bytes that a read delivers
+  off_t brokenByte = -1;              // a read that touches it fails
+  std::function<void(int)> beforeRead = [](int) {};
+  bool takesAdvice = true;
+
+  int reads = 0;
+  std::vector<int> advice;
+} theSystem;
+
+}  // namespace
+
+extern "C" ssize_t pread(int fd, void* bytes, std::size_t count, off_t position) {
+  theSystem.beforeRead(++theSystem.reads);
+  if (position <= theSystem.brokenByte &&
+      theSystem.brokenByte < position + static_cast<off_t>(count)) {
+    errno = EIO;
+    return -1;
+  }
+  return ::syscall(SYS_pread64, fd, bytes, std::min(count, theSystem.mostAtOnce), position);
+}
+
+extern "C" int posix_fadvise(int /*fd*/, off_t /*from*/, off_t /*length*/, int advice) {
+  theSystem.advice.push_back(advice);
+  return theSystem.takesAdvice ? 0 : EINVAL;
+}
+
+namespace quavel::test {
+namespace {
+
+class FileTest : public testing::Test {
+ protected:
+  void SetUp() override { theSystem = {}; }
+  void TearDown() override { theSystem = {}; }
+};
+
+std::string describePath(TemporaryFile const& file) {
+  return describe(QVReader(file.path).metadata);
+}
+
+TEST_F(FileTest, IsReadInOneReadWithOneAdvice) {
+  for (Fixture const& fixture : fixtures()) {
+    SCOPED_TRACE(fixture.name);
+    TemporaryFile const file(fixture.bytes(kII), fixture.extension);
+    for (bool const takesAdvice : {true, false}) {
+      theSystem = {};
+      theSystem.takesAdvice = takesAdvice;
+      EXPECT_EQ(describePath(file), fixture.expected);
+      EXPECT_EQ(theSystem.reads, 1);
+      EXPECT_EQ(theSystem.advice, std::vector<int>{POSIX_FADV_RANDOM});
+    }
+  }
+  theSystem = {};
+  TemporaryFile const unknown("anything", "txt");
+  EXPECT_FALSE(QVReader(unknown.path).metadata);
+  EXPECT_FALSE(QVReader("/nonexistent/photo.jpg").metadata);
+  EXPECT_EQ(theSystem.reads, 0);
+  EXPECT_TRUE(theSystem.advice.empty());
+}
+
+TEST_F(FileTest, TakesAnotherReadForWhatLiesBeyond16KB) {
+  for (auto const& [size, reads] : {std::pair{16000, 1}, {20000, 2}}) {
+    Bytes const bytes = "\xff\xd8" + segment(0xffe1, Bytes(size, 'x')) + sof0();
+    TemporaryFile const file(bytes, "jpg");
+    theSystem = {};
+    EXPECT_EQ(describePath(file), "width=4000 height=3000");
+    EXPECT_EQ(theSystem.reads, reads);
+  }
+}
+
+/// Read without any buffer; fails as the system does.
+struct PlainFile : QVFStream {
+  using QVFStream::QVFStream;
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    long const position = getOffset() + static_cast<long>(baseOffset);
+    bool const isBroken = position <= theSystem.brokenByte &&
+                          theSystem.brokenByte < position + static_cast<long>(count);
+    return isBroken ? -1 : QVFStream::readBuffer(destination, count);
+  }
+};
+
+TEST_F(FileTest, GivesWhatAPlainReadGivesWhateverByteIsBroken) {
+  for (Fixture const& fixture : fixtures()) {
+    SCOPED_TRACE(fixture.name);
+    Bytes const bytes = fixture.bytes(kMM);
+    TemporaryFile const file(bytes, fixture.extension);
+    for (off_t broken = 0; broken <= static_cast<off_t>(bytes.size()); ++broken) {
+      theSystem.brokenByte = broken;
+      std::shared_ptr<QVStream> plain = std::make_shared<PlainFile>(file.path);
+      auto record = QVReader("").createMetadata(fixture.extension);
+      std::string const expected = record->read(plain) ? describe(*record) : "none";
+      for (std::size_t const mostAtOnce : {std::size_t{SIZE_MAX}, std::size_t{50}}) {
+        theSystem.mostAtOnce = mostAtOnce;
+        ASSERT_EQ(describePath(file), expected) << broken << " of " << bytes.size();
+      }
+    }
+  }
+}
+
+TEST_F(FileTest, ThatShrinksGivesItsRecordOrNone) {
+  for (Fixture const& fixture : fixtures()) {
+    SCOPED_TRACE(fixture.name);
+    Bytes const bytes = fixture.bytes(kII);
+    bool const isJpeg = fixture.extension[0] == 'j';  // may end between two segments
+    for (int read = 1; read <= theSystem.reads + 1; ++read) {
+      TemporaryFile const file(bytes, fixture.extension);
+      theSystem = {};
+      theSystem.mostAtOnce = 40;
+      theSystem.beforeRead = [&](int number) {
+        if (number == read) {
+          std::filesystem::resize_file(file.path, 0);
+        }
+      };
+      std::string const found = describePath(file);
+      EXPECT_TRUE(found == fixture.expected || found == "none" || isJpeg) << read << found;
+      EXPECT_TRUE(found == fixture.expected || theSystem.reads >= read) << read;
+    }
+  }
+}
+
+TEST_F(FileTest, ThatIsWalkedToItsEndIsForeseen) {
+  Bytes bytes = "\xff\xd8";
+  for (int i = 0; i < 40; ++i) {
+    bytes += segment(0xffe2, Bytes(30000, '\0'));
+  }
+  bytes += sof0() + segment(0xffe1, "none");
+  TemporaryFile const file(bytes, "jpg");
+  EXPECT_EQ(describePath(file), "width=4000 height=3000");
+  EXPECT_EQ(theSystem.advice, (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED}));
+}
+
+TEST_F(FileTest, ThatIsAPipeIsReadFrontToBack) {
+  Fixture const& fixture = fixtures().front();
+  std::string const path = testing::TempDir() + "quavel_pipe." + fixture.extension;
+  std::filesystem::remove(path);
+  ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
+  std::thread writer([&] { std::ofstream(path, std::ios::binary) << fixture.bytes(kII); });
+  theSystem.takesAdvice = false;  // for a pipe, none is
+  EXPECT_EQ(describe(QVReader(path).metadata), fixture.expected);
+  writer.join();
+  std::filesystem::remove(path);
+}
+
+}  // namespace
+}  // namespace quavel::test
