@@ -32,7 +32,7 @@ enum class QVReason : std::uint8_t {
   UnknownExtension,  ///< The extension names no format.
   CannotOpen,        ///< The system cannot open the file.
   ReadError,         ///< The system or the stream cannot read on.
-  Empty,             ///< There is not a single byte.
+  Empty,             ///< There is not a single byte at the path or in the buffer.
   CutShort,          ///< The data ends before a part that is needed.
   OtherKind,         ///< The data does not begin as a file or structure of this kind does.
   MalformedEntry,    ///< A directory entry has a wrong type or a wrong number of values.

@@ -7,6 +7,7 @@
 #include "formats/JpegWalk.h"
 #include "formats/Steps.h"
 #include "quavel/QVStream.h"
+#include "stream/Bytes.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -126,8 +127,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
   Journal* const journal = journalOf(*stream);
   std::int64_t const baseOffset = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
-  if (stream->readBuffer(identifier.data(), identifier.size()) !=
-      static_cast<std::int64_t>(identifier.size())) {
+  if (!readExactly(*stream, identifier.data(), identifier.size())) {
     return refuseCut(journal, walk.start + kPayloadPosition, identifier.size(),
                      "the identifier of the APP1 segment at {}", Offset{walk.start});
   }

@@ -66,7 +66,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
   std::array<std::uint8_t, 8> magic;
-  if (stream->readBuffer(magic.data(), magic.size()) != static_cast<std::int64_t>(magic.size())) {
+  if (!readExactly(*stream, magic.data(), magic.size())) {
     return refuseCut(journal, 0, magic.size(), "the file's magic \"FUJIFILM\"");
   }
   if (magic != kMagic) {

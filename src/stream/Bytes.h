@@ -62,6 +62,18 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
+/// Reads in one piece. False: the stream delivers another number of bytes than asked for.
+inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t count) {
+  std::int64_t const delivered = stream.readBuffer(destination, count);
+  if (delivered == static_cast<std::int64_t>(count)) {
+    return true;
+  }
+  if (delivered < 0) {
+    noteReadResult(stream, delivered, 0);
+  }
+  return false;
+}
+
 /// Reads until `count` bytes are there or the data ends, for a stream may deliver less at a time
 /// than is asked for. Returns how many there are.
 inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::size_t count) {

@@ -1,6 +1,5 @@
 #include "quavel/QVStream.h"
 
-#include "journal/Reading.h"
 #include "stream/Bytes.h"
 
 namespace quavel {
@@ -20,11 +19,7 @@ void reverseUnlessHostIs(ByteOrder order, QVStream const& stream, Number* number
 template <class Number>
 bool readNumber(QVStream& stream, Number* number) {
   auto* const bytes = reinterpret_cast<std::uint8_t*>(number);
-  std::int64_t const delivered = stream.readBuffer(bytes, sizeof(Number));
-  if (delivered != static_cast<std::int64_t>(sizeof(Number))) {
-    if (delivered < 0) {
-      detail::noteReadResult(stream, delivered, 0);
-    }
+  if (!detail::readExactly(stream, bytes, sizeof(Number))) {
     return false;
   }
   if constexpr (sizeof(Number) > 1) {
