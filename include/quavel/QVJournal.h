@@ -53,8 +53,8 @@ enum class QVReason : std::uint8_t {
 
 /// One thing that happened while a file was read.
 struct QVNote {
-  QVNoteKind kind = QVNoteKind::Step;
-  QVReason reason = QVReason::None;
+  QVNoteKind kind = QVNoteKind::Step;  ///< What the note tells.
+  QVReason reason = QVReason::None;    ///< For programs.
   /// In bytes from the file's first one; -1: of no place in particular.
   std::int64_t position = -1;
   /// Of an absence: the name of the record's member, such as "fNumber"; else empty.

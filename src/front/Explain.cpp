@@ -54,7 +54,7 @@ constexpr FieldRow kFields[] = {
     {"fNumber", "", kCr3, isAbsentIn<&M::fNumber>},
 };
 
-QVNote absence(FieldRow const& row, Format const& format, Journal const& journal) {
+QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
   QVNote note = {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, "", 0};
   if ((row.families & format.family) == 0) {
     note.text = row.families == kCr3 ? "given by CR3 files only"

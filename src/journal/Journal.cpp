@@ -89,16 +89,14 @@ void Journal::hint(QVReason reason, std::int64_t position, char const* pattern, 
 }
 
 void Journal::absent(char const* field, QVReason reason, char const* pattern, Words words) {
-  auto found = std::find_if(absences_.begin(), absences_.end(),
-                            [field](QVNote const& note) { return note.field == field; });
-  if (found == absences_.end()) {
-    found = absences_.insert(found, {QVNoteKind::Absence, reason, -1, field, "", 0});
+  auto* note = absenceOf(field);
+  if (note == nullptr) {
+    note = &absences_.emplace_back();
   }
-  found->reason = reason;
-  found->text = composed(pattern, words);
+  *note = {QVNoteKind::Absence, reason, -1, field, composed(pattern, words), 0};
 }
 
-QVNote const* Journal::absenceOf(char const* field) const {
+QVNote* Journal::absenceOf(char const* field) {
   auto const found = std::find_if(absences_.begin(), absences_.end(),
                                   [field](QVNote const& note) { return note.field == field; });
   return found == absences_.end() ? nullptr : &*found;

@@ -33,7 +33,7 @@ class Journal {
   void absent(char const* field, QVReason reason, char const* pattern, Words words);
 
   /// The reason given for a field's absence by now, or null.
-  QVNote const* absenceOf(char const* field) const;
+  QVNote* absenceOf(char const* field);
   /// Whether a refusal was stated.
   bool isRefused() const { return isRefused_; }
 
