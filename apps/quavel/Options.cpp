@@ -5,7 +5,7 @@
 #include <thread>
 
 #include "photo/Photo.h"
-#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 

@@ -5,7 +5,6 @@
 #include "output/Forms.h"
 #include "output/Layout.h"
 #include "photo/Words.h"
-#include "terminal/Escape.h"
 #include "terminal/Text.h"
 
 namespace app {

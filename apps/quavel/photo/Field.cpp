@@ -1,12 +1,12 @@
 #include "photo/Field.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <type_traits>
 #include <utility>
 
 #include "photo/Words.h"
-#include "terminal/Escape.h"
 #include "terminal/Text.h"
 
 namespace app {
@@ -48,7 +48,7 @@ Value problem(Outcome const& outcome) {
 }
 
 Value pathBytes(Outcome const& outcome) {
-  if (isUtf8(outcome.path) && outcome.path.find('\0') == std::string::npos) {
+  if (pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";
@@ -123,12 +123,10 @@ std::vector<Field> const& allFields() {
 }
 
 Field const* fieldNamed(std::string_view name) {
-  for (auto const& field : allFields()) {
-    if (field.name == name) {
-      return &field;
-    }
-  }
-  return nullptr;
+  auto const& all = allFields();
+  auto const found = std::find_if(all.begin(), all.end(),
+                                  [name](Field const& field) { return field.name == name; });
+  return found == all.end() ? nullptr : &*found;
 }
 
 Fields recordFields() {

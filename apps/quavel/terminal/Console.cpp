@@ -6,7 +6,6 @@
 #include <cerrno>
 #include <string_view>
 
-#include "terminal/Escape.h"
 #include "terminal/Interrupt.h"
 #include "terminal/Text.h"
 
