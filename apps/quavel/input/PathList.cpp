@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <poll.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -18,14 +17,7 @@ constexpr std::size_t kStep = std::size_t{1} << 16;
 constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system takes none longer
 
 /// What the first read would say, before anything is put out. 0, or the system's error.
-int whyUnreadable(int fd) {
-  struct stat status = {};
-  int const flags = ::fcntl(fd, F_GETFL);
-  if (flags == -1 || (flags & O_ACCMODE) == O_WRONLY) {
-    return EBADF;
-  }
-  return ::fstat(fd, &status) == 0 && S_ISDIR(status.st_mode) ? EISDIR : 0;
-}
+int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 }  // namespace
 
@@ -56,18 +48,13 @@ bool PathList::isReady() {
 
 bool PathList::next(Input& input) {
   std::string path;
-  while (path.empty()) {
+  while (path.empty() && (start_ < buffer_.size() || refill())) {
     auto const end = buffer_.find(separator_, start_);
-    if (end == std::string::npos) {
-      if (refill()) {
-        continue;
-      }
-      path = buffer_.substr(start_);
-      start_ = buffer_.size();
-      break;
+    if (end == std::string::npos && refill()) {
+      continue;  // the path goes on
     }
     path = buffer_.substr(start_, end - start_);
-    start_ = end + 1;
+    start_ = end == std::string::npos ? buffer_.size() : end + 1;
   }
   input = entry(std::move(path));
   return !input.path.empty();

@@ -2,7 +2,6 @@
 
 #include <limits.h>
 #include <poll.h>
-#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -106,12 +105,6 @@ void Output::giveUp() noexcept {
     finish();
   } catch (...) {  // NOLINT(bugprone-empty-catch): the caller reports what came first
   }
-}
-
-std::size_t Output::terminalWidth() {
-  winsize size = {};
-  bool const isKnown = ::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
-  return isKnown ? size.ws_col : 80;
 }
 
 }  // namespace app
