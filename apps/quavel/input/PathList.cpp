@@ -19,6 +19,19 @@ constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system tak
 /// What the first read would say, before anything is put out. 0, or the system's error.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
+Input entryOf(std::string const& path) {
+  Input input;
+  if (path.find('\0') != std::string::npos) {
+    input.problem = {reason::kBadPath,
+                     "the path holds a NUL; if the list is NUL-separated, add -0"};
+  } else if (path.size() > kLongestPath) {
+    input.problem = {reason::kBadPath,
+                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
+  }
+  input.path = path.substr(0, kLongestPath);
+  return input;
+}
+
 }  // namespace
 
 PathList::PathList(std::string const& name, char separator)
@@ -56,7 +69,7 @@ bool PathList::next(Input& input) {
     path = buffer_.substr(start_, end - start_);
     start_ = end == std::string::npos ? buffer_.size() : end + 1;
   }
-  input = entry(std::move(path));
+  input = entryOf(path);
   return !input.path.empty();
 }
 
@@ -79,22 +92,6 @@ bool PathList::refill() {
   atEnd_ = count <= 0;
   buffer_.resize(size + (count > 0 ? static_cast<std::size_t>(count) : 0));
   return !atEnd_;
-}
-
-Input PathList::entry(std::string path) const {
-  Input input;
-  if (path.find('\0') != std::string::npos) {
-    input.problem = {reason::kBadPath,
-                     "the path holds a NUL; if the list is NUL-separated, add -0"};
-  } else if (path.size() > kLongestPath) {
-    input.problem = {reason::kBadPath,
-                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
-  }
-  input.path = std::move(path);
-  if (input.problem && input.path.size() > kLongestPath) {
-    input.path.resize(kLongestPath);
-  }
-  return input;
 }
 
 }  // namespace app

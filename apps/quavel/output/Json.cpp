@@ -14,6 +14,7 @@ constexpr std::size_t kUsualObject = 700;
 
 bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }
 
+/// Appends a value. Nearly all texts are plain; the others are left to the JSON library.
 void append(std::string& json, Value const& value) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);

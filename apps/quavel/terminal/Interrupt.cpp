@@ -1,6 +1,5 @@
 #include "terminal/Interrupt.h"
 
-#include <signal.h>
 #include <unistd.h>
 
 #include <atomic>
