@@ -36,6 +36,8 @@ std::size_t cellsOf(Character const& character) {
     case UTF8PROC_BOUNDCLASS_V:
     case UTF8PROC_BOUNDCLASS_T:
       return 0;  // the later letters of a Hangul syllable, within the cells of the first
+    case UTF8PROC_BOUNDCLASS_PREPEND:
+      return 1;  // also the Arabic signs that enclose a number
     default:
       // Unlike other marks, these stand beside their letter.
       return property->category == UTF8PROC_CATEGORY_MC ? 1 : property->charwidth;
@@ -52,7 +54,7 @@ bool isHidden(Character const& character) {
     case UTF8PROC_CATEGORY_ZP:
       return true;
     case UTF8PROC_CATEGORY_CF:
-      // Scripts and emoji need the joiners; the signs that enclose a number are seen.
+      // Scripts and emoji need the joiners; the Arabic signs that enclose a number are seen.
       return character.code != kNonJoiner && character.code != kJoiner &&
              utf8proc_get_property(character.code)->boundclass != UTF8PROC_BOUNDCLASS_PREPEND;
     default:
