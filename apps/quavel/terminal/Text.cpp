@@ -73,9 +73,9 @@ std::string shown(Character const& character) {
   return text;
 }
 
-bool isAscii(std::string_view text) {
-  return std::all_of(text.begin(), text.end(),
-                     [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+/// It is visible ASCII, as nearly all texts are: not worth a look at each character.
+bool isPlain(std::string_view text) {
+  return std::all_of(text.begin(), text.end(), [](char c) { return ' ' <= c && c <= '~'; });
 }
 
 bool isUtf8(std::string_view text) {
@@ -89,7 +89,7 @@ bool isUtf8(std::string_view text) {
 }  // namespace
 
 std::string textAsUtf8(std::string text) {
-  if (isAscii(text) || isUtf8(text)) {
+  if (isPlain(text) || isUtf8(text)) {
     return text;
   }
   std::string utf8;
@@ -102,8 +102,8 @@ std::string textAsUtf8(std::string text) {
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isAscii(path) && path.find('\0') == std::string::npos) {
-    return path;  // as nearly all are: not worth a look at each character
+  if (isPlain(path)) {
+    return path;
   }
   std::string utf8;
   for (std::string_view rest = path; !rest.empty();) {
@@ -114,6 +114,9 @@ std::string pathAsUtf8(std::string const& path) {
 }
 
 std::string escaped(std::string const& text) {
+  if (isPlain(text)) {
+    return text;
+  }
   std::string result;
   for (std::string_view rest = text; !rest.empty();) {
     Character const next = takeCharacter(rest);
@@ -127,7 +130,7 @@ std::string escaped(std::string const& text) {
 }
 
 std::size_t cells(std::string_view text) {
-  if (isAscii(text)) {
+  if (isPlain(text)) {
     return text.size();
   }
   std::size_t sum = 0;
