@@ -2,10 +2,11 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <sstream>
 #include <thread>
 
 #include "photo/Photo.h"
-#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 
@@ -38,35 +39,25 @@ class ShortFormatter : public CLI::Formatter {
   std::string make_positionals(CLI::App const* /*app*/) const override { return {}; }
 };
 
-std::string fieldNames() {
-  std::string names;
-  for (auto const& field : allFields()) {
-    names.append(names.empty() ? "" : " ").append(field.name);
-  }
-  return names;
-}
-
 Field const* wantedField(std::string const& option, std::string const& name) {
   Field const* const field = fieldNamed(name);
   if (field == nullptr) {
+    auto const nameOf = [](Field const& known) { return std::string(known.name); };
     throw CLI::ValidationError(option + ": no field is called '" + name +
-                               "'; choose from: " + fieldNames());
+                               "'; choose from: " + CLI::detail::join(allFields(), nameOf, " "));
   }
   return field;
 }
 
-/// Splits by hand: the parser's own lists pass over empty names.
-void addFields(std::string_view list, Fields& fields) {
-  for (bool isLast = false; !isLast;) {
-    auto const comma = list.find(',');
-    isLast = comma == std::string_view::npos;
-    std::string const name(list.substr(0, comma));
+/// The parser's own lists pass over empty names.
+void addFields(std::string const& list, Fields& fields) {
+  std::istringstream names(list + ',');  // each name is then ended, an empty last one too
+  for (std::string name; std::getline(names, name, ',');) {
     auto const* const field = wantedField("--fields", name);
     if (std::count(fields.begin(), fields.end(), field) > 0) {
       throw CLI::ValidationError("--fields: '" + name + "' is named twice");
     }
     fields.push_back(field);
-    list.remove_prefix(isLast ? list.size() : comma + 1);
   }
 }
 

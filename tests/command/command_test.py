@@ -228,6 +228,19 @@ class Names(CommandTest):
         usage = self.run_quavel("--\x1b[31m", status=2)
         self.assertNotIn(b"\x1b", usage.stderr)
 
+    def test_columns_follow_the_script(self):
+        self.put("b.cr3", cr3(model=b"x" * 40))
+        for model, shown, width in (
+                ("e\u0301\u20dd", "e\u0301\u20dd", 1), ("漢字", "漢字", 4), ("हिन्दी", "हिन्दी", 5),
+                ("\u1112\u1161\u11ab", "\u1112\u1161\u11ab", 2),  # 한 as macOS stores it
+                ("❤\ufe0f\u200dن\u200c", "❤\ufe0f\u200dن\u200c", 2), ("\u06dd٠", "\u06dd٠", 2),
+                ("a\u00adb\u2028\ufeff\x85", r"a\u{00ad}b\u{2028}\u{feff}\u{0085}", 34),
+                ("\U000e0041\u061c", r"\u{e0041}\u{061c}", 17)):
+            self.put("a.cr3", cr3(model=model.encode()))
+            table = self.run_quavel("--fields", "model,iso", ".").stdout.decode().splitlines()
+            self.assertEqual(table[1], shown + " " * (42 - width) + "400")
+            self.assertEqual(table[2], "x" * 40 + "  400")
+
     def test_bytes_beyond_utf8_end_no_run(self):
         for bad in (b"\xf4\x90\x80\x80", b"\xf8\x88\x80\x80\x80", b"\xfc\x84\x80\x80\x80\x80",
                     b"\xed\xa0\x80", b"\xc0\xaf", b"\xe0\x80\xaf", b"\xf0\x8f\xbf\xbf"):

@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <poll.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -18,13 +17,19 @@ constexpr std::size_t kStep = std::size_t{1} << 16;
 constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system takes none longer
 
 /// What the first read would say, before anything is put out. 0, or the system's error.
-int whyUnreadable(int fd) {
-  struct stat status = {};
-  int const flags = ::fcntl(fd, F_GETFL);
-  if (flags == -1 || (flags & O_ACCMODE) == O_WRONLY) {
-    return EBADF;
+int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
+
+Input entryOf(std::string const& path) {
+  Input input;
+  if (path.find('\0') != std::string::npos) {
+    input.problem = {reason::kBadPath,
+                     "the path holds a NUL; if the list is NUL-separated, add -0"};
+  } else if (path.size() > kLongestPath) {
+    input.problem = {reason::kBadPath,
+                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
   }
-  return ::fstat(fd, &status) == 0 && S_ISDIR(status.st_mode) ? EISDIR : 0;
+  input.path = path.substr(0, kLongestPath);
+  return input;
 }
 
 }  // namespace
@@ -56,20 +61,15 @@ bool PathList::isReady() {
 
 bool PathList::next(Input& input) {
   std::string path;
-  while (path.empty()) {
+  while (path.empty() && (start_ < buffer_.size() || refill())) {
     auto const end = buffer_.find(separator_, start_);
-    if (end == std::string::npos) {
-      if (refill()) {
-        continue;
-      }
-      path = buffer_.substr(start_);
-      start_ = buffer_.size();
-      break;
+    if (end == std::string::npos && refill()) {
+      continue;  // the path goes on
     }
     path = buffer_.substr(start_, end - start_);
-    start_ = end + 1;
+    start_ = end == std::string::npos ? buffer_.size() : end + 1;
   }
-  input = entry(std::move(path));
+  input = entryOf(path);
   return !input.path.empty();
 }
 
@@ -92,22 +92,6 @@ bool PathList::refill() {
   atEnd_ = count <= 0;
   buffer_.resize(size + (count > 0 ? static_cast<std::size_t>(count) : 0));
   return !atEnd_;
-}
-
-Input PathList::entry(std::string path) const {
-  Input input;
-  if (path.find('\0') != std::string::npos) {
-    input.problem = {reason::kBadPath,
-                     "the path holds a NUL; if the list is NUL-separated, add -0"};
-  } else if (path.size() > kLongestPath) {
-    input.problem = {reason::kBadPath,
-                     "longer than a path can be; if the list is not NUL-separated, leave out -0"};
-  }
-  input.path = std::move(path);
-  if (input.problem && input.path.size() > kLongestPath) {
-    input.path.resize(kLongestPath);
-  }
-  return input;
 }
 
 }  // namespace app

@@ -26,7 +26,6 @@ class PathList {
 
  private:
   bool refill();
-  Input entry(std::string path) const;
 
   int fd_;
   char separator_;

@@ -1,40 +1,15 @@
 #include "input/Walk.h"
 
-#include <dirent.h>
 #include <sys/stat.h>
 
 #include <algorithm>
 #include <cerrno>
-#include <cstring>
 #include <memory>
 
 #include "photo/Photo.h"
 #include "photo/Reasons.h"
 
 namespace app {
-
-namespace {
-
-constexpr char kFile = 'f';
-constexpr char kFolder = 'd';
-constexpr char kOther = 'o';    // a FIFO, a socket or a device
-constexpr char kUnknown = '?';  // a symbolic link, or the file system does not say
-
-char typeOf(unsigned char type) {
-  switch (type) {
-    case DT_REG:
-      return kFile;
-    case DT_DIR:
-      return kFolder;
-    case DT_LNK:
-    case DT_UNKNOWN:
-      return kUnknown;
-    default:
-      return kOther;
-  }
-}
-
-}  // namespace
 
 Walk::Walk(std::string const& folder, Report report) : report_(std::move(report)) {
   enter(folder, false);
@@ -48,31 +23,33 @@ bool Walk::next(Input& input) {
       return true;
     }
     Level& level = levels_.back();
-    if (level.next == level.starts.size()) {
+    if (level.entries.empty()) {
       levels_.pop_back();
       continue;
     }
-    char const* const entry = level.names.data() + level.starts[level.next++];
-    if (visit(entry[0], level.path + (entry + 1), input)) {
+    Entry const entry = std::move(level.entries.back());
+    level.entries.pop_back();
+    if (visit(entry.type, level.path + entry.name, input)) {
       return true;
     }
   }
   return false;
 }
 
-bool Walk::visit(char type, std::string path, Input& input) {
+bool Walk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
-    case kFile:
+    case DT_REG:
       input = {std::move(path), true, {}};
       return true;
-    case kFolder:
+    case DT_DIR:
       enter(path, false);
       return false;
-    case kOther:
+    case DT_LNK:
+    case DT_UNKNOWN:  // not every file system says it here
+      return visitUnknown(std::move(path), input);
+    default:
       report_(path, "is not a regular file; passed over");
       return false;
-    default:
-      return visitUnknown(std::move(path), input);
   }
 }
 
@@ -93,14 +70,11 @@ bool Walk::visitUnknown(std::string path, Input& input) {
   if (!isPhotoExtension(extensionOf(path))) {
     return false;
   }
-  return visit(S_ISREG(status.st_mode) ? kFile : kOther, std::move(path), input);
+  return visit(S_ISREG(status.st_mode) ? DT_REG : DT_CHR, std::move(path), input);
 }
 
 void Walk::enter(std::string const& path, bool isLink) {
-  struct Close {
-    void operator()(DIR* folder) const { ::closedir(folder); }
-  };
-  std::unique_ptr<DIR, Close> const folder(::opendir(path.c_str()));
+  std::unique_ptr<DIR, int (*)(DIR*)> const folder(::opendir(path.c_str()), ::closedir);
   struct stat status = {};
   if (!folder || ::fstat(::dirfd(folder.get()), &status) == -1) {
     return miss(path, errno);
@@ -109,13 +83,8 @@ void Walk::enter(std::string const& path, bool isLink) {
   if (isRepeated(path, identity, isLink)) {
     return;
   }
-  Level level;
-  level.path = path;
-  if (level.path.back() != '/') {
-    level.path += '/';
-  }
-  level.identity = identity;
-  readNames(folder.get(), level);
+  Level level = {path.back() == '/' ? path : path + '/', identity, {}};
+  readEntries(folder.get(), level);
   levels_.push_back(std::move(level));
 }
 
@@ -133,20 +102,23 @@ bool Walk::isRepeated(std::string const& path, Identity const& identity, bool is
   return false;
 }
 
-void Walk::readNames(void* folder, Level& level) {
+void Walk::readEntries(DIR* folder, Level& level) {
   errno = 0;
-  while (dirent const* const entry = ::readdir(static_cast<DIR*>(folder))) {
-    addName(level, typeOf(entry->d_type), entry->d_name);
+  while (dirent const* const entry = ::readdir(folder)) {
+    std::string name = entry->d_name;
+    unsigned char const type = entry->d_type;
+    bool const isWanted = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN ||
+                          isPhotoExtension(extensionOf(name));
+    if (isWanted && name != "." && name != "..") {
+      level.entries.push_back({std::move(name), type});
+    }
     errno = 0;
   }
   if (errno != 0) {
     miss(level.path, errno);
   }
-  level.names.shrink_to_fit();
-  char const* const names = level.names.data();
-  std::sort(level.starts.begin(), level.starts.end(), [names](std::size_t a, std::size_t b) {
-    return std::strcmp(names + a + 1, names + b + 1) < 0;
-  });
+  std::sort(level.entries.begin(), level.entries.end(),
+            [](Entry const& a, Entry const& b) { return a.name > b.name; });
 }
 
 void Walk::miss(std::string const& path, int error) {
@@ -154,18 +126,6 @@ void Walk::miss(std::string const& path, int error) {
              false,
              {reason::kUnreadableFolder, "the folder cannot be read: " + reason::systemText(error) +
                                              "; its photos are missing"}};
-}
-
-void Walk::addName(Level& level, char type, char const* name) {
-  if (std::strcmp(name, ".") == 0 || std::strcmp(name, "..") == 0) {
-    return;
-  }
-  bool const isWanted = type == kFolder || type == kUnknown || isPhotoExtension(extensionOf(name));
-  if (isWanted) {
-    level.starts.push_back(level.names.size());
-    level.names += type;
-    level.names.append(name, std::strlen(name) + 1);
-  }
 }
 
 }  // namespace app

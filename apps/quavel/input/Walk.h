@@ -1,6 +1,7 @@
 #ifndef QUAVEL_APPS_WALK_H
 #define QUAVEL_APPS_WALK_H
 
+#include <dirent.h>
 #include <sys/types.h>
 
 #include <functional>
@@ -29,20 +30,21 @@ class Walk {
 
  private:
   using Identity = std::pair<dev_t, ino_t>;
+  struct Entry {
+    std::string name;
+    unsigned char type;  // the system's, such as DT_REG
+  };
   struct Level {
     std::string path;  // with a "/" at the end
     Identity identity;
-    std::string names;  // each a type, a name and a NUL, in the order of the disk
-    std::vector<std::size_t> starts;
-    std::size_t next = 0;
+    std::vector<Entry> entries;  // still to be visited, the last one first
   };
 
   void enter(std::string const& path, bool isLink);
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
-  void readNames(void* folder, Level& level);
+  void readEntries(DIR* folder, Level& level);
   void miss(std::string const& path, int error);
-  void addName(Level& level, char type, char const* name);
-  bool visit(char type, std::string path, Input& input);
+  bool visit(unsigned char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
 
   Report report_;

@@ -2,7 +2,7 @@
 #include <sstream>
 
 #include "output/Forms.h"
-#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 

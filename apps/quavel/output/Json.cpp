@@ -12,40 +12,26 @@ namespace {
 // Room for a usual record: growing the text step by step would cost more than filling it.
 constexpr std::size_t kUsualObject = 700;
 
-/// Appends a value. Nearly all texts are ASCII; the others are left to the JSON library.
-struct AppendJson {
-  using Handler = nlohmann::json::error_handler_t;
+bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }
 
-  std::string& json;
-
-  void operator()(std::monostate) const { json += "null"; }
-  void operator()(bool value) const { json += value ? "true" : "false"; }
-  template <class Integer>
-  void operator()(Integer value) const {
-    json += std::to_string(value);
-  }
-  void operator()(float value) const {
-    bool const isNumber = std::isfinite(value);
-    json.append(isNumber ? "" : "\"").append(exact(value)).append(isNumber ? "" : "\"");
-  }
-  void operator()(std::string const& value) const {
-    std::size_t const start = json.size();
+/// Appends a value. Nearly all texts are plain; the others are left to the JSON library.
+void append(std::string& json, Value const& value) {
+  auto const* const text = std::get_if<std::string>(&value);
+  auto const* const number = std::get_if<float>(&value);
+  if (std::holds_alternative<std::monostate>(value)) {
+    json += "null";
+  } else if (text != nullptr && std::all_of(text->begin(), text->end(), isPlain)) {
     json += '"';
-    auto begin = value.begin();
-    auto end = std::find_if_not(begin, value.end(), isPlain);
-    while (end != value.end() && (*end == '"' || *end == '\\')) {
-      json.append(begin, end) += '\\';
-      begin = end;
-      end = std::find_if_not(begin + 1, value.end(), isPlain);
-    }
-    json.append(begin, end) += '"';
-    if (end != value.end()) {
-      json.resize(start);
-      json += nlohmann::json(value).dump(-1, ' ', false, Handler::replace);
-    }
+    json += *text;
+    json += '"';
+  } else if (text != nullptr) {
+    json += nlohmann::json(*text).dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
+  } else if (number != nullptr && std::isinf(*number)) {
+    json += '"' + exact(value) + '"';
+  } else {
+    json += exact(value);
   }
-  static bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }
-};
+}
 
 constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};
 
@@ -85,7 +71,7 @@ using Members = std::vector<Member>;
 Members membersOf(Fields const& fields) {
   Members members;
   for (auto const* field : fields) {
-    members.push_back({field, "\"" + std::string(field->name) + "\":"});
+    members.push_back({field, '"' + std::string(field->name) + "\":"});
   }
   return members;
 }
@@ -98,19 +84,17 @@ class JsonObjects {
 
  private:
   Members members_;
-  Members errorMembers_;
-  Members bytesOfErrors_;  // pathBytes, shown where it is needed
-  Members pathBytes_;      // the same, unless the fields name it or leave out the path
+  Members const errorMembers_ = membersOf(
+      {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"), fieldNamed("position")});
+  Members const bytesOfErrors_ = membersOf({fieldNamed("pathBytes")});  // shown where needed
+  Members pathBytes_;  // the same, unless the fields name it or leave out the path
   bool showAbsent_;
   bool hasNotes_;
   bool endsLine_;
 };
 
 JsonObjects::JsonObjects(Form const& form)
-    : errorMembers_(membersOf(
-          {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"), fieldNamed("position")})),
-      bytesOfErrors_(membersOf({fieldNamed("pathBytes")})),
-      showAbsent_(form.showAbsent.value_or(true)),
+    : showAbsent_(form.showAbsent.value_or(true)),
       hasNotes_(form.hasNotes),
       endsLine_(form.kind == FormKind::Jsonl) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
@@ -123,18 +107,18 @@ JsonObjects::JsonObjects(Form const& form)
 std::string JsonObjects::operator()(Outcome const& outcome) const {
   std::string object;
   object.reserve(kUsualObject);
-  auto const append = [&](Members const& members, bool showAbsent) {
+  auto const add = [&](Members const& members, bool showAbsent) {
     for (auto const& member : members) {
       Value const value = member.field->value(outcome);
       if (showAbsent || !std::holds_alternative<std::monostate>(value)) {
         object += object.empty() ? '{' : ',';
         object += member.name;
-        std::visit(AppendJson{object}, value);
+        append(object, value);
       }
     }
   };
-  append(outcome.record ? members_ : errorMembers_, showAbsent_);
-  append(outcome.record ? pathBytes_ : bytesOfErrors_, false);
+  add(outcome.record ? members_ : errorMembers_, showAbsent_);
+  add(outcome.record ? pathBytes_ : bytesOfErrors_, false);
   if (hasNotes_) {
     object.append(1, object.empty() ? '{' : ',').append(notesOf(outcome));
   }

@@ -51,12 +51,10 @@ std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& wi
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
   while (true) {
     Widths widths = natural;
-    if (line == kUnlimited) {
-      return widths;
+    // No column needs more than the whole line; the cut also bounds the shortening.
+    for (auto& width : widths) {
+      width = std::min(width, line);
     }
-    // No column needs more than the whole line; the cut also bounds the loop below.
-    std::transform(widths.begin(), widths.end(), widths.begin(),
-                   [line](std::size_t width) { return std::min(width, line); });
     shorten(columns, widths, line);
     std::size_t const dispensable = mostDispensable(columns, widths);
     if (lineWidth(widths) <= line || dispensable == columns.size()) {

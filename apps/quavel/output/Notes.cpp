@@ -3,7 +3,7 @@
 
 #include "output/Forms.h"
 #include "photo/Photo.h"
-#include "terminal/Escape.h"
+#include "terminal/Text.h"
 
 namespace app {
 

@@ -2,7 +2,6 @@
 
 #include <limits.h>
 #include <poll.h>
-#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -17,9 +16,8 @@ namespace app {
 
 namespace {
 
-/// Writes all of a piece, unless an interrupt comes before any of it is out. 0, or the system's
-/// error.
-int writeAll(std::string_view bytes) {
+/// Writes all of a piece, unless an interrupt comes before any of it is out.
+void write(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
     ssize_t const count = ::write(STDOUT_FILENO, bytes.data(), bytes.size());
@@ -29,23 +27,14 @@ int writeAll(std::string_view bytes) {
     } else if (errno == EAGAIN) {
       pollfd waiting = {STDOUT_FILENO, POLLOUT, 0};
       ::poll(&waiting, 1, -1);
+    } else if (errno == EPIPE) {
+      throw OutputClosed();
     } else if (errno != EINTR) {
-      return errno;
+      throw std::system_error(errno, std::generic_category());
     }
     if (!isBegun) {
       interrupt::leaveIfAsked();
     }
-  }
-  return 0;
-}
-
-void write(std::string_view bytes) {
-  int const error = writeAll(bytes);
-  if (error == EPIPE) {
-    throw OutputClosed();
-  }
-  if (error != 0) {
-    throw std::system_error(error, std::generic_category());
   }
 }
 
@@ -106,12 +95,6 @@ void Output::giveUp() noexcept {
     finish();
   } catch (...) {  // NOLINT(bugprone-empty-catch): the caller reports what came first
   }
-}
-
-std::size_t Output::terminalWidth() {
-  winsize size = {};
-  bool const isKnown = ::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
-  return isKnown ? size.ws_col : 80;
 }
 
 }  // namespace app

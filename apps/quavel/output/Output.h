@@ -30,8 +30,6 @@ class Output {
   void giveUp() noexcept;
 
   bool isTerminal() const { return isTerminal_; }
-  /// Cells in a line of the terminal.
-  static std::size_t terminalWidth();
 
  private:
   Console& console_;

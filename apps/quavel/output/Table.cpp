@@ -1,11 +1,14 @@
+#include <unistd.h>
+
 #include <algorithm>
 #include <atomic>
 #include <chrono>
+#include <functional>
 
 #include "output/Forms.h"
 #include "output/Layout.h"
 #include "photo/Words.h"
-#include "terminal/Escape.h"
+#include "terminal/Console.h"
 #include "terminal/Text.h"
 
 namespace app {
@@ -55,15 +58,7 @@ std::vector<Column> columnsOf(Fields const& fields) {
 }
 
 bool isWithin(Widths const& inner, Widths const& outer) {
-  if (outer.empty()) {
-    return false;
-  }
-  for (std::size_t i = 0; i < inner.size(); ++i) {
-    if (inner[i] > outer[i]) {
-      return false;
-    }
-  }
-  return true;
+  return std::equal(inner.begin(), inner.end(), outer.begin(), outer.end(), std::less_equal<>());
 }
 
 class Table : public Writer {
@@ -177,7 +172,7 @@ Widths Table::naturalWidths() const {
 }
 
 void Table::useLayout(Widths const& natural) {
-  std::size_t const line = output_.isTerminal() ? Output::terminalWidth() : kUnlimited;
+  std::size_t const line = output_.isTerminal() ? terminalWidth(STDOUT_FILENO) : kUnlimited;
   if (line == line_ && isWithin(natural, natural_)) {
     return;
   }

@@ -1,12 +1,12 @@
 #include "photo/Field.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <type_traits>
 #include <utility>
 
 #include "photo/Words.h"
-#include "terminal/Escape.h"
 #include "terminal/Text.h"
 
 namespace app {
@@ -48,7 +48,7 @@ Value problem(Outcome const& outcome) {
 }
 
 Value pathBytes(Outcome const& outcome) {
-  if (isUtf8(outcome.path) && outcome.path.find('\0') == std::string::npos) {
+  if (pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";
@@ -61,9 +61,14 @@ Value pathBytes(Outcome const& outcome) {
   return hex;
 }
 
-template <class T, std::string (*words)(T)>
-std::string said(Value const& value) {
+template <class T>
+std::string applied(std::string (*words)(T), Value const& value) {
   return words(std::get<std::decay_t<T>>(value));
+}
+
+template <auto words>
+std::string said(Value const& value) {
+  return applied(words, value);
 }
 
 std::string plain(std::string const& text) { return text; }
@@ -72,72 +77,72 @@ std::string isoSpeed(std::int32_t value) { return number(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-constexpr auto kText = said<std::string const&, plain>;
-constexpr auto kDate = said<std::string const&, words::date>;
-constexpr auto kYesNo = said<bool, words::yesNo>;
-constexpr auto kPixels = said<std::int32_t, pixels>;
-constexpr auto kApex = said<float, words::apex>;
-constexpr auto kTime = said<float, words::exposureTime>;
-constexpr auto kFNumber = said<float, words::fNumber>;
+struct Exact {
+  std::string operator()(std::monostate) const { return {}; }
+  std::string operator()(bool value) const { return value ? "true" : "false"; }
+  std::string operator()(std::string const& value) const { return value; }
+  template <class Number>
+  std::string operator()(Number value) const {
+    if (std::is_same_v<Number, float> && std::isinf(value)) {
+      return value < 0 ? "-Infinity" : "Infinity";
+    }
+    char text[32];
+    auto const result = std::to_chars(std::begin(text), std::end(text), value);
+    return {std::begin(text), result.ptr};
+  }
+};
 
 }  // namespace
 
 std::vector<Field> const& allFields() {
   using M = QVMetadata;
   static std::vector<Field> const fields = {
-      {"path", "File", path, kText},
-      {"captureDate", "Captured", captureDate, kDate},
-      {"width", "Width", valueOf<&M::width>, kPixels},
-      {"height", "Height", valueOf<&M::height>, kPixels},
-      {"orientation", "Orientation", valueOf<&M::orientation>,
-       said<std::int32_t, words::orientation>},
-      {"isRaw", "Raw format", valueOf<&M::isRaw>, kYesNo},
-      {"dateTimeOriginal", "Original date", valueOf<&M::dateTimeOriginal>, kDate},
-      {"dateTimeDigitized", "Digitized date", valueOf<&M::dateTimeDigitized>, kDate},
-      {"dateTime", "File date", valueOf<&M::dateTime>, kDate},
-      {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, kYesNo},
-      {"model", "Camera", valueOf<&M::model>, kText},
-      {"lensModel", "Lens", valueOf<&M::lensModel>, kText},
-      {"iso", "ISO", valueOf<&M::iso>, said<std::int32_t, isoSpeed>},
-      {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, kFNumber},
-      {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>, kTime},
-      {"apertureValue", "Aperture value", valueOf<&M::apertureValue>, kApex},
-      {"shutterSpeedValue", "Shutter value", valueOf<&M::shutterSpeedValue>, kApex},
-      {"focalLength", "Focal length", valueOf<&M::focalLength>, said<float, words::focalLength>},
-      {"whiteBalance", "White balance", valueOf<&M::whiteBalance>,
-       said<std::int32_t, words::whiteBalance>},
-      {"meteringMode", "Metering", valueOf<&M::meteringMode>,
-       said<std::int32_t, words::meteringMode>},
+      {"path", "File", path, said<plain>},
+      {"captureDate", "Captured", captureDate, said<words::date>},
+      {"width", "Width", valueOf<&M::width>, said<pixels>},
+      {"height", "Height", valueOf<&M::height>, said<pixels>},
+      {"orientation", "Orientation", valueOf<&M::orientation>, said<words::orientation>},
+      {"isRaw", "Raw format", valueOf<&M::isRaw>, said<words::yesNo>},
+      {"dateTimeOriginal", "Original date", valueOf<&M::dateTimeOriginal>, said<words::date>},
+      {"dateTimeDigitized", "Digitized date", valueOf<&M::dateTimeDigitized>, said<words::date>},
+      {"dateTime", "File date", valueOf<&M::dateTime>, said<words::date>},
+      {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, said<words::yesNo>},
+      {"model", "Camera", valueOf<&M::model>, said<plain>},
+      {"lensModel", "Lens", valueOf<&M::lensModel>, said<plain>},
+      {"iso", "ISO", valueOf<&M::iso>, said<isoSpeed>},
+      {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, said<words::fNumber>},
+      {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>,
+       said<words::exposureTime>},
+      {"apertureValue", "Aperture value", valueOf<&M::apertureValue>, said<words::apex>},
+      {"shutterSpeedValue", "Shutter value", valueOf<&M::shutterSpeedValue>, said<words::apex>},
+      {"focalLength", "Focal length", valueOf<&M::focalLength>, said<words::focalLength>},
+      {"whiteBalance", "White balance", valueOf<&M::whiteBalance>, said<words::whiteBalance>},
+      {"meteringMode", "Metering", valueOf<&M::meteringMode>, said<words::meteringMode>},
       {"exposureBiasValue", "Exposure bias", valueOf<&M::exposureBiasValue>,
-       said<float, words::exposureBias>},
+       said<words::exposureBias>},
       {"focalLengthIn35mmFilm", "In 35 mm film", valueOf<&M::focalLengthIn35mmFilm>,
-       said<std::int32_t, millimetres>},
-      {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, kTime},
-      {"fNumber", "F-number", valueOf<&M::fNumber>, kFNumber},
-      {"error", "Error", problem<&Problem::text>, kText},
-      {"reason", "Reason", problem<&Problem::reason>, kText},
-      {"position", "At byte", problem<&Problem::position>, said<std::int64_t, number>},
-      {"pathBytes", "File (hex)", pathBytes, kText},
+       said<millimetres>},
+      {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, said<words::exposureTime>},
+      {"fNumber", "F-number", valueOf<&M::fNumber>, said<words::fNumber>},
+      {"error", "Error", problem<&Problem::text>, said<plain>},
+      {"reason", "Reason", problem<&Problem::reason>, said<plain>},
+      {"position", "At byte", problem<&Problem::position>, said<number>},
+      {"pathBytes", "File (hex)", pathBytes, said<plain>},
   };
   return fields;
 }
 
 Field const* fieldNamed(std::string_view name) {
-  for (auto const& field : allFields()) {
-    if (field.name == name) {
-      return &field;
-    }
-  }
-  return nullptr;
+  auto const& all = allFields();
+  auto const found = std::find_if(all.begin(), all.end(),
+                                  [name](Field const& field) { return field.name == name; });
+  return found == all.end() ? nullptr : &*found;
 }
 
 Fields recordFields() {
   Fields fields;
-  for (auto const& field : allFields()) {
-    if (field.name == "error") {
-      break;
-    }
-    fields.push_back(&field);
+  for (auto const* field = &allFields().front(); field->name != "error"; ++field) {
+    fields.push_back(field);
   }
   return fields;
 }
@@ -155,13 +160,6 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   return keepStart(escaped(text), kLongestCell, kMostBytes);
 }
 
-std::string exact(float value) {
-  if (std::isinf(value)) {
-    return value < 0 ? "-Infinity" : "Infinity";
-  }
-  char text[32];
-  auto const result = std::to_chars(std::begin(text), std::end(text), value);
-  return {std::begin(text), result.ptr};
-}
+std::string exact(Value const& value) { return std::visit(Exact(), value); }
 
 }  // namespace app

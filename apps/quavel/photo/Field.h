@@ -36,8 +36,9 @@ Fields recordFields();
 /// (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
 
-/// Digits that read back to the same float.
-std::string exact(float value);
+/// The value for programs: text as it is, digits that read back to the same number, "Infinity",
+/// "true". Empty when absent.
+std::string exact(Value const& value);
 
 }  // namespace app
 

@@ -13,12 +13,11 @@ std::string decimal(float value, int digits) {
   if (std::isinf(value)) {
     return value < 0 ? "-∞" : "∞";
   }
+  char text[32];
   if (!(std::fabs(value) < 1e7F)) {
-    char text[32];
     std::snprintf(text, sizeof text, "%g", static_cast<double>(value));
     return text;
   }
-  char text[32];
   std::snprintf(text, sizeof text, "%.*f", digits, static_cast<double>(value));
   std::string result = text;
   if (result.find('.') != std::string::npos) {

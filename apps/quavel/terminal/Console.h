@@ -1,9 +1,13 @@
 #ifndef QUAVEL_APPS_CONSOLE_H
 #define QUAVEL_APPS_CONSOLE_H
 
+#include <cstddef>
 #include <string>
 
 namespace app {
+
+/// Cells in a line of the terminal; 80 where it does not say.
+std::size_t terminalWidth(int fd);
 
 /// Standard error: messages, and a progress line below them.
 class Console {

@@ -1,6 +1,10 @@
 #ifndef QUAVEL_APPS_INTERRUPT_H
 #define QUAVEL_APPS_INTERRUPT_H
 
+#include <signal.h>
+
+#include <string_view>
+
 /// Ends the process at once, with status 128 + the signal's number, when the user or the system
 /// asks for it. No thread waits for that: a second thread makes each system call of a reader
 /// dearer.
@@ -17,7 +21,16 @@ class Shield {
   ~Shield();
   Shield(Shield const&) = delete;
   Shield& operator=(Shield const&) = delete;
+
+ private:
+  sigset_t previous_;
 };
+
+/// What erases a terminal's line.
+inline constexpr char kEraseLine[] = "\r\x1b[K";
+
+/// Writes the bytes, or those that can be written. A signal handler may call it.
+void write(int fd, std::string_view bytes);
 
 /// What closes the output when an interrupt ends it; null for nothing. Not copied.
 void setTail(char const* tail);

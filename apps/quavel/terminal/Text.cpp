@@ -1,153 +1,141 @@
 #include "terminal/Text.h"
 
-#include <locale.h>
-#include <wchar.h>
+#include <utf8proc.h>
 
 #include <algorithm>
-#include <cstdint>
-#include <iterator>
+#include <cstdio>
 
 namespace app {
 
 namespace {
 
-/// Makes the C library's `wcwidth` know all characters on this thread, whatever the user's locale.
-class Utf8Scope {
- public:
-  Utf8Scope() : previous_(::uselocale(utf8())) {}
-  ~Utf8Scope() { ::uselocale(previous_); }
-  Utf8Scope(Utf8Scope const&) = delete;
-  Utf8Scope& operator=(Utf8Scope const&) = delete;
-
- private:
-  static locale_t utf8() {
-    static locale_t const locale = ::newlocale(LC_CTYPE_MASK, "C.UTF-8", nullptr);
-    return locale;
-  }
-
-  locale_t previous_;
-};
-
-struct Lead {
-  unsigned char first;
-  unsigned char last;
-  std::size_t length;
-  std::uint32_t least;  // what is smaller has a shorter form
-};
-
-// Decoded here, as the C library takes numbers above U+10FFFF and longer forms for characters.
-constexpr Lead kLeads[] = {{0xc2, 0xdf, 2, 0x80}, {0xe0, 0xef, 3, 0x800}, {0xf0, 0xf4, 4, 0x10000}};
-
 constexpr std::string_view kEllipsis = "…";
 
-std::size_t cellsOf(Character const& character) {
-  Utf8Scope const scope;
-  int const width = ::wcwidth(character.code);
-  return width < 0 ? 1 : static_cast<std::size_t>(width);
+/// One character, or one byte that begins none.
+struct Character {
+  utf8proc_int32_t code;  // the byte's value when it is not valid
+  std::string_view bytes;
+  bool isValid;
+};
+
+/// Takes the first character off a text that is not empty.
+Character takeCharacter(std::string_view& text) {
+  auto const* const bytes = reinterpret_cast<utf8proc_uint8_t const*>(text.data());
+  utf8proc_int32_t code = 0;
+  auto const length = utf8proc_iterate(bytes, static_cast<utf8proc_ssize_t>(text.size()), &code);
+  bool const isValid = length > 0;
+  std::size_t const taken = isValid ? static_cast<std::size_t>(length) : 1;
+  Character const character = {isValid ? code : *bytes, text.substr(0, taken), isValid};
+  text.remove_prefix(taken);
+  return character;
 }
 
-/// Bytes at the start of `text` that fit the cells, and are no more than `most`.
-std::size_t fittingBytes(std::string_view text, std::size_t width, std::size_t most) {
-  std::size_t bytes = 0;
-  std::size_t used = 0;
-  while (bytes < text.size()) {
-    Character const next = firstCharacter(text.substr(bytes));
-    used += cellsOf(next);
-    if (used > width || bytes + next.length > most) {
-      break;
-    }
-    bytes += next.length;
+std::size_t cellsOf(Character const& character) {
+  auto const* const property = utf8proc_get_property(character.code);
+  switch (property->boundclass) {
+    case UTF8PROC_BOUNDCLASS_V:
+    case UTF8PROC_BOUNDCLASS_T:
+      return 0;  // the later letters of a Hangul syllable, within the cells of the first
+    case UTF8PROC_BOUNDCLASS_PREPEND:
+      return 1;  // also the Arabic signs that enclose a number
+    default:
+      // Unlike other marks, these stand beside their letter.
+      return property->category == UTF8PROC_CATEGORY_MC ? 1 : property->charwidth;
   }
-  return bytes;
+}
+
+/// It has no glyph of its own but changes how its neighbours or the line appear.
+bool isHidden(Character const& character) {
+  constexpr utf8proc_int32_t kNonJoiner = 0x200c;
+  constexpr utf8proc_int32_t kJoiner = 0x200d;
+  switch (utf8proc_category(character.code)) {
+    case UTF8PROC_CATEGORY_CC:
+    case UTF8PROC_CATEGORY_ZL:
+    case UTF8PROC_CATEGORY_ZP:
+      return true;
+    case UTF8PROC_CATEGORY_CF:
+      // Scripts and emoji need the joiners; the Arabic signs that enclose a number are seen.
+      return character.code != kNonJoiner && character.code != kJoiner &&
+             utf8proc_get_property(character.code)->boundclass != UTF8PROC_BOUNDCLASS_PREPEND;
+    default:
+      return false;
+  }
+}
+
+std::string shown(Character const& character) {
+  if (character.code == '\n' || character.code == '\t') {
+    return character.code == '\n' ? "\\n" : "\\t";
+  }
+  char text[16];
+  bool const isByte = !character.isValid || character.code < 0x80;
+  std::snprintf(text, sizeof text, isByte ? "\\x%02x" : "\\u{%04x}",
+                static_cast<unsigned>(character.code));
+  return text;
+}
+
+/// It is visible ASCII, as nearly all texts are: not worth a look at each character.
+bool isPlain(std::string_view text) {
+  return std::all_of(text.begin(), text.end(), [](char c) { return ' ' <= c && c <= '~'; });
+}
+
+bool isUtf8(std::string_view text) {
+  bool isValid = true;
+  while (isValid && !text.empty()) {
+    isValid = takeCharacter(text).isValid;
+  }
+  return isValid;
 }
 
 }  // namespace
 
-Character firstCharacter(std::string_view text) {
-  auto const byte = static_cast<unsigned char>(text.front());
-  if (byte < 0x80) {
-    return {static_cast<wchar_t>(byte), 1, true};
-  }
-  Character const invalid = {static_cast<wchar_t>(byte), 1, false};
-  auto const* const lead =
-      std::find_if(std::begin(kLeads), std::end(kLeads),
-                   [byte](Lead const& row) { return row.first <= byte && byte <= row.last; });
-  if (lead == std::end(kLeads) || text.size() < lead->length) {
-    return invalid;
-  }
-  std::uint32_t code = byte & (0x7fU >> lead->length);
-  for (std::size_t i = 1; i < lead->length; ++i) {
-    auto const next = static_cast<unsigned char>(text[i]);
-    if ((next & 0xc0) != 0x80) {
-      return invalid;
-    }
-    code = code << 6 | (next & 0x3f);
-  }
-  bool const isSurrogate = 0xd800 <= code && code <= 0xdfff;
-  if (code < lead->least || code > 0x10ffff || isSurrogate) {
-    return invalid;
-  }
-  return {static_cast<wchar_t>(code), lead->length, true};
-}
-
-bool isAscii(std::string_view text) {
-  return std::all_of(text.begin(), text.end(),
-                     [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-}
-
-bool isUtf8(std::string_view text) {
-  if (isAscii(text)) {
-    return true;
-  }
-  while (!text.empty()) {
-    Character const next = firstCharacter(text);
-    if (!next.isValid) {
-      return false;
-    }
-    text.remove_prefix(next.length);
-  }
-  return true;
-}
-
 std::string textAsUtf8(std::string text) {
-  if (isUtf8(text)) {
+  if (isPlain(text) || isUtf8(text)) {
     return text;
   }
   std::string utf8;
   for (char const c : text) {
-    auto const byte = static_cast<unsigned char>(c);
-    if (byte < 0x80) {
-      utf8 += c;
-      continue;
-    }
-    utf8 += static_cast<char>(0xc0 | byte >> 6);
-    utf8 += static_cast<char>(0x80 | (byte & 0x3f));
+    utf8proc_uint8_t bytes[4];
+    auto const length = utf8proc_encode_char(static_cast<unsigned char>(c), bytes);
+    utf8.append(bytes, bytes + length);
   }
   return utf8;
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isUtf8(path) && path.find('\0') == std::string::npos) {
+  if (isPlain(path)) {
     return path;
   }
   std::string utf8;
   for (std::string_view rest = path; !rest.empty();) {
-    Character const next = firstCharacter(rest);
-    utf8 += next.isValid && next.code != 0 ? rest.substr(0, next.length) : "\xef\xbf\xbd";
-    rest.remove_prefix(next.length);
+    Character const next = takeCharacter(rest);
+    utf8 += next.isValid && next.code != 0 ? next.bytes : "\xef\xbf\xbd";
   }
   return utf8;
 }
 
+std::string escaped(std::string const& text) {
+  if (isPlain(text)) {
+    return text;
+  }
+  std::string result;
+  for (std::string_view rest = text; !rest.empty();) {
+    Character const next = takeCharacter(rest);
+    if (next.isValid && !isHidden(next)) {
+      result += next.bytes;
+    } else {
+      result += shown(next);
+    }
+  }
+  return result;
+}
+
 std::size_t cells(std::string_view text) {
-  if (isAscii(text)) {
+  if (isPlain(text)) {
     return text.size();
   }
   std::size_t sum = 0;
   while (!text.empty()) {
-    Character const next = firstCharacter(text);
-    sum += cellsOf(next);
-    text.remove_prefix(next.length);
+    sum += cellsOf(takeCharacter(text));
   }
   return sum;
 }
@@ -156,32 +144,33 @@ std::string keepStart(std::string const& text, std::size_t width, std::size_t mo
   if (text.size() <= most && cells(text) <= width) {
     return text;
   }
-  if (width == 0) {
-    return {};
+  std::size_t kept = 0;
+  std::size_t used = 0;
+  for (std::string_view rest = text; !rest.empty();) {
+    Character const next = takeCharacter(rest);
+    used += cellsOf(next);
+    if (used >= width || kept + next.bytes.size() > most) {
+      break;
+    }
+    kept += next.bytes.size();
   }
-  return text.substr(0, fittingBytes(text, width - 1, most)).append(kEllipsis);
+  return width == 0 ? "" : text.substr(0, kept).append(kEllipsis);
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
-  std::size_t const all = cells(text);
-  if (all <= width) {
+  std::size_t left = cells(text);
+  if (left <= width) {
     return text;
   }
-  if (width == 0) {
-    return {};
-  }
-  std::size_t dropped = 0;
-  std::size_t left = all;
-  while (dropped < text.size()) {
-    Character const next = firstCharacter(std::string_view(text).substr(dropped));
-    std::size_t const taken = cellsOf(next);
+  std::string_view kept = text;
+  for (std::string_view rest = text; !rest.empty(); kept = rest) {
+    std::size_t const taken = cellsOf(takeCharacter(rest));
     if (left < width && taken > 0) {  // a mark would go to the ellipsis
       break;
     }
     left -= taken;
-    dropped += next.length;
   }
-  return std::string(kEllipsis) + text.substr(dropped);
+  return width == 0 ? "" : std::string(kEllipsis).append(kept);
 }
 
 }  // namespace app

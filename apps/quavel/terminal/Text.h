@@ -7,24 +7,16 @@
 
 namespace app {
 
-/// One character at the start of a text, or one byte that begins none.
-struct Character {
-  wchar_t code;        ///< The byte's value when it is not valid.
-  std::size_t length;  ///< Bytes; at least 1.
-  bool isValid;        ///< It is UTF-8.
-};
-
-/// Takes the first character of `text`, which must not be empty.
-Character firstCharacter(std::string_view text);
-
-bool isAscii(std::string_view text);
-bool isUtf8(std::string_view text);
-
 /// A text out of a file as UTF-8. Files that are not UTF-8 are mostly Latin-1: when any byte is
 /// wrong, all from 0x80 on are taken as the characters of that number.
 std::string textAsUtf8(std::string text);
 /// A file name as UTF-8, each byte that is none, and each NUL, replaced by U+FFFD.
 std::string pathAsUtf8(std::string const& path);
+
+/// The text with all that could steer a terminal or mislead its reader made visible: control
+/// characters, bytes that are no UTF-8 and characters that reorder their neighbours become \n, \t,
+/// \xNN or \u{NNNN}. Always one line of valid UTF-8; other text is kept as it is.
+std::string escaped(std::string const& text);
 
 /// Terminal cells that an escaped text takes.
 std::size_t cells(std::string_view text);
