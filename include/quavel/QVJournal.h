@@ -72,12 +72,12 @@ class QUAVEL_EXPORT QVJournal {
   /// How much is noted. Refusals alone cost no time unless there is one.
   enum class Detail : std::uint8_t { Refusals, All };
 
-  explicit QVJournal(Detail detail = Detail::All);
+  explicit QVJournal(Detail detail = Detail::All);  ///< Without notes yet.
 
-  /// Each reads a file as the `QVReader` constructor with the same arguments does, replacing all
-  /// notes. Null: there is no record, and the notes hold one refusal or limit, which is last among
-  /// the steps' and the refusals' notes.
+  /// Reads the file at a path as `QVReader` does, replacing all notes. Null: there is no record,
+  /// and the notes hold one refusal or limit.
   std::shared_ptr<QVMetadata> read(std::string const& path);
+  /// The same from memory, for an extension in lower case and without a ".".
   std::shared_ptr<QVMetadata> read(unsigned char* buffer, std::size_t length,
                                    std::string const& extension);
   /// The same from a stream of the host's own, not null, which must stand at the file's first byte.
