@@ -96,7 +96,8 @@ class QUAVEL_EXPORT QVJournal {
 
  private:
   QUAVEL_NO_EXPORT detail::Journal begin();
-  QUAVEL_NO_EXPORT void keep(detail::Journal& journal);
+  QUAVEL_NO_EXPORT std::shared_ptr<QVMetadata> keep(detail::Journal& journal,
+                                                    std::shared_ptr<QVMetadata> record);
 
   Detail detail_;
   std::vector<QVNote> notes_;

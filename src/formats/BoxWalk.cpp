@@ -6,16 +6,6 @@
 
 namespace quavel::detail {
 
-namespace {
-
-char const* specialSizeText(std::uint32_t size) {
-  return size == 0   ? " (0 stands for \"to the end of the file\", which is not read)"
-         : size == 1 ? " (1 stands for a 64-bit size, which is not read)"
-                     : "";
-}
-
-}  // namespace
-
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
   long const start = stream->getOffset();
@@ -32,7 +22,10 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
                   PlacedBox{header.boxType, position}, place, header.boxSize,
-                  specialSizeText(header.boxSize));
+                  header.boxSize == 0
+                      ? " (0 stands for \"to the end of the file\", which is not read)"
+                  : header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)"
+                                        : "");
   }
   stream->setOffset(start + long{header.boxSize});
   return true;

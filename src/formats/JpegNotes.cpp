@@ -6,11 +6,9 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  if (journal != nullptr && journal->wantsAll()) {
-    std::int64_t const size = journal->dataSize();
-    notePassed(journal, position, "end of the data at {}, where the walk ends",
-               Offset{size < 0 ? position : std::min(position, size)});
-  }
+  std::int64_t const size = journal == nullptr ? -1 : journal->dataSize();
+  notePassed(journal, position, "end of the data at {}, where the walk ends",
+             Offset{size < 0 ? position : std::min(position, size)});
 }
 
 void detail::noteSize(Directory const& exifIFD, int width, int height) {
@@ -22,7 +20,7 @@ void detail::noteSize(Directory const& exifIFD, int width, int height) {
              hasWidth && hasHeight
                  ? "{} declares {} x {}; only more than 500 a side counts, and less than 2^31"
                  : "{} does not give both sides",
-             NamedDirectory{exifIFD}, static_cast<std::uint32_t>(width),
+             placed(exifIFD), static_cast<std::uint32_t>(width),
              static_cast<std::uint32_t>(height));
 }
 

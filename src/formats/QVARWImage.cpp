@@ -26,7 +26,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   if (!exifIFD) {
     noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
                "no {} in {}, without which the raw image is not looked for",
-               TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
+               TagName{tag::ExifIFDPointer}, placed(mainIFD));
     return true;
   }
   Directory rawIFD;

@@ -69,15 +69,13 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
 }
 
 // APEX counts in powers of two (Exif, annex C): the f-number is 2^(Av/2), the exposure time 2^-Tv
-// seconds.
+// seconds, and NaN stays NaN.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {
     return false;
   }
-  if (findEntry(ifd, tag::ApertureValue)) {
-    apexFNumber = ::exp2f(apertureValue * 0.5F);
-  }
+  apexFNumber = ::exp2f(apertureValue * 0.5F);
   return true;
 }
 
@@ -85,9 +83,7 @@ bool QVCR3CMT2Box::storeShutterSpeed(std::shared_ptr<QVTiffImageFileDirectory> c
   if (!storeFraction(ifd, tag::ShutterSpeedValue, EntryValueType::SRATIONAL, shutterSpeedValue)) {
     return false;
   }
-  if (findEntry(ifd, tag::ShutterSpeedValue)) {
-    apexExposureTime = 1.0F / ::exp2f(shutterSpeedValue);
-  }
+  apexExposureTime = 1.0F / ::exp2f(shutterSpeedValue);
   return true;
 }
 

@@ -25,7 +25,6 @@ constexpr unsigned short kAPP1 = 0xffe1;
 
 // A segment's length counts its own two bytes but not the marker's.
 constexpr long kLengthSize = 2;
-constexpr std::int64_t kMarkerSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
 // Below it, the Exif size is taken for that of a thumbnail.
@@ -101,7 +100,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
 
   unsigned short length = 0;
   if (!stream->readShort(&length)) {
-    return refuseCut(journalOf(*stream), walk.start + kMarkerSize, sizeof(length),
+    return refuseCut(journalOf(*stream), walk.start + std::int64_t{sizeof(marker)}, sizeof(length),
                      "the length of the segment {} at {}", HexCode{marker}, Offset{walk.start});
   }
   long const segmentEnd = stream->getOffset() + length - kLengthSize;

@@ -52,7 +52,7 @@ bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> 
   }
   if (thumbnailWidth != kThumbnailWidth || thumbnailHeight != kThumbnailHeight) {
     return refuse(journalOf(ifd), QVReason::WrongImage, positionOf(ifd), "{} declares {} x {}; {}",
-                  NamedDirectory{ifd}, static_cast<std::uint32_t>(thumbnailWidth),
+                  placed(ifd), static_cast<std::uint32_t>(thumbnailWidth),
                   static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRule);
   }
   return storeNumber(ifd, tag::Orientation, orientation);

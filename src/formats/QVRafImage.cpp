@@ -124,7 +124,7 @@ bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
   if (!vendorIFD) {
     return refuse(journalOf(*stream), QVReason::MissingPart, positionOf(rawSectionIFD),
                   "no {} in {}; the raw image's size is found through it",
-                  TagName{tag::RafDirectoryPointer}, NamedDirectory{rawSectionIFD});
+                  TagName{tag::RafDirectoryPointer}, placed(rawSectionIFD));
   }
   return storeInfoFromFujiTagsIFD(vendorIFD);
 }

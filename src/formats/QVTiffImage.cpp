@@ -31,14 +31,14 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const
     noteHint(
         journal, QVReason::PassedOver, positionOf(subIFD),
         type == nullptr ? "{} has no 0x00fe NewSubfileType" : "{} declares a reduced image too",
-        NamedDirectory{subIFD});
+        placed(subIFD));
   }
   refuse(journal, QVReason::MissingPart, positionOf(mainIFD),
          count == 0 ? "{} declares a reduced image (NewSubfileType bit 0) and names no 0x014a "
                       "SubIFDs where the full image could be"
                     : "{} declares a reduced image (NewSubfileType bit 0) and none of its {} "
                       "SubIFDs says that it is the full image",
-         NamedDirectory{mainIFD}, count);
+         placed(mainIFD), count);
   return nullptr;
 }
 

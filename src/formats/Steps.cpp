@@ -1,6 +1,5 @@
 #include "formats/Steps.h"
 
-#include "quavel/QVMetadata.h"
 #include "quavel/QVStream.h"
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "tiff/Tags.h"
@@ -43,7 +42,7 @@ bool storeRequiredNumber(Directory const& directory, unsigned short tag, char co
                          std::int32_t& field) {
   if (!findEntry(directory, tag)) {
     return refuse(journalOf(directory), QVReason::MissingPart, positionOf(directory),
-                  "no {} in {}; {}", TagName{tag}, NamedDirectory{directory}, rule);
+                  "no {} in {}; {}", TagName{tag}, placed(directory), rule);
   }
   return storeNumber(directory, tag, field);
 }
@@ -98,7 +97,7 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream, Director
   }
   if (!exifIFD) {
     noteAbsent(journalOf(mainIFD), {"dateTimeOriginal", "dateTimeDigitized"}, QVReason::NotInFile,
-               "no {} in {}", TagName{tag::ExifIFDPointer}, NamedDirectory{mainIFD});
+               "no {} in {}", TagName{tag::ExifIFDPointer}, placed(mainIFD));
     return true;
   }
   // A host's class may override what takes it, and keep any part of it.
@@ -114,8 +113,8 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   if (count <= index) {
     noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
-               "{} names {} {} (0x014a); the raw image is in number {}", NamedDirectory{mainIFD},
-               count, count == 1 ? "SubIFD" : "SubIFDs", index + 1);
+               "{} names {} {} (0x014a); the raw image is in number {}", placed(mainIFD), count,
+               count == 1 ? "SubIFD" : "SubIFDs", index + 1);
     return true;
   }
   rawIFD = readDirectoryAt(stream, {"SubIFD", nullptr, index + 1, count},
@@ -127,7 +126,7 @@ void noteNoEntry(Directory const& directory, unsigned short tag) {
   Journal* const journal = journalOf(directory);
   if (journal != nullptr && fieldOf(tag) != nullptr) {
     noteAbsent(journal, {fieldOf(tag)}, QVReason::NotInFile, "no {} in {}", TagName{tag},
-               NamedDirectory{directory});
+               placed(directory));
   }
 }
 
@@ -166,15 +165,11 @@ bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::in
     return refuse(journalOf(directory), QVReason::WrongImage, positionOf(directory),
                   "{} declares a reduced image (NewSubfileType {}); the raw image of full size is "
                   "wanted there",
-                  NamedDirectory{directory}, static_cast<std::uint32_t>(newSubfileType));
+                  placed(directory), static_cast<std::uint32_t>(newSubfileType));
   }
   char const* const rule = "the raw image's size is wanted there";
   return storeRequiredNumber(directory, tag::ImageWidth, rule, width) &&
          storeRequiredNumber(directory, tag::ImageLength, rule, height);
-}
-
-void append(std::string& out, NamedDirectory named) {
-  append(out, PlacedDirectory{ReaderDirectory::of(*named.directory)->table});
 }
 
 std::int64_t positionOf(Directory const& directory) {

@@ -8,15 +8,12 @@
 
 #include "journal/Journal.h"
 #include "journal/Reading.h"
+#include "quavel/QVMetadata.h"
 #include "tiff/ReaderDirectory.h"
 #include "tiff/WantedTags.h"
 
 // The steps that the readers of several formats share. Each that can fail states why. What an
 // absent entry means is decided in the readers, where the formats differ.
-namespace quavel {
-class QVMetadata;
-}  // namespace quavel
-
 namespace quavel::detail {
 
 /// Finds the tag's only value. Absent: true and null. None or several: false.
@@ -71,11 +68,11 @@ bool isReducedImage(ValuePointer newSubfileType);
 /// NewSubfileType is absent or not a single value, or the image is a reduced one.
 bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::int32_t& height);
 
-/// A reader's own directory: "IFD0 at 8".
-struct NamedDirectory {
-  Directory const& directory;
-};
-void append(std::string& out, NamedDirectory named);
+/// A reader's own directory, for notes; a host's, of which there are none, has no name.
+inline PlacedDirectory placed(Directory const& directory) {
+  auto const* const own = ReaderDirectory::of(*directory);
+  return {own == nullptr ? nullptr : &own->table};
+}
 
 /// Where a directory begins in the file; -1 for a host's.
 std::int64_t positionOf(Directory const& directory);

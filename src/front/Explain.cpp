@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <variant>
 
 #include "front/Formats.h"
 #include "journal/Journal.h"
@@ -13,59 +14,58 @@ namespace {
 
 constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
-bool isAbsent(std::int32_t number) { return number == -1; }
-bool isAbsent(float number) { return std::isnan(number); }
-bool isAbsent(std::string const& text) { return text.empty(); }
-
-template <auto kMember>
-bool isAbsentIn(QVMetadata const& record) {
-  return isAbsent(record.*kMember);
-}
-
 /// A field that can be absent.
 struct FieldRow {
   char name[22];
   char origin[18];    ///< The field that it is computed from, if any.
   unsigned families;  ///< The readers that fill it.
-  bool (*isAbsent)(QVMetadata const& record);
+  std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
 
 using M = QVMetadata;
 constexpr FieldRow kFields[] = {
-    {"width", "", kAll, isAbsentIn<&M::width>},
-    {"height", "", kAll, isAbsentIn<&M::height>},
-    {"orientation", "", kAll, isAbsentIn<&M::orientation>},
-    {"dateTimeOriginal", "", kAll & ~unsigned{kCr3}, isAbsentIn<&M::dateTimeOriginal>},
-    {"dateTimeDigitized", "", kTiff, isAbsentIn<&M::dateTimeDigitized>},
-    {"dateTime", "", kTiff | kCr3, isAbsentIn<&M::dateTime>},
-    {"model", "", kCr3, isAbsentIn<&M::model>},
-    {"lensModel", "", kCr3, isAbsentIn<&M::lensModel>},
-    {"iso", "", kCr3, isAbsentIn<&M::iso>},
-    {"apexFNumber", "apertureValue", kCr3, isAbsentIn<&M::apexFNumber>},
-    {"apexExposureTime", "shutterSpeedValue", kCr3, isAbsentIn<&M::apexExposureTime>},
-    {"apertureValue", "", kCr3, isAbsentIn<&M::apertureValue>},
-    {"shutterSpeedValue", "", kCr3, isAbsentIn<&M::shutterSpeedValue>},
-    {"focalLength", "", kCr3, isAbsentIn<&M::focalLength>},
-    {"whiteBalance", "", kCr3, isAbsentIn<&M::whiteBalance>},
-    {"meteringMode", "", kCr3, isAbsentIn<&M::meteringMode>},
-    {"exposureBiasValue", "", kCr3, isAbsentIn<&M::exposureBiasValue>},
-    {"focalLengthIn35mmFilm", "", kCr3, isAbsentIn<&M::focalLengthIn35mmFilm>},
-    {"exposureTime", "", kCr3, isAbsentIn<&M::exposureTime>},
-    {"fNumber", "", kCr3, isAbsentIn<&M::fNumber>},
+    {"width", "", kAll, &M::width},
+    {"height", "", kAll, &M::height},
+    {"orientation", "", kAll, &M::orientation},
+    {"dateTimeOriginal", "", kAll & ~unsigned{kCr3}, &M::dateTimeOriginal},
+    {"dateTimeDigitized", "", kTiff, &M::dateTimeDigitized},
+    {"dateTime", "", kTiff | kCr3, &M::dateTime},
+    {"model", "", kCr3, &M::model},
+    {"lensModel", "", kCr3, &M::lensModel},
+    {"iso", "", kCr3, &M::iso},
+    {"apexFNumber", "apertureValue", kCr3, &M::apexFNumber},
+    {"apexExposureTime", "shutterSpeedValue", kCr3, &M::apexExposureTime},
+    {"apertureValue", "", kCr3, &M::apertureValue},
+    {"shutterSpeedValue", "", kCr3, &M::shutterSpeedValue},
+    {"focalLength", "", kCr3, &M::focalLength},
+    {"whiteBalance", "", kCr3, &M::whiteBalance},
+    {"meteringMode", "", kCr3, &M::meteringMode},
+    {"exposureBiasValue", "", kCr3, &M::exposureBiasValue},
+    {"focalLengthIn35mmFilm", "", kCr3, &M::focalLengthIn35mmFilm},
+    {"exposureTime", "", kCr3, &M::exposureTime},
+    {"fNumber", "", kCr3, &M::fNumber},
 };
 
+bool isAbsent(FieldRow const& row, QVMetadata const& record) {
+  if (auto const* const number = std::get_if<std::int32_t QVMetadata::*>(&row.member)) {
+    return record.**number == -1;
+  }
+  if (auto const* const number = std::get_if<float QVMetadata::*>(&row.member)) {
+    return std::isnan(record.**number);
+  }
+  return (record.*std::get<std::string QVMetadata::*>(row.member)).empty();
+}
+
 QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
-  QVNote note = {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, "", 0};
   if ((row.families & format.family) == 0) {
-    note.text = row.families == kCr3 ? "given by CR3 files only"
-                                     : composed("never taken from {} files", {format.kind});
-    return note;
+    std::string const text = row.families == kCr3
+                                 ? "given by CR3 files only"
+                                 : composed("never taken from {} files", {format.kind});
+    return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, 0};
   }
   auto const* const known = journal.absenceOf(row.origin[0] == '\0' ? row.name : row.origin);
-  if (known != nullptr) {
-    note = *known;
-    note.field = row.name;
-  }
+  QVNote note = known == nullptr ? QVNote() : *known;
+  note.field = row.name;
   return note;
 }
 
@@ -80,11 +80,6 @@ struct Signature {
   char bytes[9];
   char kind[36];
   unsigned families;  ///< The readers of such files.
-
-  bool matches(std::uint8_t const* opening, std::size_t length) const {
-    return length >= std::size_t{position} + size &&
-           std::memcmp(opening + position, bytes, size) == 0;
-  }
 };
 
 constexpr unsigned kTiffFamilies = kTiff | kNef | kArw;
@@ -116,7 +111,8 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
   std::array<std::uint8_t, kOpeningSize> opening;
   std::size_t const size = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
-    if (!row.matches(opening.data(), size)) {
+    if (size < std::size_t{row.position} + row.size ||
+        std::memcmp(opening.data() + row.position, row.bytes, row.size) != 0) {
       continue;
     }
     if ((row.families & format.family) == 0) {
@@ -133,7 +129,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
 
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
   for (auto const& row : kFields) {
-    if (row.isAbsent(record)) {
+    if (isAbsent(row, record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

@@ -105,9 +105,7 @@ std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) 
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));
-    return nullptr;
-  }
-  if (journal != nullptr) {
+  } else if (journal != nullptr) {
     journal->fd = fd;
   }
   return readStream(std::move(stream), extension, journal);

@@ -31,27 +31,21 @@ QVJournal::QVJournal(Detail detail) : detail_(detail) {}
 
 std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
   detail::Journal journal = begin();
-  auto record = detail::readPath(path, &journal);
-  keep(journal);
-  return record;
+  return keep(journal, detail::readPath(path, &journal));
 }
 
 std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t length,
                                             std::string const& extension) {
   detail::Journal journal = begin();
   journal.knownSize = static_cast<std::int64_t>(length);
-  auto record =
-      detail::readStream(std::make_shared<QVMStream>(buffer, length), extension, &journal);
-  keep(journal);
-  return record;
+  auto memory = std::make_shared<QVMStream>(buffer, length);
+  return keep(journal, detail::readStream(std::move(memory), extension, &journal));
 }
 
 std::shared_ptr<QVMetadata> QVJournal::read(std::shared_ptr<QVStream> stream,
                                             std::string const& extension) {
   detail::Journal journal = begin();
-  auto record = detail::readStream(std::move(stream), extension, &journal);
-  keep(journal);
-  return record;
+  return keep(journal, detail::readStream(std::move(stream), extension, &journal));
 }
 
 QVNote const* QVJournal::refusal() const {
@@ -67,9 +61,11 @@ detail::Journal QVJournal::begin() {
   return detail::Journal(detail_);
 }
 
-void QVJournal::keep(detail::Journal& journal) {
+std::shared_ptr<QVMetadata> QVJournal::keep(detail::Journal& journal,
+                                            std::shared_ptr<QVMetadata> record) {
   notes_ = std::move(journal.notes);
   furtherSteps_ = journal.furtherSteps;
+  return record;
 }
 
 }  // namespace quavel

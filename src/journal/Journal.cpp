@@ -110,15 +110,14 @@ void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
 }
 
 bool Reading::refuseWork(Work work) const {
-  static constexpr char const* kNames[] = {
-      "open more than {} directories", "walk over more than {} directory entries",
-      "take more than {} values of directory entries", "step over more than {} segments or boxes"};
+  static constexpr char const* kPatterns[] = {
+      "the file makes the reader open more than {} directories",
+      "the file makes the reader walk over more than {} directory entries",
+      "the file makes the reader take more than {} values of directory entries",
+      "the file makes the reader step over more than {} segments or boxes"};
   auto const index = static_cast<std::size_t>(work);
-  auto const bound = static_cast<std::int64_t>(kMaxWork[index]);
-  return journal != nullptr
-             ? refuse(journal, QVReason::TooMuchWork, -1, "the file makes the reader {}",
-                      composed(kNames[index], {bound}))
-             : false;
+  return refuse(journal, QVReason::TooMuchWork, -1, kPatterns[index],
+                static_cast<std::int64_t>(kMaxWork[index]));
 }
 
 }  // namespace quavel::detail

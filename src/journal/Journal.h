@@ -34,8 +34,6 @@ class Journal {
 
   /// The reason given for a field's absence by now, or null.
   QVNote* absenceOf(char const* field);
-  /// Whether a refusal was stated.
-  bool isRefused() const { return isRefused_; }
 
   /// The size of the data in bytes, which the file is not asked for earlier; -1: not known.
   std::int64_t dataSize();

@@ -27,7 +27,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   journal_ = reading.journal;
   if (!stream.readShort(&entryCount_)) {
     return refuseCut(journal_, position_, kEntryCountSize, "the entry count of {}",
-                     PlacedDirectory{*this});
+                     PlacedDirectory{this});
   }
   if (!reading.spend(Work::Directories, 1)) {
     return false;
@@ -35,11 +35,11 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
 
   rows_.reserve(std::min({std::size_t{entryCount_}, wanted.count(), kMaxReservedRows}));
   values_.reserve(kFirstCapacity);
-  EntryWalk walk(stream, entryCount_);
+  EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
   for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
     if (!walk.hasTag()) {
-      return refuseCut(journal_, positionOf(walk), kEntryTypePosition, "entry {} of {} of {}",
-                       walk.number(), entryCount_, PlacedDirectory{*this});
+      return refuseCut(journal_, walk.position(), kEntryTypePosition, "entry {} of {} of {}",
+                       walk.number(), entryCount_, PlacedDirectory{this});
     }
     unsigned short const tag = walk.tag();
     if (!wanted.take(tag)) {
@@ -49,11 +49,11 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     stream.setOffset(walk.nextOffset());
     RawEntry entry;
     if (!walk.readRest(&entry)) {
-      return refuseCut(journal_, positionOf(walk) + std::int64_t{kEntryTypePosition},
+      return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
-                       PlacedEntry{*this, Row{tag, 0, 0, positionOf(walk), 0, 0}});
+                       PlacedEntry{*this, Row{tag, 0, 0, walk.position(), 0, 0}});
     }
-    if (!readEntry(stream, tag, positionOf(walk), entry)) {
+    if (!readEntry(stream, tag, walk.position(), entry)) {
       return false;
     }
   }
@@ -61,10 +61,6 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   // The entries may have left the stream anywhere.
   stream.setOffset(walk.end());
   return reading.spend(Work::Entries, walk.number() - 1);
-}
-
-std::int64_t EntryTable::positionOf(EntryWalk const& walk) const {
-  return position_ + kEntryCountSize + std::int64_t{kEntrySize} * (walk.number() - 1);
 }
 
 bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
@@ -94,9 +90,9 @@ bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIF
     return refuseCut(journal_, position_ + kEntryCountSize + std::int64_t{kEntrySize} * entryCount_,
                      sizeof(*nextIFDOffset),
                      "the offset of the next directory, after the {} entries of {}", entryCount_,
-                     PlacedDirectory{*this});
+                     PlacedDirectory{this});
   }
-  notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{*this},
+  notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
              static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
   return true;
 }
@@ -138,9 +134,9 @@ Entry findEntry(Directory const& directory, unsigned short tag) {
 }
 
 void append(std::string& out, PlacedDirectory directory) {
-  append(out, directory.table.name());
+  append(out, directory.table->name());
   out += " at ";
-  append(out, Offset{directory.table.position()});
+  append(out, Offset{directory.table->position()});
 }
 
 void append(std::string& out, PlacedEntry entry) {

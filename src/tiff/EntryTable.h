@@ -20,7 +20,6 @@ class QVTiffImageFileDirectoryEntry;
 
 namespace detail {
 
-class EntryWalk;
 class Journal;
 
 /// The wanted entries of a directory as they are read, their values side by side. What hosts get,
@@ -70,7 +69,6 @@ class EntryTable {
   Journal* journal() const { return journal_; }  ///< Of the read that filled the table; or null.
 
  private:
-  std::int64_t positionOf(EntryWalk const& walk) const;
   bool readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
                  RawEntry const& entry);
   bool refuseEntry(Row const& row, RawEntry const& entry) const;
@@ -102,7 +100,7 @@ void storeUndefined(std::uint32_t count, std::uint32_t field, QVTiffImageFileDir
 
 /// "IFD0 at 8"
 struct PlacedDirectory {
-  EntryTable const& table;
+  EntryTable const* table;
 };
 void append(std::string& out, PlacedDirectory directory);
 

@@ -13,11 +13,12 @@ namespace quavel::detail {
 /// holds.
 class EntryWalk {
  public:
-  /// The stream stands at the first of `count` entries.
-  EntryWalk(QVStream& stream, unsigned short count)
+  /// The stream stands at the first of `count` entries, which is at `position` in the file.
+  EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
         isReversed_(isReversed(stream)),
         bufferOffset_(stream.getOffset()),
+        position_(position),
         count_(count),
         left_(count) {}
 
@@ -30,6 +31,7 @@ class EntryWalk {
 
   /// The current entry's number, from 1 on.
   std::uint32_t number() const { return count_ - left_ + 1; }
+  std::int64_t position() const { return position_ + std::int64_t{kEntrySize} * (number() - 1); }
 
   /// Whether the data holds the current entry's tag. May move the stream.
   bool hasTag() { return isBuffered(kEntryTypePosition) || fillBuffer(); }
@@ -81,6 +83,7 @@ class EntryWalk {
   QVStream& stream_;
   bool const isReversed_;
   long bufferOffset_;  // of the buffer's first byte in the stream
+  std::int64_t const position_;
   std::uint32_t const count_;
   std::uint32_t left_;  // entries from the current one on
   std::array<std::uint8_t, 64 * kEntrySize> buffer_;

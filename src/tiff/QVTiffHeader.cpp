@@ -15,10 +15,6 @@ constexpr unsigned short kBigEndianMark = 0x4d4d;     // "MM"
 
 constexpr unsigned short kBigTiffMagic = 43;
 
-// Where the header's numbers lie, in bytes from its start.
-constexpr std::int64_t kMagicPosition = 2;
-constexpr std::int64_t kOffsetPosition = 4;
-
 }  // namespace
 
 QVTiffHeader::QVTiffHeader() = default;
@@ -48,8 +44,7 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
 
   unsigned short magic = 0;
   if (!stream.readShort(&magic)) {
-    return refuseCut(journal, start + kMagicPosition, sizeof(magic), "{} at {}", name,
-                     Offset{start});
+    return refuseCut(journal, start + 2, sizeof(magic), "{} at {}", name, Offset{start});
   }
   if (magic != expectedMagic) {
     return refuse(journal, QVReason::OtherKind, start, "{} at {} has magic {}, not {}{}", name,
@@ -57,8 +52,8 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
                   magic == kBigTiffMagic ? "; 43 marks a BigTIFF, which is not read" : "");
   }
   if (!stream.readLong(&header.firstIFDOffset)) {
-    return refuseCut(journal, start + kOffsetPosition, sizeof(header.firstIFDOffset), "{} at {}",
-                     name, Offset{start});
+    return refuseCut(journal, start + 4, sizeof(header.firstIFDOffset), "{} at {}", name,
+                     Offset{start});
   }
   notePassed(journal, start, "{} at {}: {}-endian", name, Offset{start},
              isLittle ? "little" : "big");

@@ -30,8 +30,7 @@ void append(std::string& out, TagName tag) {
 
 void append(std::string& out, TypedCount values) {
   append(out, values.count);
-  out += ' ';
-  appendType(out, values.typeCode);
+  out.append(" ").append(kTypeNames[values.typeCode]);
   out += values.count == 1 ? " value" : " values";
 }
 
@@ -43,14 +42,6 @@ void append(std::string& out, DirectoryName const& directory) {
   }
   if (directory.structure != nullptr) {
     out.append(" of ").append(directory.structure);
-  }
-}
-
-void appendType(std::string& out, std::uint16_t typeCode) {
-  if (typeCode == 0 || typeCode >= std::size(kTypeNames)) {
-    out.append("type ").append(std::to_string(typeCode));
-  } else {
-    out += kTypeNames[typeCode];
   }
 }
 

@@ -14,7 +14,7 @@ struct TagName {
   unsigned short tag;
 };
 
-/// "2 SHORT values"
+/// "2 SHORT values", of a known type
 struct TypedCount {
   std::uint32_t count;
   std::uint16_t typeCode;
@@ -31,9 +31,6 @@ struct DirectoryName {
 void append(std::string& out, TagName tag);
 void append(std::string& out, TypedCount values);
 void append(std::string& out, DirectoryName const& directory);
-
-/// "SHORT", or "type 99" for the code of no type.
-void appendType(std::string& out, std::uint16_t typeCode);
 
 /// The record's field that an entry under the tag gives; null for none.
 char const* fieldOf(unsigned short tag);
