@@ -80,7 +80,7 @@ TEST_F(FileTest, IsReadInOneReadWithOneAdvice) {
 }
 
 TEST_F(FileTest, TakesAnotherReadForWhatLiesBeyond16KB) {
-  for (auto const& [size, reads] : {std::pair{16000, 1}, {20000, 2}}) {
+  for (auto const& [size, reads] : {std::pair<std::size_t, int>{16000, 1}, {20000, 2}}) {
     Bytes const bytes = "\xff\xd8" + segment(0xffe1, Bytes(size, 'x')) + sof0();
     TemporaryFile const file(bytes, "jpg");
     theSystem = {};
