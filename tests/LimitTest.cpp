@@ -68,10 +68,13 @@ class Endless : public QVStream {
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
     std::copy_n(bytes_.begin() + position_ % 8, std::min<std::size_t>(count, 8), destination);
     position_ += static_cast<long>(count);
+    furthest = std::max(furthest, position_);
     return static_cast<std::int64_t>(count);
   }
   long getOffset() override { return position_; }
   void setOffset(long const& offset) override { position_ = offset; }
+
+  long furthest = 0;
 
  private:
   std::array<std::uint8_t, 8> bytes_ = {};
@@ -81,13 +84,13 @@ class Endless : public QVStream {
 TEST(Limit, EndsAWalkAfter16777216Steps) {
   for (bool const isJpeg : {true, false}) {  // SOI without an end, or empty boxes
     QVJournal journal(QVJournal::Detail::Refusals);
-    std::shared_ptr<QVStream> const stream =
+    auto const stream =
         isJpeg ? std::make_shared<Endless>("\xff\xd8\xff\xd8\xff\xd8\xff\xd8")
                : std::make_shared<Endless>("\0\0\0\10free");
     EXPECT_FALSE(journal.read(stream, isJpeg ? "jpg" : "cr3"));
     EXPECT_EQ(journal.refusal()->reason, QVReason::TooMuchWork);
     EXPECT_NE(journal.refusal()->text.find("16777216 segments or boxes"), std::string::npos);
-    EXPECT_GE(stream->getOffset(), isJpeg ? long{1} << 25U : long{1} << 27U);
+    EXPECT_GE(stream->furthest, isJpeg ? long{1} << 25U : long{1} << 27U);
   }
 }
 

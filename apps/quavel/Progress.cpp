@@ -25,10 +25,11 @@ double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-/// A list in a pipe can be read only once.
+/// A list from standard input or in a pipe can be read only once.
 bool isRereadable(std::string const& list) {
   struct stat status = {};
-  return list.empty() || (::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode));
+  bool const isFile = ::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+  return list.empty() || (list != "-" && isFile);
 }
 
 std::string rate(std::size_t files, double seconds) {

@@ -69,7 +69,7 @@ struct QVNote {
 /// read at a time; distinct journals may be used on distinct threads.
 class QUAVEL_EXPORT QVJournal {
  public:
-  /// How much is noted. Refusals alone cost no time unless there is one.
+  /// How much is noted: refusals, with what else the file may be, cost no time unless there is one.
   enum class Detail : std::uint8_t { Refusals, All };
 
   explicit QVJournal(Detail detail = Detail::All);  ///< Without notes yet.
@@ -91,6 +91,9 @@ class QUAVEL_EXPORT QVJournal {
   /// The note that says why there is no record; null after a success and before any read.
   QVNote const* refusal() const;
 
+  /// The format that the last read's extension names: "JPEG"; empty when it names none.
+  char const* format() const { return format_; }
+
   /// A reason's name, in lower case with hyphens ("cut-short"); empty for what is not a reason.
   static char const* reasonName(QVReason reason);
 
@@ -102,6 +105,7 @@ class QUAVEL_EXPORT QVJournal {
   Detail detail_;
   std::vector<QVNote> notes_;
   std::uint64_t furtherSteps_ = 0;
+  char const* format_ = "";
 };
 
 }  // namespace quavel

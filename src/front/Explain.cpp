@@ -120,8 +120,11 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       std::string const kind =
           hasBrand ? composed("{} of brand \"{}\"", {&row.kind[0], brand}) : row.kind;
-      noteHint(&journal, QVReason::OtherContent, start,
-               "The file looks like {}; its extension has it read as {}", kind, format.kind);
+      for (QVNote& note : journal.notes) {  // how far the reader got in such a file says little
+        note.reason = note.kind == QVNoteKind::Refusal ? QVReason::OtherKind : note.reason;
+      }
+      journal.hint(QVReason::OtherContent, start,
+                   "The file looks like {}; its extension has it read as {}", {kind, format.kind});
     }
     return;
   }
@@ -129,7 +132,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
 
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
   for (auto const& row : kFields) {
-    if (isAbsent(row, record)) {
+    if (journal.wantsAll() && isAbsent(row, record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

@@ -73,8 +73,12 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
   for (auto const& format : kFormats) {
     known.append(known.empty() ? "" : " ").append(format.extension);
   }
+  if (extension.empty() || extension.find('/') != std::string::npos) {
+    return refuse(journal, QVReason::UnknownExtension, -1,
+                  "there is no extension; these name a format: {}", known);
+  }
   auto const* const bytes = reinterpret_cast<std::uint8_t const*>(extension.data());
-  QuotedBytes const quoted = {bytes, std::min<std::size_t>(extension.size(), 16)};
+  QuotedBytes const quoted = {bytes, std::min<std::size_t>(extension.size(), 100)};
   return refuse(journal, QVReason::UnknownExtension, -1,
                 "the extension \"{}\" names no format; these do: {}", quoted, known);
 }
@@ -119,16 +123,15 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     return nullptr;
   }
   ReadScope const scope(*stream, journal);
-  bool const wantsAll = journal != nullptr && journal->wantsAll();
-  std::int64_t const start = wantsAll ? positionOf(*stream) : 0;
+  std::int64_t const start = notedPosition(journal, *stream);
   auto record = format->makeRecord();
   if (!record->read(stream)) {
     record = nullptr;
   }
-  if (wantsAll && record) {
-    noteAbsences(*format, *record, *journal);
-  } else if (wantsAll) {
-    noteOtherContent(*format, *stream, start, *journal);
+  if (journal != nullptr) {
+    journal->format = format->kind;
+    record ? noteAbsences(*format, *record, *journal)
+           : noteOtherContent(*format, *stream, start, *journal);
   }
   return record;
 }

@@ -58,6 +58,7 @@ QVNote const* QVJournal::refusal() const {
 detail::Journal QVJournal::begin() {
   notes_.clear();  // a stream of the host's may throw
   furtherSteps_ = 0;
+  format_ = "";
   return detail::Journal(detail_);
 }
 
@@ -65,6 +66,7 @@ std::shared_ptr<QVMetadata> QVJournal::keep(detail::Journal& journal,
                                             std::shared_ptr<QVMetadata> record) {
   notes_ = std::move(journal.notes);
   furtherSteps_ = journal.furtherSteps;
+  format_ = journal.format;
   return record;
 }
 

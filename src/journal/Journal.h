@@ -43,6 +43,7 @@ class Journal {
 
   std::vector<QVNote> notes;
   std::uint64_t furtherSteps = 0;
+  char const* format = "";      ///< See QVJournal.
   int fd = -1;                  ///< Of the file that is read; -1: it is none.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
   bool hasReadFailed = false;   ///< The last read of bytes did, for another cause than their end.

@@ -17,6 +17,10 @@ ORIGINAL, FOCAL, PIXEL_X = 0x9003, 0x920A, 0xA002
 # The reason for programs, and what the photo's owner is told first.
 CUT = "cut-short", "cut short: "
 KIND = "other-kind", "another kind of file, or damaged: "
+ZIP = "other-kind", "The file looks like a ZIP archive; its extension has it read as DNG: the TIFF"
+HEIC = ("other-kind",
+        'The file looks like an ISO base media file of brand "heic"; its extension has it read as')
+PNG = "other-kind", "The file looks like a PNG file; its extension has it read as CR3: the header"
 ENTRY = "malformed-entry", "damaged or badly written: "
 BOX = "malformed-box", "damaged or badly written: "
 VALUES = "too-many-values", "beyond what is read of one file: "
@@ -68,7 +72,7 @@ FULL = directory(number(WIDTH, 6000), number(HEIGHT, 4000), number(SUBFILE, 0))
 REFUSED = [
     ("tif", KIND, b"II+\0" + bytes(12),
      "TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF"),
-    ("dng", KIND, b"PK\3\4" + bytes(12), "TIFF header at 0 begins with 50 4b, not with 49 49"),
+    ("dng", ZIP, b"PK\3\4" + bytes(12), "TIFF header at 0 begins with 50 4b, not with 49 49"),
     ("cr2", CUT, b"II*\0\x08\0", "TIFF header at 0: 4 bytes wanted at 4, but the file ends at 6"),
     ("tif", CUT, tiff(number(WIDTH, 1))[:-4], "offset of the next directory, after the 1 entries "
      "of IFD0 at 8: 4 bytes wanted at 0x16 (22), but the file ends at 0x16 (22)"),
@@ -99,7 +103,8 @@ REFUSED = [
      " at 0x270f (9999): 2 bytes wanted"),
     ("arw", IMAGE, tiff(number(SUBIFDS, 44), number(EXIF, 38)) + directory() + directory(
         number(SUBFILE, 1)), "SubIFD 1 of 1 at 0x2c (44) declares a reduced image (NewSub"),
-    ("jpg", KIND, box(b"ftyp", b"heic"), "the file begins with 00 00, not with ff d8"),
+    ("jpg", HEIC, box(b"ftyp", b"heic"), "the file begins with 00 00, not with ff d8"),
+    ("cr3", PNG, b"\x89PNG" + bytes(20), "8 bytes wanted at 0x89504e47"),
     ("jpg", KIND, b"\xff\xd8" + segment(0xFFE1, b"Exif\0\0\xff\xff"),
      "TIFF header of the Exif segment "
      "at 0xc (12) begins with ff ff"),
@@ -255,7 +260,7 @@ class WhyTest(unittest.TestCase):
         content = tiff(*NEF_SIZE)
         by_path = self.why(self.write("x.nef", content))[1].splitlines()[1:]
         done = self.run_quavel("--why", "--stdin", "--extension", "nef", input=content)
-        self.assertEqual(done.stdout.decode().splitlines(), ["-: a record."] + by_path)
+        self.assertEqual(done.stdout.decode().splitlines(), ["-: a record, read as NEF."] + by_path)
 
     @unittest.skipUnless(SAMPLES, "QUAVEL_SAMPLES is not set")
     def test_names_the_reasons_of_real_files(self):

@@ -2,7 +2,6 @@
 #include <utility>
 
 #include "output/Forms.h"
-#include "photo/Photo.h"
 #include "terminal/Text.h"
 
 namespace app {
@@ -17,10 +16,7 @@ std::string verdictOf(Outcome const& outcome) {
   if (outcome.problem) {
     return start + "no record: " + escaped(outcome.problem.text) + ".\n";
   }
-  std::string kind = extensionOf(outcome.path);
-  std::transform(kind.begin(), kind.end(), kind.begin(),
-                 [](char c) { return 'a' <= c && c <= 'z' ? static_cast<char>(c - 32) : c; });
-  return start + "a record" + (kind.empty() ? "" : ", read as " + kind) + ".\n";
+  return start + "a record, read as " + outcome.format + ".\n";
 }
 
 /// A line for each note of a kind.

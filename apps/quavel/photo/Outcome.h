@@ -32,6 +32,7 @@ struct Outcome {
   std::string path;
   std::shared_ptr<quavel::QVMetadata> record;  ///< Null when there is none, or no more needed.
   Problem problem;                             ///< When there is no record.
+  char const* format = "";                     ///< As the journal has it.
   std::vector<quavel::QVNote> notes;           ///< When they are wanted.
   std::uint64_t furtherSteps = 0;              ///< Those that the notes leave out.
   std::string text;                            ///< As the chosen form shows it, once prepared.

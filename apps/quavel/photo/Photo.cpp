@@ -70,9 +70,10 @@ void fill(Outcome& outcome, Detail detail, Read read) {
   }
   QVJournal journal(detail);
   outcome.record = read(journal);
-  if (auto const* const refusal = journal.refusal()) {
-    outcome.problem = reason::refusal(*refusal);
+  if (!outcome.record) {
+    outcome.problem = reason::refusal(journal);
   }
+  outcome.format = journal.format();
   if (detail == Detail::All) {
     outcome.notes = journal.notes();
     outcome.furtherSteps = journal.furtherSteps();

@@ -75,7 +75,13 @@ Problem failure(std::exception const& error) {
   return {kUnexpected, std::string("unexpected: ") + error.what()};
 }
 
-Problem refusal(quavel::QVNote const& note) {
+Problem refusal(QVJournal const& journal) {
+  quavel::QVNote const& note = *journal.refusal();
+  for (auto const& hint : journal.notes()) {
+    if (hint.reason == QVReason::OtherContent) {
+      return {QVJournal::reasonName(note.reason), hint.text + ": " + note.text, note.position};
+    }
+  }
   char const* const end =
       note.reason == QVReason::Empty ? "; copy it anew from its source" : advice(note.systemError);
   return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + end, note.position};

@@ -28,8 +28,8 @@ Problem cannotOpen(int error);
 Problem cannotRead(int error);
 /// What was thrown on the way.
 Problem failure(std::exception const& error);
-/// The library's refusal.
-Problem refusal(quavel::QVNote const& note);
+/// The library's refusal; one of what is plainly another kind of file says so first.
+Problem refusal(quavel::QVJournal const& journal);
 
 }  // namespace app::reason
 
