@@ -8,14 +8,9 @@
 
 namespace quavel {
 
-class QVStream;
-
 namespace detail {
-class Journal;
 class Reading;
 class ReadScope;
-Journal* journalOf(QVStream const& stream);
-Reading& readingOf(QVStream const& stream);
 }  // namespace detail
 
 /// Byte order of multi-byte numbers, as TIFF marks it.
@@ -79,8 +74,6 @@ class QUAVEL_EXPORT QVStream {
 
  private:
   friend class detail::ReadScope;
-  friend detail::Journal* detail::journalOf(QVStream const& stream);
-  friend detail::Reading& detail::readingOf(QVStream const& stream);
 
   /// The read that this stream serves, if any. A copy of the stream serves none.
   struct CurrentReading {

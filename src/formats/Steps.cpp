@@ -172,9 +172,4 @@ bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::in
          storeRequiredNumber(directory, tag::ImageLength, rule, height);
 }
 
-std::int64_t positionOf(Directory const& directory) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  return own == nullptr ? -1 : own->table.position();
-}
-
 }  // namespace quavel::detail

@@ -75,7 +75,10 @@ inline PlacedDirectory placed(Directory const& directory) {
 }
 
 /// Where a directory begins in the file; -1 for a host's.
-std::int64_t positionOf(Directory const& directory);
+inline std::int64_t positionOf(Directory const& directory) {
+  auto const* const own = ReaderDirectory::of(*directory);
+  return own == nullptr ? -1 : own->table.position();
+}
 
 }  // namespace quavel::detail
 

@@ -25,33 +25,21 @@ namespace quavel::detail {
 namespace {
 
 /// Room for an image of any class: as none adds members to the record, one kind of room serves all,
-/// which keeps ten kinds of shared owner out of the library.
-class ImageRoom {
- public:
+/// which keeps ten kinds of shared owner out of the library. It gets its image at once.
+struct ImageRoom {
   ImageRoom() {}  // leaves the bytes as they are
-  ~ImageRoom() {
-    if (image_ != nullptr) {
-      image_->~QVMetadata();
-    }
-  }
-  ImageRoom(ImageRoom const&) = delete;
-  ImageRoom& operator=(ImageRoom const&) = delete;
+  ~ImageRoom() { image->~QVMetadata(); }
 
-  template <class Image>
-  QVMetadata* make() {
-    static_assert(sizeof(Image) == sizeof(QVMetadata));
-    return image_ = new (bytes_) Image;
-  }
-
- private:
-  QVMetadata* image_ = nullptr;
-  alignas(QVMetadata) unsigned char bytes_[sizeof(QVMetadata)];
+  QVMetadata* image;
+  alignas(QVMetadata) unsigned char bytes[sizeof(QVMetadata)];
 };
 
 template <class Image>
 std::shared_ptr<QVMetadata> make() {
+  static_assert(sizeof(Image) == sizeof(QVMetadata));
   auto const room = std::make_shared<ImageRoom>();
-  return {room, room->make<Image>()};
+  room->image = new (room->bytes) Image;
+  return {room, room->image};
 }
 
 constexpr Format kFormats[] = {

@@ -65,6 +65,7 @@ class ReadScope {
   ReadScope& operator=(ReadScope const&) = delete;
 
   Reading& reading() const { return *stream_.reading_.current; }
+  static Reading* current(QVStream const& stream) { return stream.reading_.current; }
 
  private:
   QVStream& stream_;
@@ -73,11 +74,11 @@ class ReadScope {
 };
 
 /// The read that the stream serves. Every public operation that can lead to here opens a scope.
-inline Reading& readingOf(QVStream const& stream) { return *stream.reading_.current; }
+inline Reading& readingOf(QVStream const& stream) { return *ReadScope::current(stream); }
 
 /// The journal of the read that the stream serves, or null.
 inline Journal* journalOf(QVStream const& stream) {
-  Reading const* const reading = stream.reading_.current;
+  Reading const* const reading = ReadScope::current(stream);
   return reading == nullptr ? nullptr : reading->journal;
 }
 
