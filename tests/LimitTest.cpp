@@ -84,9 +84,8 @@ class Endless : public QVStream {
 TEST(Limit, EndsAWalkAfter16777216Steps) {
   for (bool const isJpeg : {true, false}) {  // SOI without an end, or empty boxes
     QVJournal journal(QVJournal::Detail::Refusals);
-    auto const stream =
-        isJpeg ? std::make_shared<Endless>("\xff\xd8\xff\xd8\xff\xd8\xff\xd8")
-               : std::make_shared<Endless>("\0\0\0\10free");
+    auto const stream = isJpeg ? std::make_shared<Endless>("\xff\xd8\xff\xd8\xff\xd8\xff\xd8")
+                               : std::make_shared<Endless>("\0\0\0\10free");
     EXPECT_FALSE(journal.read(stream, isJpeg ? "jpg" : "cr3"));
     EXPECT_EQ(journal.refusal()->reason, QVReason::TooMuchWork);
     EXPECT_NE(journal.refusal()->text.find("16777216 segments or boxes"), std::string::npos);
