@@ -95,11 +95,9 @@ void noteHint(Journal* journal, QVReason reason, std::int64_t position, char con
   }
 }
 
-using Fields = std::initializer_list<char const*>;
-
 template <class... Words>
-void noteAbsent(Journal* journal, Fields fields, QVReason reason, char const* pattern,
-                Words... words) {
+void noteAbsent(Journal* journal, std::initializer_list<char const*> fields, QVReason reason,
+                char const* pattern, Words... words) {
   if (journal != nullptr && journal->wantsAll()) {
     for (char const* const field : fields) {
       journal->absent(field, reason, pattern, {words...});

@@ -29,7 +29,6 @@ void reverseBytes(Number* number) {
   std::conditional_t<kSize == 2, std::uint16_t,
                      std::conditional_t<kSize == 4, std::uint32_t, std::uint64_t>>
       bits;
-  static_assert(sizeof(bits) == kSize);
   std::memcpy(&bits, number, kSize);
   bits = reversed(bits);
   std::memcpy(number, &bits, kSize);
