@@ -6,7 +6,7 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  std::int64_t const size = journal == nullptr ? -1 : journal->dataSize();
+  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;
   notePassed(journal, position, "end of the data at {}, where the walk ends",
              Offset{size < 0 ? position : std::min(position, size)});
 }
@@ -25,7 +25,7 @@ void detail::noteSize(Directory const& exifIFD, int width, int height) {
 }
 
 void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
-  if (journal == nullptr || !journal->wantsAll()) {
+  if (!wantsAll(journal)) {
     return;
   }
   QVNote const* const exif = journal->absenceOf("width");

@@ -216,7 +216,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
-  if (journalOf(ifd) != nullptr) {
+  if (wantsAll(journalOf(ifd))) {
     noteSize(ifd, exifWidth, exifHeight);
   }
   if (exifWidth > kLargestThumbnailSide && exifHeight > kLargestThumbnailSide) {

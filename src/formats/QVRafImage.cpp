@@ -44,7 +44,7 @@ bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
 /// Tells what the embedded image begins with when that explains why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
-  if (journal == nullptr || !journal->wantsAll()) {
+  if (!wantsAll(journal)) {
     return;
   }
   stream.setOffset(static_cast<long>(imageOffset - stream.baseOffset));

@@ -124,7 +124,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std
 
 void noteNoEntry(Directory const& directory, unsigned short tag) {
   Journal* const journal = journalOf(directory);
-  if (journal != nullptr && fieldOf(tag) != nullptr) {
+  if (wantsAll(journal) && fieldOf(tag) != nullptr) {
     noteAbsent(journal, {fieldOf(tag)}, QVReason::NotInFile, "no {} in {}", TagName{tag},
                placed(directory));
   }

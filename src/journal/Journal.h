@@ -59,6 +59,9 @@ class Journal {
   std::vector<QVNote> absences_;  // by field, one for each
 };
 
+/// Whether somebody listens who wants more than the refusal.
+inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
+
 /// States why the read ends. False, for the step to return on the spot.
 template <class... Words>
 [[gnu::cold, gnu::noinline]] bool refuse(Journal* journal, QVReason reason, std::int64_t position,
@@ -82,7 +85,7 @@ template <class... Words>
 
 template <class... Words>
 void notePassed(Journal* journal, std::int64_t position, char const* pattern, Words... words) {
-  if (journal != nullptr && journal->wantsAll()) {
+  if (wantsAll(journal)) {
     journal->passed(position, pattern, {words...});
   }
 }
@@ -90,7 +93,7 @@ void notePassed(Journal* journal, std::int64_t position, char const* pattern, Wo
 template <class... Words>
 void noteHint(Journal* journal, QVReason reason, std::int64_t position, char const* pattern,
               Words... words) {
-  if (journal != nullptr && journal->wantsAll()) {
+  if (wantsAll(journal)) {
     journal->hint(reason, position, pattern, {words...});
   }
 }
@@ -98,7 +101,7 @@ void noteHint(Journal* journal, QVReason reason, std::int64_t position, char con
 template <class... Words>
 void noteAbsent(Journal* journal, std::initializer_list<char const*> fields, QVReason reason,
                 char const* pattern, Words... words) {
-  if (journal != nullptr && journal->wantsAll()) {
+  if (wantsAll(journal)) {
     for (char const* const field : fields) {
       journal->absent(field, reason, pattern, {words...});
     }
