@@ -52,6 +52,8 @@ std::string date(std::string const& value) {
       value.find_first_not_of("0123456789: ") == std::string::npos) {
     result[4] = '-';
     result[7] = '-';
+  } else if (value.size() == 19 && value[4] == '-' && value[10] == 'T') {
+    result[10] = ' ';
   }
   return result;
 }
