@@ -103,7 +103,9 @@ void Table::add(Outcome&& outcome) {
     page_.push_back(std::move(outcome.cells));
   }
   auto const patience = natural_.empty() ? kFirstPatience : kPatience;
-  bool const isDue = isTerminal_ && files_ > 1 && now - pageStart_ > patience;
+  // Sorted rows come all at once: no page of them needs to be short.
+  bool const isDue =
+      isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > patience;
   if (page_.size() == kPage || isDue) {
     writePage(false);
   }
