@@ -131,8 +131,11 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
 }
 
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
+  if (!journal.wantsAll()) {
+    return;
+  }
   for (auto const& row : kFields) {
-    if (journal.wantsAll() && isAbsent(row, record)) {
+    if (isAbsent(row, record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

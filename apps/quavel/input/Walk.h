@@ -4,10 +4,12 @@
 #include <dirent.h>
 #include <sys/types.h>
 
+#include <cstddef>
 #include <functional>
 #include <optional>
 #include <set>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -38,18 +40,19 @@ class Walk {
  private:
   using Identity = std::pair<dev_t, ino_t>;
   struct Entry {
-    std::string name;
+    std::size_t name;    // where it starts in the names
     unsigned char type;  // the system's, such as DT_REG
   };
   struct Level {
     std::string path;  // with a "/" at the end
     Identity identity;
+    std::string names;           // each ends with a NUL
     std::vector<Entry> entries;  // still to be visited, the last one first
   };
 
   void enter(std::string const& path, bool isLink);
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
-  bool isLeftOut(std::string const& folder, std::string const& name, bool isFolder) const;
+  bool isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const;
   void readEntries(DIR* folder, Level& level);
   void miss(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);

@@ -45,8 +45,10 @@ std::string inWords(Field const& field, Outcome const& outcome);
 /// There is no value, or a text of nothing but blanks and colons, as cameras without a clock write.
 bool isAbsent(Value const& value);
 
-/// The value for programs: text as it is, digits that read back to the same number, "Infinity",
-/// "true". Empty when absent.
+/// Appends the value for programs: text as it is, digits that read back to the same number,
+/// "Infinity", "true". Nothing when absent.
+void appendExact(std::string& text, Value const& value);
+/// The same by itself.
 std::string exact(Value const& value);
 
 }  // namespace app
