@@ -11,7 +11,6 @@ import pty
 import re
 import select
 import shlex
-import shutil
 import signal
 import struct
 import subprocess
@@ -275,16 +274,24 @@ class Forms(CommandTest):
         header = self.run_quavel("--csv", "a.tif").stdout.decode().splitlines()[0].split(",")
         folder = COMMAND_SOURCE / "completions"
         for name, pattern in (("quavel", r"_fields='([^']*)'"), ("_quavel", r"fields=\(([^)]*)\)"),
-                              ("quavel.fish", r"set -l fields ((?:[^\n]*\\\n)*[^\n]*)")):
+                              ("quavel.fish", r"set -g __quavel_fields ((?:[^\n]*\\\n)*[^\n]*)")):
             found = re.search(pattern, (folder / name).read_text(encoding="utf-8"))
             self.assertEqual(found[1].replace("\\", " ").split(), header, name)
+        options = re.findall(r"(?m)^  (?:-\w,)?--([a-z0-9-]+)", self.run_quavel("--help").stdout.decode())
+        self.assertGreater(len(options), 20)
+        for name in ("completions/quavel", "completions/_quavel", "completions/quavel.fish", "quavel.1"):
+            text = (folder.parent / name).read_text(encoding="utf-8").replace("\\-", "-")
+            for option in options:
+                self.assertRegex(text, rf"(--| -l ){option}(?![\w-])", name)
 
-    @unittest.skipUnless(shutil.which("bash"), "needs bash")
     def test_bash_completes_values_and_names(self):
         self.put("-a.tif", b"")
         script = COMMAND_SOURCE / "completions/quavel"
         for words, expected in ((["--absent", "=", "sh"], "show"), (["--absent", "="], "skip show"),
                                 (["--absent", "s"], "skip show"), (["--fields", "=", "iso,mod"], "iso,model"),
+                                (["--fields", "iso,i"], "iso,isRaw"), (["--fields", "pathBytes,pa"], "pathBytes,path"),
+                                (["--sort", "=", "-is"], "-isRaw -iso"), (["--sort", "ca"], "captureDate"),
+                                (["--where", "mod"], "model"), (["--dates", "=", ""], "exif iso"), (["-j", ""], ""),
                                 (["--why", "--cs"], "--csv"), (["--", "-"], "-a.tif"), (["--", "--sort", "i"], "")):
             run = 'compopt() { :; }; . "$0"; COMP_WORDS=(quavel "$@"); COMP_CWORD=$#; _quavel; ' \
                   'echo "${COMPREPLY[*]}"'
