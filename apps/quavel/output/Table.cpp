@@ -29,7 +29,7 @@ std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std:
     folder.erase(std::mismatch(folder.begin(), limit, path.begin()).first, folder.end());
     folder.erase(folder.rfind('/') + 1);
   }
-  return folder == "./" ? "" : folder;  // as short as that, it is not in the way
+  return folder.size() <= 2 ? "" : folder;  // "./" and "/" are not in the way
 }
 
 bool isWithin(Widths const& inner, Widths const& outer) {
