@@ -107,7 +107,9 @@ constexpr Signature kSignatures[] = {
 
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start,
                       Journal& journal) {
-  stream.setOffset(static_cast<long>(start - stream.baseOffset));
+  if (!seek(stream, start - stream.baseOffset)) {
+    return;
+  }
   std::array<std::uint8_t, kOpeningSize> opening;
   std::size_t const size = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
