@@ -11,8 +11,8 @@ namespace {
 constexpr int kReadsOfAWalk = 16;
 constexpr std::int64_t kForeseen = std::int64_t{4} << 20;
 
-// The metadata of most files lies in the first block. What lies beyond is a directory here and a
-// segment there. docs/speed.md tells how both sizes were measured.
+// The metadata of most files lies in the first block; beyond it are single directories and
+// segments. docs/speed.md shows how both sizes were measured.
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
@@ -21,7 +21,7 @@ struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
 
   PositionedFile file;
-  // Shares the ownership of nothing: the file lives as long as this does.
+  // Owns nothing: the file lives as long as this object.
   QVReadAheadStream ahead{std::shared_ptr<QVStream>(std::shared_ptr<void>(), &file),
                           kFirstBlockSize, kNextBlockSize};
 };
@@ -32,7 +32,7 @@ PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 void PositionedFile::advise() {
   ++reads_;
-  // Left to itself, a system fetches several times what is asked for at a file's start.
+  // By default, a system fetches several times what is asked for at the start of a file.
   if (reads_ == 1) {
     file::expectFewReads(fd);
   }

@@ -99,16 +99,16 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[longest]);
   }
-  // Data that goes on where the source stands is likely to go on further.
+  // Reads that continue where the source stands are likely to continue further.
   fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // whatever happens from here on, what was there is overwritten
-  errno = 0;       // a source of the host's need not tell why it fails
+  block.size = 0;  // its bytes are overwritten, whatever happens
+  errno = 0;       // a host's stream need not say why it fails
   std::int64_t delivered = readSource(block, wanted);
   if (delivered < 0) {
-    // What is broken may lie beyond the bytes that are needed.
+    // The fault may lie beyond the bytes that are needed.
     delivered = readSource(block, std::min(needed, wanted));
   }
   detail::noteReadResult(*this, delivered, errno);
