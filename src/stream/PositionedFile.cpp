@@ -1,5 +1,7 @@
 #include "stream/PositionedFile.h"
 
+#include <cerrno>
+
 #include "quavel/QVReadAheadStream.h"
 #include "system/File.h"
 
@@ -36,8 +38,9 @@ void PositionedFile::advise() {
   if (reads_ == 1) {
     file::expectFewReads(fd);
   }
-  if (reads_ == kReadsOfAWalk) {
+  if (reads_ >= kReadsOfAWalk && position_ >= foreseenEnd_) {
     file::expectReads(fd, position_, kForeseen);
+    foreseenEnd_ = position_ + kForeseen;
   }
 }
 
@@ -46,9 +49,27 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   advise();
-  std::int64_t const delivered = file::readAt(fd, destination, count, position_);
+  std::int64_t delivered = file::readAt(fd, destination, count, position_);
+  if (delivered == -1 && errno == ESPIPE) {
+    delivered = readPipe(destination, count);
+  }
   position_ += delivered > 0 ? delivered : 0;
   return delivered;
+}
+
+std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t count) {
+  if (position_ != pipePosition_) {
+    return -1;
+  }
+  // Whole: what has arrived by now depends on the writer.
+  std::size_t received = 0;
+  std::int64_t delivered = 1;
+  while (received < count && delivered > 0) {
+    delivered = file::read(fd, destination + received, count - received);
+    received += delivered > 0 ? static_cast<std::size_t>(delivered) : 0;
+  }
+  pipePosition_ += static_cast<std::int64_t>(received);
+  return received == 0 ? delivered : static_cast<std::int64_t>(received);
 }
 
 long PositionedFile::getOffset() {

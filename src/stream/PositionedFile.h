@@ -13,7 +13,8 @@ inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read names its position, so that a seek costs nothing,
 /// and the system is asked not to read ahead. A file that takes many reads is being walked to its
-/// end, so the system is then asked to fetch what follows. A pipe is read front to back.
+/// end, so the system is then asked to fetch what follows. A pipe is
+/// read front to back; a read anywhere else fails.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);
@@ -24,8 +25,11 @@ class PositionedFile : public QVFStream {
 
  private:
   void advise();
+  std::int64_t readPipe(std::uint8_t* destination, std::size_t count);
 
-  std::int64_t position_ = 0;  // absolute
+  std::int64_t position_ = 0;      // absolute
+  std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
+  std::int64_t foreseenEnd_ = 0;   // where the system no longer expects reads
   int reads_ = 0;
 };
 
