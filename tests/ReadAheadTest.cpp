@@ -62,7 +62,7 @@ struct PartlyBrokenStream : QVMStream {
     return offset + count > 9000 ? -1 : QVMStream::readBuffer(destination, count);
   }
   void setOffset(long const& newOffset) override {
-    if (newOffset <= 0xeffffff0) {
+    if (baseOffset + newOffset <= 0xeffffff0) {
       QVMStream::setOffset(newOffset);
     }
   }
@@ -74,7 +74,9 @@ TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {
       reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
   QVReadAheadStream stream(source, 16384, 4096);
   stream.setOffset(100);
-  stream.setOffset(0xfffffff0);
+  stream.baseOffset = 0x80000000;
+  stream.setOffset(0x7ffffff0);
+  stream.baseOffset = 0;
   EXPECT_EQ(stream.getOffset(), 100);
   unsigned int number = 0;
   EXPECT_TRUE(stream.readLong(&number));

@@ -157,8 +157,9 @@ TEST(FileStream, SeeksAlikeHoweverItIsRead) {
   QVReadAheadStream ahead(std::make_shared<QVFStream>(file.path), 100, 10);
   auto const byPath = detail::openReadAhead(file.path);
   for (std::int64_t const base : {std::int64_t{0}, std::int64_t{1}, kLargeFile}) {
-    for (long const offset : {100L, -1L, 1L, 0x7fffffffL, 0x80000000L, 4999999990L, 5000000000L,
-                              LONG_MAX, LONG_MIN, 2L}) {
+    for (std::int64_t const target : {100LL, -1LL, 1LL, 0x7fffffffLL, 0x80000000LL, 4999999990LL,
+                                      5000000000LL, LLONG_MAX, LLONG_MIN, 2LL}) {
+      auto const offset = static_cast<long>(target);  // another one where `long` has 32 bits
       plain.baseOffset = base;
       plain.setOffset(offset);
       long const position = plain.getOffset();

@@ -11,6 +11,21 @@
 
 namespace quavel {
 
+namespace {
+
+/// Moves to where `long` does not reach, by the base. False: the stream is not there afterwards.
+bool seekByBase(QVStream& source, std::int64_t target) {
+  std::int64_t const base = source.baseOffset;
+  source.baseOffset = static_cast<std::int64_t>(static_cast<std::uint64_t>(base) +
+                                                static_cast<std::uint64_t>(target));
+  source.setOffset(0);
+  bool const isThere = source.getOffset() == 0;
+  source.baseOffset = base;
+  return isThere;
+}
+
+}  // namespace
+
 QVReadAheadStream::QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                                      std::size_t nextBlockSize)
     : source_(std::move(source)),
@@ -48,9 +63,14 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  source_->setOffset(static_cast<long>(target));
-  sourcePosition_ = source_->getOffset();
-  return sourcePosition_ == target;
+  // A source that refuses the seek stays at 0. One that goes no further than its end accepts it.
+  sourcePosition_ = -1;
+  source_->setOffset(0);
+  if (target == static_cast<long>(target)) {
+    source_->setOffset(static_cast<long>(target));
+    return source_->getOffset() != 0;
+  }
+  return seekByBase(*source_, target) || source_->getOffset() != 0;
 }
 
 std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_t count) {
@@ -61,10 +81,10 @@ std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_
 std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destination,
                                         std::size_t count) {
   auto const skipped = static_cast<std::uint64_t>(position_ - block.start);
-  if (position_ < block.start || skipped >= block.size) {
+  if (count == 0 || position_ < block.start || skipped >= block.size) {
     return 0;
   }
-  std::size_t const copied = std::min(count, block.size - skipped);
+  std::size_t const copied = std::min(count, block.size - static_cast<std::size_t>(skipped));
   detail::copyBytes(destination, block.bytes.get() + skipped, copied);
   position_ += static_cast<std::int64_t>(copied);
   return copied;
@@ -80,17 +100,17 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[longest]);
   }
-  // Data that goes on where the source stands is likely to go on further.
+  // Reads that continue where the source stands are likely to continue further.
   fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // whatever happens from here on, what was there is overwritten
-  errno = 0;       // a source of the host's need not tell why it fails
+  block.size = 0;  // its bytes are overwritten, whatever happens
+  errno = 0;       // a host's stream need not say why it fails
   std::int64_t delivered = readSource(block, wanted);
-  if (delivered < 0) {
-    // What is broken may lie beyond the bytes that are needed.
-    delivered = readSource(block, std::min(needed, wanted));
+  if (delivered < 0 && needed < wanted) {
+    // The fault may lie beyond the bytes that are needed.
+    delivered = readSource(block, needed);
   }
   detail::noteReadResult(*this, delivered, errno);
   block.start = position_;
@@ -99,7 +119,13 @@ void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t need
 
 std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
   if (std::exchange(sourcePosition_, -1) != position_) {
-    source_->setOffset(static_cast<long>(position_));
+    if (position_ == static_cast<long>(position_)) {
+      source_->setOffset(static_cast<long>(position_));
+    } else if (!sourceAccepts(position_)) {
+      return -1;
+    } else {
+      sourcePosition_ = -1;  // unless the read succeeds
+    }
   }
   std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
   // A count beyond what was asked for is not one; nor is a position beyond the last there can be.

@@ -9,14 +9,13 @@
 
 namespace quavel::detail {
 
-/// A walk over a directory's entries, which takes from the stream as many at a time as its buffer
-/// holds.
+/// A walk over a directory's entries, which reads as many at a time as its buffer holds.
 class EntryWalk {
  public:
   /// The stream stands at the first of `count` entries, which is at `position` in the file.
   EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
-        isReversed_(isReversed(stream)),
+        isReversed_(needsReversal(stream)),
         bufferOffset_(stream.getOffset()),
         position_(position),
         count_(count),
@@ -38,7 +37,7 @@ class EntryWalk {
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
-  /// What follows the tag. False: the type or the count is not in the data.
+  /// What follows the tag. False: the data ends before the type or the count does.
   bool readRest(RawEntry* entry) const {
     if (!isBuffered(kEntryFieldPosition)) {
       return false;
@@ -52,13 +51,13 @@ class EntryWalk {
   }
 
   /// Where the next entry begins, and where the last one ends.
-  long nextOffset() const { return offset() + kStep; }
-  long end() const { return offset() + kStep * left_; }
+  std::int64_t nextOffset() const { return offset() + kStep; }
+  std::int64_t end() const { return offset() + kStep * left_; }
 
  private:
-  static constexpr long kStep = kEntrySize;
+  static constexpr std::int64_t kStep = kEntrySize;
 
-  long offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
+  std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
   /// Whether the buffer holds the first `size` bytes of the current entry.
   bool isBuffered(std::size_t size) const {
@@ -73,16 +72,16 @@ class EntryWalk {
   /// Buffers the current entry and those after it. False: its tag is not in the data.
   bool fillBuffer() {
     bufferOffset_ = offset();
-    stream_.setOffset(bufferOffset_);
     entry_ = buffer_.data();
     std::size_t const size = std::min(kEntrySize * left_, buffer_.size());
-    bufferEnd_ = entry_ + readUpTo(stream_, buffer_.data(), size);
+    bool const isReached = seek(stream_, bufferOffset_);
+    bufferEnd_ = entry_ + (isReached ? readUpTo(stream_, buffer_.data(), size) : 0);
     return isBuffered(kEntryTypePosition);
   }
 
   QVStream& stream_;
   bool const isReversed_;
-  long bufferOffset_;  // of the buffer's first byte in the stream
+  std::int64_t bufferOffset_;  // of the buffer's first byte in the stream
   std::int64_t const position_;
   std::uint32_t const count_;
   std::uint32_t left_;  // entries from the current one on
