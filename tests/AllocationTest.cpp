@@ -65,7 +65,7 @@ TEST(Allocation, FailureLeavesNothingBehind) {
   for (Fixture const& fixture : fixtures()) {
     SCOPED_TRACE(fixture.extension);
     Bytes bytes = fixture.bytes(kII);
-    auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+    auto* const data = dataOf(bytes);
     TemporaryFile const file(bytes, fixture.extension);
     sweepAllocations([&] { QVReader(data, bytes.size(), fixture.extension); });
     sweepAllocations([&] { QVReader const reader(file.path); });
@@ -84,7 +84,7 @@ TEST(Allocation, AreFewWhateverTheFormat) {
   for (Fixture const& fixture : fixtures()) {
     SCOPED_TRACE(fixture.extension);
     Bytes bytes = fixture.bytes(kII);
-    auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+    auto* const data = dataOf(bytes);
     allocationsLeft = 20;
     bool isEnough = true;
     try {
@@ -98,7 +98,7 @@ TEST(Allocation, AreFewWhateverTheFormat) {
 }
 
 std::size_t heapOf(Bytes bytes, std::string const& extension) {
-  auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
+  auto* const data = dataOf(bytes);
   std::size_t const before = live;
   peak = live;
   QVReader const reader(data, bytes.size(), extension);
