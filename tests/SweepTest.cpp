@@ -31,29 +31,52 @@ TEST(Sweep, OfPrefixesGivesTheWholeRecordOnceAllNeededBytesAreThere) {
   }
 }
 
+/// Changes each of the first bytes in several ways. The journal keeps its law, and of no field that
+/// the file gives it says that the format never does.
+void sweepChanges(Bytes const& bytes, std::string const& extension) {
+  SCOPED_TRACE(extension);
+  QVJournal journal;
+  Bytes changed = bytes;
+  auto const read = [&] { return journal.read(dataOf(changed), changed.size(), extension); };
+  auto const whole = read();
+  auto const absent = whole ? absentFields(*whole) : absentFields(QVTiffImage());
+  for (std::size_t i = 0; i < std::min<std::size_t>(bytes.size(), 4096); ++i) {
+    char const flipped = static_cast<char>(bytes[i] ^ 1 << i % 8);
+    // The last makes another tag of an entry's.
+    for (char const value : {'\0', '\xff', flipped, static_cast<char>(bytes[i] ^ 4)}) {
+      changed[i] = value;
+      auto const record = read();
+      EXPECT_EQ(brokenLaw(journal, record.get()), "") << i;
+      EXPECT_EQ(describe(QVReader(dataOf(changed), changed.size(), extension).metadata),
+                describe(record));
+      for (QVNote const& note : journal.notes()) {
+        EXPECT_TRUE(note.reason != QVReason::NotInFormat || absent.count(note.field) == 1)
+            << note.field << ": " << note.text;
+      }
+    }
+    changed[i] = bytes[i];
+  }
+}
+
 TEST(Sweep, OfChangedBytesKeepsTheLawOfTheJournal) {
   for (Fixture const& fixture : fixtures()) {
-    SCOPED_TRACE(fixture.extension);
-    Bytes const bytes = fixture.bytes(kMM);
-    QVJournal journal;
-    Bytes changed = bytes;
-    auto const read = [&] {
-      return journal.read(dataOf(changed), changed.size(), fixture.extension);
-    };
-    auto const neverGiven = absentFields(*read());
-    for (std::size_t i = 0; i < bytes.size(); ++i, changed = bytes) {
-      char const flipped = static_cast<char>(bytes[i] ^ 1 << i % 8);
-      // Among them: an entry's tag becomes another one.
-      for (char const value : {'\0', '\xff', flipped, static_cast<char>(bytes[i] ^ 4)}) {
-        changed[i] = value;
-        auto const record = read();
-        EXPECT_EQ(brokenLaw(journal, record.get()), "") << i;
-        EXPECT_EQ(readBuffer(changed, fixture.extension), describe(record)) << i;
-        for (QVNote const& note : journal.notes()) {
-          EXPECT_TRUE(note.reason != QVReason::NotInFormat || neverGiven.count(note.field) == 1)
-              << note.field << ": " << note.text;
-        }
-      }
+    sweepChanges(fixture.bytes(kMM), fixture.extension);
+  }
+}
+
+// Takes minutes: for a folder of real files, named by the environment.
+TEST(Sweep, SurvivesDamagedSamples) {
+  char const* const folder = std::getenv("QUAVEL_SAMPLES");
+  if (folder == nullptr) {
+    GTEST_SKIP() << "QUAVEL_SAMPLES names no folder";
+  }
+  for (auto const& item : std::filesystem::directory_iterator(folder)) {
+    std::ifstream file(item.path(), std::ios::binary);
+    Bytes const bytes{std::istreambuf_iterator<char>(file), {}};
+    std::string const extension = QVReader("").getPathExtension(item.path().string());
+    sweepChanges(bytes, extension);
+    for (std::size_t length = 0; length < bytes.size(); length += 97) {
+      readBuffer(bytes.substr(0, length), extension);
     }
   }
 }
@@ -107,30 +130,6 @@ TEST(Sweep, OfFailingCallsEndsTheRead) {
   }
 }
 
-// Takes minutes: for a folder of real files, named by the environment.
-TEST(Sweep, SurvivesDamagedSamples) {
-  char const* const folder = std::getenv("QUAVEL_SAMPLES");
-  if (folder == nullptr) {
-    GTEST_SKIP() << "QUAVEL_SAMPLES names no folder";
-  }
-  for (auto const& item : std::filesystem::directory_iterator(folder)) {
-    std::ifstream file(item.path(), std::ios::binary);
-    Bytes bytes{std::istreambuf_iterator<char>(file), {}};
-    std::string const extension = QVReader("").getPathExtension(item.path().string());
-    for (std::size_t i = 0; i < std::min<std::size_t>(bytes.size(), 4096); ++i) {
-      for (unsigned bit = 0; bit < 10; ++bit) {
-        char const original = bytes[i];
-        bytes[i] = static_cast<char>(bit < 8 ? original ^ 1 << bit : 8 - static_cast<int>(bit));
-        QVReader(dataOf(bytes), bytes.size(), extension);
-        bytes[i] = original;
-      }
-    }
-    for (std::size_t length = 0; length < bytes.size(); length += 97) {
-      readBuffer(bytes.substr(0, length), extension);
-    }
-  }
-}
-
 TEST(Threads, ReadTheSameFilesAtOnce) {
   std::vector<std::unique_ptr<TemporaryFile>> files;
   for (Fixture const& fixture : fixtures()) {
@@ -144,15 +143,11 @@ TEST(Threads, ReadTheSameFilesAtOnce) {
                 readBuffer(fixture.bytes(kMM), fixture.extension) == fixture.expected;
     }
   };
-  bool isRight[4] = {true, true, true, true};
-  std::vector<std::thread> threads;
-  for (bool& result : isRight) {
-    threads.emplace_back(readAll, std::ref(result));
-  }
-  for (std::thread& thread : threads) {
-    thread.join();
-  }
-  EXPECT_TRUE(isRight[0] && isRight[1] && isRight[2] && isRight[3]);
+  bool isRight[2] = {true, true};
+  std::thread other(readAll, std::ref(isRight[0]));
+  readAll(isRight[1]);
+  other.join();
+  EXPECT_TRUE(isRight[0] && isRight[1]);
 }
 
 }  // namespace

@@ -20,22 +20,39 @@ inline std::string resultOf(Bytes bytes, std::string const& extension) {
   return result;
 }
 
-/// A well-made file with one edit, and its result.
+/// A result, and edits of a well-made file of which each leads to it.
 struct EditRow {
-  Edit edit;
   std::string result;
+  std::vector<Edit> edits;
 };
 
-/// Reads each row in both byte orders.
+/// Reads each in both byte orders.
 inline void check(std::string const& extension, Directory (*wellMade)(),
                   std::vector<EditRow> const& rows,
                   std::function<Bytes(ByteOrder, Directory const&)> const& layOut = tiff) {
-  for (ByteOrder const order : kOrders) {
-    for (EditRow const& row : rows) {
-      Directory directory = wellMade();
-      row.edit(directory);
-      EXPECT_EQ(resultOf(layOut(order, directory), extension), row.result)
-          << "row " << &row - rows.data();
+  for (EditRow const& row : rows) {
+    for (Edit const& edit : row.edits) {
+      for (ByteOrder const order : kOrders) {
+        Directory directory = wellMade();
+        edit(directory);
+        EXPECT_EQ(resultOf(layOut(order, directory), extension), row.result)
+            << "edit " << &edit - row.edits.data();
+      }
+    }
+  }
+}
+
+/// The same for files.
+struct FileRow {
+  std::string result;
+  std::vector<Bytes> files;
+};
+inline void check(std::string const& extension, std::vector<FileRow> const& rows,
+                  Bytes const& opening = "") {
+  for (FileRow const& row : rows) {
+    for (Bytes const& file : row.files) {
+      EXPECT_EQ(resultOf(opening + file, extension), row.result)
+          << "file " << &file - row.files.data();
     }
   }
 }
