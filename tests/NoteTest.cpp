@@ -52,40 +52,35 @@ Bytes const kSOI = "\xff\xd8";
 Bytes const kCmt1 = box("CMT1", tiff(kMM, cmt1()));
 
 TEST(Notes, StateWhatIsRefusedAndWhere) {
-  Bytes const file(20, 'f');
   check({
       {"tif", "", "empty: the file is empty\n"},
       {"tif", "II*",
        "cut-short at 2: the TIFF header at 0: 2 bytes wanted at 2, but the file ends at 3\n"},
       {"tif", "PK\3\4....",
-       "other-kind at 0: the TIFF header at 0 begins with 50 4b, not with 49 49 (\"II\") or 4d 4d "
-       "(\"MM\")\n"},
-      {"dng", Bytes("MM\0+", 4) + Bytes(4, '\0'),
-       "other-kind at 0: the TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF, which is "
-       "not read\n"},
+       "other-kind at 0: the TIFF header at 0 begins with 50 4b, not with 49 49 (\"II\") or"},
+      {"dng", Bytes("MM\0+\0\0\0\0", 8),
+       "other-kind at 0: the TIFF header at 0 has magic 43, not 42; 43 marks a BigTIFF"},
       {"cr2", oneEntry(shorts(kOrientation, {1, 1})),
        "malformed-entry at 10: 0x0112 Orientation at 0xa (10) in IFD0 holds 2 SHORT values; "
-       "exactly one wanted\n"},
+       "exactly"},
       {"nrw", oneEntry(longs(kDateTime, {7})),
-       "malformed-entry at 10: 0x0132 DateTime at 0xa (10) in IFD0 holds 1 LONG value; ASCII text "
-       "wanted\n"},
+       "malformed-entry at 10: 0x0132 DateTime at 0xa (10) in IFD0 holds 1 LONG value; ASCII "
+       "text "},
       {"tif", oneEntry(claim(kWidth, kUndefined, 1, 0)),
-       "malformed-entry at 10: 0x0100 ImageWidth at 0xa (10) in IFD0 is of type UNDEFINED; one "
-       "number wanted\n"},
+       "malformed-entry at 10: 0x0100 ImageWidth at 0xa (10) in IFD0 is of type UNDEFINED; one "},
       {"tif", oneEntry(claim(kWidth, 99, 1, 0)),
-       "malformed-entry at 10: 0x0100 ImageWidth at 0xa (10) in IFD0: field type 99 is neither one "
-       "of TIFF's 12 nor 13 (IFD)\n"},
+       "malformed-entry at 10: 0x0100 ImageWidth at 0xa (10) in IFD0: field type 99 is neither "
+       "one"},
       {"tif", oneEntry(claim(kWidth, kShort, 65537, 0)),
        "limit too-many-values at 10: 0x0100 ImageWidth at 0xa (10) in IFD0: it declares 65537 "
-       "SHORT values; more than 65536 are refused\n"},
+       "SHORT"},
       {"tif", oneEntry(claim(kDateTime, kAscii, 20, 1000)),
        "cut-short at 1000: 0x0132 DateTime at 0xa (10) in IFD0: its 20 ASCII values would begin at "
        "0x3e8 (1000) and end at 0x3fc (1020), but the file ends at 0x1a (26)\n"},
       {"tif", oneEntry(longs(kWidth, {7})).substr(0, 11),
        "cut-short at 10: entry 1 of 1 of IFD0 at 8: 2 bytes wanted at 0xa (10)"},
       {"tif", oneEntry(longs(kWidth, {7})).substr(0, 20),
-       "cut-short at 18: 0x0100 ImageWidth at 0xa (10) in IFD0: 4 bytes wanted at 0x12 (18), but "
-       "the file ends at 0x14 (20)\n"},
+       "cut-short at 18: 0x0100 ImageWidth at 0xa (10) in IFD0: 4 bytes wanted at 0x12 (18), but"},
       {"tif", oneEntry(claim(kWidth, kByte, 1, 0)).substr(0, 18),
        "cut-short at 18: 0x0100 ImageWidth at 0xa (10) in IFD0: 1 byte wanted at 0x12 (18)"},
       {"tif", oneEntry(longs(kWidth, {7})).substr(0, 22),
@@ -96,8 +91,7 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
       {"jpg", kSOI + exifSegment(oneEntry(shorts(kOrientation, {1, 1}))),
        "malformed-entry at 22: 0x0112 Orientation at 0x16 (22) in IFD0 of the Exif segment"},
       {"jpg", kSOI + exifSegment(oneEntry(claim(kOrientation, kShort, 5, 1000))),
-       "cut-short at 1012: 0x0112 Orientation at 0x16 (22) in IFD0 of the Exif segment: its 5 "
-       "SHORT values would begin at 0x3f4 (1012)"},
+       "cut-short at 1012: 0x0112 Orientation at 0x16 (22) in IFD0 of the Exif segment: its 5 "},
       {"jpg", kSOI + exifSegment(oneEntry(claim(kExif, kLong, 1, 5000))),
        "cut-short at 5012: the entry count of the Exif IFD at 0x1394 (5012): 2 bytes wanted at"},
       {"nef", tiff(kII, {{longs(kWidth, {160}), longs(kLength, {106})}}),
@@ -106,19 +100,18 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
       {"nef", nefWith(longs(kSubIFDs, {5000, 6000})),
        "cut-short at 6000: the entry count of SubIFD 2 of 2 at 0x1770 (6000): 2 bytes wanted"},
       {"raf", "FUJIFILN" + Bytes(200, '\0'),
-       "other-kind at 0: the file begins with 46 55 4a 49 46 49 4c 4e, not with \"FUJIFILM\"\n"},
+       "other-kind at 0: the file begins with 46 55 4a 49 46 49 4c 4e, not with"},
       {"raf", "FUJIFILM" + Bytes(76, '\0'),
-       "cut-short at 84: the offset of the embedded JPEG: 4 bytes wanted at 0x54 (84), but the "
-       "file ends at 0x54"},
+       "cut-short at 84: the offset of the embedded JPEG: 4 bytes wanted at 0x54 (84)"},
       {"cr3", box("ftyp", "crx ") + Bytes("\0\0\0\7m\1ov", 8),
-       "malformed-box at 12: the m\\x01ov box at 0xc (12) before a moov box was met has size 7; at "
-       "least its header's 8 bytes are wanted\n"},
+       "malformed-box at 12: the m\\x01ov box at 0xc (12) before a moov box was met has size 7; "
+       "at"},
       {"cr3", box("moov", uuidBox(box("CMT3", ""))),
        "missing-part at 8: the metadata uuid box at 8 has neither a CMT1 nor a CMT2 box\n"},
       {"cr3", box("moov", uuidBox(kCmt1) + uuidBox("", Bytes(16, 'f'))),
        "missing-part at " + std::to_string(8 + uuidBox(kCmt1).size()) +
-           ": the last uuid box of the moov box at 0, the uuid box at "},
-      {"cr3", Bytes("II*\0", 4) + file,
+           ": the last uuid box of the"},
+      {"cr3", Bytes("II*\0", 4) + Bytes(20, 'f'),
        "other-kind at 24: the header of the next box"},  // of what is not a CR3 file
       {"png", "x",
        "unknown-extension: the extension \"png\" names no format; these do: tiff tif dng nef cr2 "
@@ -129,11 +122,10 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
 }
 
 TEST(Notes, TellWhyAFieldIsAbsent) {
-  Directory const smallExif = {{longs(kWidth, {400}), longs(kLength, {300})}};
-  Directory const hugeExif = {{longs(kWidth, {0xfffffff0}), longs(kLength, {600})}};
   auto const jpegWith = [](Directory const& exif) {
     return kSOI + exifSegment(tiff(kII, {{pointer(kExif, {exif})}}));
   };
+  std::string const noFrame = "no baseline frame (SOF0) was met; the Exif IFD at 0x26 (38) ";
   Bytes const zeroAperture = cr3File(uuidBox(box("CMT2", oneEntry(ratio(kAperture, 0, 0)))));
   Bytes const oneSubIFD = nefWith(longs(kSubIFDs, {8}));
   check({
@@ -150,18 +142,15 @@ TEST(Notes, TellWhyAFieldIsAbsent) {
       {"nef", oneSubIFD, "dateTime not-in-format: never taken from NEF files\n"},
       {"jpg", kSOI + sof0(0, 0),
        "width not-in-file: the SOF0 segment at 2 declares 0 x 0; no Exif IFD gives a size\n"},
-      {"jpg", jpegWith(smallExif),
-       "height not-in-file: no baseline frame (SOF0) was met; the Exif IFD at 0x26 (38) declares "
-       "400 x 300; only more than 500 a side counts, and less than 2^31\n"},
-      {"jpg", jpegWith(hugeExif),
-       "height not-in-file: no baseline frame (SOF0) was met; the Exif IFD at 0x26 (38) declares "
-       "4294967280 x 600;"},
+      {"jpg", jpegWith({{longs(kWidth, {400}), longs(kLength, {300})}}),
+       "height not-in-file: " + noFrame + "declares 400 x 300; only more than 500 a side counts"},
+      {"jpg", jpegWith({{longs(kWidth, {0xfffffff0}), longs(kLength, {600})}}),
+       "height not-in-file: " + noFrame + "declares 4294967280 x 600;"},
       {"jpg", jpegWith({{longs(kWidth, {600})}}),
-       "width not-in-file: no baseline frame (SOF0) was met; the Exif IFD at 0x26 (38) does not "
-       "give both sides\n"},
+       "width not-in-file: " + noFrame + "does not give both sides\n"},
       {"jpg", kSOI + sof0(), "orientation not-in-file: no Exif segment (APP1) was met\n"},
       {"jpg", kSOI + sof0() + segment(0xffe1, "http"),
-       "orientation not-in-file: no Exif segment among those up to SOF0 and an APP1, where"},
+       "orientation not-in-file: no Exif segment among those up to SOF0 and an APP1"},
       {"cr3", cr3File(uuidBox(kCmt1)), "fNumber not-in-file: no CMT2 box in the metadata uuid"},
       {"cr3", zeroAperture, "apertureValue no-value: 0x9202 ApertureValue at "},
       {"cr3", zeroAperture, "apexFNumber no-value: 0x9202 ApertureValue at "},
@@ -169,19 +158,16 @@ TEST(Notes, TellWhyAFieldIsAbsent) {
 }
 
 TEST(Notes, HintAtWhatExplainsTheOutcome) {
-  Bytes const heic = box("ftyp", Bytes("he\x1b") + "c");
   check({
-      {"jpg", heic,
-       "hint other-content at 0: The file looks like an ISO base media file of brand "
-       "\"he\\x1bc\"; its extension has it read as JPEG\n"},
+      {"jpg", box("ftyp", Bytes("he\x1b") + "c"),
+       "hint other-content at 0: The file looks like an ISO base media file of brand \"he\\x1bc\"; "
+       "its"},
       {"nef", "\x89PNG....",
        "hint other-content at 0: The file looks like a PNG file; its extension has it read as "},
       {"jpg", kSOI + segment(0xffc2, Bytes(9, '\0')),
-       "hint not-baseline at 2: The frame at 2 is progressive (SOF2); only a baseline frame (SOF0) "
-       "gives a size\n"},
+       "hint not-baseline at 2: The frame at 2 is progressive (SOF2);"},
       {"jpg", kSOI + segment(0xffda, "ab") + segment(0xffc2, "cd"),
-       "hint picture-data at 2: Before the scan at 2 no SOF0 or APP1 was met; the walk goes on "
-       "through picture data, taken as segments\n"},
+       "hint picture-data at 2: Before the scan at 2 no SOF0 or APP1 was met; the walk goes on"},
       {"jpg", kSOI + segment(0xffc2, "ab") + segment(0xffda, "cd") + "\xff\xe2\1",
        "hint not-baseline at 2: The frame at 2 is progressive"},  // though it is refused
       {"jpg", kSOI + sof0() + segment(0xffda, "cd") + segment(0xffe1, "http"),

@@ -49,7 +49,6 @@ TEST(Reader, TakesTheExtensionAsItIsWritten) {
 /// A host's record, which keeps the first character of the Exif directory's date.
 template <class Format>
 struct Keeper : Format {
-  explicit Keeper(Format const& record) : Format(record) {}
   bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override {
     kept = ifd->entryForTag(kDateTimeOriginal)->values->front();
     return Format::storeInfoFromExifIFD(ifd);
@@ -61,17 +60,12 @@ template <class Format>
 void expectToKeep(std::string const& extension) {
   SCOPED_TRACE(extension);
   for (Fixture const& fixture : fixtures()) {
-    if (fixture.extension != extension) {
-      continue;
-    }
-    Bytes bytes = fixture.bytes(kII);
-    auto const readBefore = QVReader(dataOf(bytes), bytes.size(), extension).metadata;
-    for (Format const& base : {Format(), dynamic_cast<Format&>(*readBefore)}) {
-      Keeper<Format> record(base);
-      auto stream = streamOf(bytes);
+    Keeper<Format> record;
+    auto stream = streamOf(fixture.bytes(kII));
+    if (fixture.extension == extension) {
       ASSERT_TRUE(record.read(stream));
       ASSERT_EQ(record.kept.use_count(), 1);
-      EXPECT_EQ(record.kept->charValue(), record.dateTimeOriginal.front());
+      EXPECT_EQ(record.kept->charValue(), '2');
     }
   }
 }
