@@ -4,6 +4,11 @@ target_compile_options(quavel_settings INTERFACE
   -Wall -Wextra -Wpedantic -Wconversion -Wshadow
   $<$<BOOL:${QUAVEL_WERROR}>:-Werror>)
 
+# Files above 2 GB, and such sizes, are out of reach of 32-bit systems unless they are asked for.
+if(CMAKE_SIZEOF_VOID_P EQUAL 4)
+  target_compile_definitions(quavel_settings INTERFACE _FILE_OFFSET_BITS=64)
+endif()
+
 if(QUAVEL_SANITIZE)
   list(JOIN QUAVEL_SANITIZE "," sanitizers)
   target_compile_options(quavel_settings INTERFACE

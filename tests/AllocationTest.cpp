@@ -18,7 +18,8 @@ std::size_t peak = 0;           // bytes
 
 }  // namespace
 
-void* operator new(std::size_t size) {
+// Inlined, they would look to the compiler like malloc and free that do not belong together.
+[[gnu::noinline]] void* operator new(std::size_t size) {
   if (allocationsLeft == 0) {
     throw std::bad_alloc();
   }
@@ -32,7 +33,7 @@ void* operator new(std::size_t size) {
   return memory;
 }
 
-void operator delete(void* memory) noexcept {
+[[gnu::noinline]] void operator delete(void* memory) noexcept {
   live -= memory == nullptr ? 0 : ::malloc_usable_size(memory);
   std::free(memory);
 }

@@ -49,20 +49,6 @@ TEST(Cr3Box, RefusesASizeThatDoesNotCoverTheHeader) {
                QVCR3CMT1Box().read(cut));
 }
 
-TEST(Cr3Box, IsSteppedOverWhateverItsSize) {
-  if (sizeof(long) == 4) {
-    GTEST_SKIP() << "offsets have 32 bits";
-  }
-  for (std::uint32_t const size : {0x7fffffffU, 0x80000000U, 0xffffffffU}) {
-    auto const file = std::make_shared<TestStream>(u32(kMM, size) + "mdat");
-    long target = 0;
-    file->onSeek = [&](long offset) { return target = offset, false; };
-    std::shared_ptr<QVStream> stream = file;
-    EXPECT_TRUE(QVCR3Box().read(stream));
-    EXPECT_EQ(static_cast<std::int64_t>(target), std::int64_t{size});
-  }
-}
-
 TEST(Cr3MetadataBox, LeavesTheStreamAtItsEndAsItWas) {
   for (ByteOrder const order : kOrders) {
     Bytes const bytes = "before" + cmt1Box(order) + cmt2Box(order) + "after";

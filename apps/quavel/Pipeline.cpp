@@ -97,14 +97,15 @@ void Pipeline::startThread() {
 }
 
 void Pipeline::workOn(Batch& batch) {
-  long const before = countWaits();
+  bool const isTold = kTellsWaits && jobs_ > 1;
+  long const before = isTold ? countWaits() : 0;
   try {
     work_(batch);
   } catch (...) {
     batch.failure = std::current_exception();
   }
   // Cached files are read without waiting. Others wait for the disk once each, or more often.
-  if (kTellsWaits) {
+  if (isTold) {
     isWaiting_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }
 }

@@ -97,6 +97,7 @@ int Runner::runSource(Source& source) {
 
 std::unique_ptr<Batch> Runner::nextBatch(Source& source) const {
   auto batch = std::make_unique<Batch>();
+  batch->inputs.reserve(batchSize_);
   Input input;
   while (batch->inputs.size() < batchSize_ && (batch->inputs.empty() || source.isReady()) &&
          source.next(input)) {
@@ -109,10 +110,9 @@ void Runner::work(Batch& batch) const {
   auto const start = std::chrono::steady_clock::now();
   batch.outcomes.reserve(batch.inputs.size());
   for (auto& input : batch.inputs) {
-    Outcome outcome = readPhoto(std::move(input), detail_);
+    Outcome& outcome = batch.outcomes.emplace_back(readPhoto(std::move(input), detail_));
     writer_->prepareSafely(outcome);
     batch.bytes += outcome.text.size();
-    batch.outcomes.push_back(std::move(outcome));
   }
   batch.seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }

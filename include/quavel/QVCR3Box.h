@@ -3,21 +3,20 @@
 
 #include <memory>
 
+#include "quavel/QVCR3BoxHeader.h"
+#include "quavel/QVStream.h"
 #include "quavel/export.h"
 
 namespace quavel {
 
-class QVCR3BoxHeader;
-class QVStream;
-
-/// A box of an ISO base media file, stepped over; the base of those that are looked into.
+/// A box of an ISO base media file, skipped whole; the base of the boxes that are read.
 class QUAVEL_EXPORT QVCR3Box {
  public:
   virtual ~QVCR3Box();
 
   /// Reads the box whose header is at the stream's position, which must have big-endian
-  /// `byteOrder`. True: the stream stands behind the box, even where that is past the end. False:
-  /// the header cannot be read, or its size does not even cover the header.
+  /// `byteOrder`. True: the stream stands after the box, even where that is past the end. False:
+  /// the header cannot be read, or its size is smaller than the header.
   virtual bool read(std::shared_ptr<QVStream>& stream);
 
   /// The header read last; null before a `read`.

@@ -5,17 +5,16 @@
 #include <string>
 
 #include "quavel/QVCR3Box.h"
+#include "quavel/QVTiffImageFileDirectory.h"
 #include "quavel/export.h"
 
 namespace quavel {
 
-class QVTiffImageFileDirectory;
-
 /// The box whose payload is a TIFF structure with the image's main directory.
 class QUAVEL_EXPORT QVCR3CMT1Box : public QVCR3Box {
  public:
-  /// True: the stream stands behind the box, its `baseOffset` and `byteOrder` as they were. False:
-  /// another type of box, or a malformed payload, which leaves the stream as it was read.
+  /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False:
+  /// another type of box, or a malformed payload; the stream is then left within it.
   bool read(std::shared_ptr<QVStream>& stream) override;
   /// Reads the payload with the stream at its TIFF header and `baseOffset` there.
   bool readExif(std::shared_ptr<QVStream>& stream);

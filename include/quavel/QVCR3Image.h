@@ -1,14 +1,11 @@
 #ifndef QUAVEL_QVCR3IMAGE_H
 #define QUAVEL_QVCR3IMAGE_H
 
+#include "quavel/QVCR3MoovBox.h"
 #include "quavel/QVMetadata.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVCR3CMT1Box;
-class QVCR3CMT2Box;
-class QVCR3MoovBox;
 
 /// Reads a CR3 file, an ISO base media file. Gives the size, the orientation, the file's date, the
 /// camera, the lens and the exposure.

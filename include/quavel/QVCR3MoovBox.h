@@ -2,11 +2,10 @@
 #define QUAVEL_QVCR3MOOVBOX_H
 
 #include "quavel/QVCR3Box.h"
+#include "quavel/QVCR3UUIDBox.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVCR3UUIDBox;
 
 /// The `moov` box, walked for its `uuid` children.
 class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
@@ -14,7 +13,8 @@ class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
   /// False: another type of box, or a child that cannot be read.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  std::shared_ptr<QVCR3UUIDBox> uuidBox;  ///< The last `uuid` child, of any identifier; or null.
+  std::shared_ptr<QVCR3UUIDBox>
+      uuidBox;  ///< The last `uuid` child, whatever its identifier; or null.
 
  private:
   QUAVEL_NO_EXPORT bool readChildren(std::shared_ptr<QVStream>& stream, long start, long end);

@@ -5,12 +5,11 @@
 #include <cstdint>
 
 #include "quavel/QVCR3Box.h"
+#include "quavel/QVCR3CMT1Box.h"
+#include "quavel/QVCR3CMT2Box.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVCR3CMT1Box;
-class QVCR3CMT2Box;
 
 /// Identifier of the `uuid` box that holds the metadata: 85c0b687-820f-11e0-8111-f4ce462b6a48.
 inline constexpr std::array<std::uint32_t, 4> metadataUUID = {0x85c0b687, 0x820f11e0, 0x8111f4ce,
@@ -19,7 +18,7 @@ inline constexpr std::array<std::uint32_t, 4> metadataUUID = {0x85c0b687, 0x820f
 /// A `uuid` box; the one with the metadata is walked for its `CMT1` and `CMT2` children.
 class QUAVEL_EXPORT QVCR3UUIDBox : public QVCR3Box {
  public:
-  /// True for a box of another identifier too, which is stepped over. False: another type of box,
+  /// A box of another identifier is skipped, which counts as success. False: another type of box,
   /// or, in the metadata box, a child that cannot be read.
   bool read(std::shared_ptr<QVStream>& stream) override;
 

@@ -8,8 +8,8 @@
 
 namespace quavel {
 
-/// A file, read through its descriptor: one system call an operation and no buffer. A seek past
-/// the end succeeds and the reads there deliver nothing; one before the start is refused and
+/// A file, read through its descriptor: one system call for each operation, and no buffer. A seek
+/// past the end succeeds, and reads there deliver nothing; one to before the start is refused and
 /// leaves the position as it was.
 class QUAVEL_EXPORT QVFStream : public QVStream {
  public:

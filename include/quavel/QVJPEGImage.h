@@ -16,9 +16,9 @@ class Journal;
 /// size, the orientation and the original date.
 class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  public:
-  /// Running out of data between two segments is no failure: a cut file gives what came before.
+  /// Running out of data between two segments is not a failure: a cut file gives what came before.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Adds the size to the base's dates, when both sides exceed 500 pixels.
+  /// Takes the dates as the base does, and the size when both sides exceed 500 pixels.
   bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override;
 
   /// Reads the TIFF structure that begins at the stream's position, which becomes the stream's
@@ -35,7 +35,7 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
   bool readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side);
   /// @}
 
-  /// Markers without a length field: bytes from the marker's end to where the walk goes on.
+  /// Markers after which the walk goes on without reading a length: how many bytes further.
   static std::map<std::uint16_t, std::uint16_t> const markerSkipLengths;
 
  private:

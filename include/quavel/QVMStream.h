@@ -6,7 +6,7 @@
 
 namespace quavel {
 
-/// Memory of the caller's, read in place. A seek to anywhere outside ends at `length`, where the
+/// Memory that the caller owns, read in place. A seek to anywhere outside ends at `length`, where
 /// reads deliver nothing.
 class QUAVEL_EXPORT QVMStream : public QVStream {
  public:

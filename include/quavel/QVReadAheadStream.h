@@ -10,24 +10,24 @@
 
 namespace quavel {
 
-/// Another stream, read a block at a time, for a source that pays for each request: the many small
-/// reads of a reader are served from the first block, which is kept, and from the one fetched last.
-/// Ends and seeks as a file does: a seek past the end succeeds, one before the start is refused.
+/// Wraps a stream whose every request is expensive and reads it a block at a time: the many small
+/// reads of a reader are served from the first block, which is kept, and from the latest one. Ends
+/// and seeks like a file: a seek past the end succeeds, one to before the start is refused.
 class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
  public:
-  /// Position 0 is the source's offset 0. The source must be able to seek, and is used by nobody
-  /// else from then on. Its first block is `firstBlockSize` bytes long, each later one
-  /// `nextBlockSize`, or as long as the longer of the two where it goes on from the block before;
-  /// 0 is taken for 1. Needs memory for two of the longer.
+  /// Position 0 is the source's offset 0. The source must be able to seek, and nobody else may use
+  /// it from then on. The first block is `firstBlockSize` bytes long, each later one
+  /// `nextBlockSize`, or the larger of the two where it continues the block before; 0 counts as 1.
+  /// Takes memory for two blocks of the larger size.
   QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                     std::size_t nextBlockSize);
   ~QVReadAheadStream() override;
   QVReadAheadStream(QVReadAheadStream const&) = delete;
   QVReadAheadStream& operator=(QVReadAheadStream const&) = delete;
 
-  /// Fewer bytes than asked for: the source delivered no more, or could not read on. A block that
-  /// cannot be read is tried again as the bytes that are needed alone. What the source throws
-  /// passes through.
+  /// Fewer bytes than asked for: the source delivered no more, or failed. When a block cannot be
+  /// read, only the bytes that are needed are tried once more. What the source throws passes
+  /// through.
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;
   long getOffset() override;
   void setOffset(long const& offset) override;
@@ -36,7 +36,7 @@ class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
   struct Block {
     std::unique_ptr<std::uint8_t[]> bytes;  // null until it is needed
     std::int64_t start = 0;                 // absolute, as all positions here
-    std::size_t size = 0;                   // bytes that are there
+    std::size_t size = 0;                   // bytes received
   };
 
   QUAVEL_NO_EXPORT std::size_t copyFrom(Block const& block, std::uint8_t* destination,

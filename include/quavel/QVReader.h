@@ -4,11 +4,10 @@
 #include <memory>
 #include <string>
 
+#include "quavel/QVMetadata.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVMetadata;
 
 /// Reads one image file into a record. All work is done in the constructor, which throws nothing
 /// but std::bad_alloc; distinct readers may be built on distinct threads.
@@ -21,13 +20,13 @@ class QUAVEL_EXPORT QVReader {
   QVReader(unsigned char* buffer, unsigned long const& length, std::string const& extension);
   ~QVReader();
 
-  /// What follows the path's last ".", its case kept; empty when there is no ".".
+  /// What follows the path's last ".", in the case it is written in; empty without a ".".
   std::string getPathExtension(std::string const& path) const;
 
   /// A fresh record of the format that `extension` (lower case) names, or null for any other.
   std::shared_ptr<QVMetadata> createMetadata(std::string const& extension) const;
 
-  /// The record; null when the extension names no format or the data is no whole file of it.
+  /// The record; null when the extension names no format, or the data is not a whole file of it.
   std::shared_ptr<QVMetadata> metadata;
 };
 

@@ -32,16 +32,16 @@ class QUAVEL_EXPORT QVStream {
   virtual std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) = 0;
   /// The current position minus `baseOffset`.
   virtual long getOffset() = 0;
-  /// Moves to `baseOffset` plus `offset`. Reports nothing: the next read tells.
+  /// Moves to `baseOffset` plus `offset`. Reports nothing: a failure shows at the next read.
   virtual void setOffset(long const& offset) = 0;
 
-  ByteOrder hostBytesOrder() const;  ///< Worked out afresh.
+  ByteOrder hostBytesOrder() const;  ///< The machine's, whatever `hostOrder` says.
 
   /// @name Typed reads
   /// @{
 
   /// One `readBuffer` each, at the current position; numbers come in `byteOrder` and arrive in the
-  /// host's. True: all bytes were delivered. False: the destination is to be taken as unset.
+  /// host's. True: all bytes were delivered. False: the destination holds nothing of use.
   bool readChar(char* destination);
   bool readByte(unsigned char* destination);
   bool readSByte(signed char* destination);
@@ -56,7 +56,7 @@ class QUAVEL_EXPORT QVStream {
   /// @name Byte reversal in place
   /// @{
 
-  /// Always, or only on a host of the other byte order.
+  /// Always, or only on a host of the other byte order, as the name says.
   void swapS(unsigned short* value) const;
   void swapL(unsigned int* value) const;
   void swapLL(unsigned long long* value) const;
@@ -69,7 +69,7 @@ class QUAVEL_EXPORT QVStream {
   /// @}
 
   ByteOrder hostOrder;          ///< Of the machine the library runs on.
-  ByteOrder byteOrder;          ///< Of the data now being read; any other value: never reversed.
+  ByteOrder byteOrder;          ///< Of the data being read; any other value: never reversed.
   std::int64_t baseOffset = 0;  ///< Absolute position, in bytes, that offset 0 stands for.
 
  private:

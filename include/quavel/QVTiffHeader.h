@@ -4,11 +4,10 @@
 #include <cstdint>
 #include <memory>
 
+#include "quavel/QVStream.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVStream;
 
 /// The 8 bytes that open every TIFF structure (TIFF 6.0). Decides the byte order of all later
 /// reads.
@@ -16,8 +15,8 @@ class QUAVEL_EXPORT QVTiffHeader {
  public:
   QVTiffHeader();
 
-  /// Reads at the stream's position. True: the stream stands just behind the header and its
-  /// `byteOrder` is set. False: it may stand inside, and `byteOrder` may already have changed.
+  /// Reads at the stream's position. True: the stream stands right after the header and its
+  /// `byteOrder` is set. False: it may stand within it, and `byteOrder` may already have changed.
   bool read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic);
 
   std::uint32_t firstIFDOffset = 0;  ///< Counted from the header's first byte.

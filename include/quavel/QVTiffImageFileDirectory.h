@@ -6,12 +6,11 @@
 #include <memory>
 #include <vector>
 
+#include "quavel/QVStream.h"
+#include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVStream;
-class QVTiffImageFileDirectoryEntry;
 
 namespace detail {
 class ReaderDirectory;
@@ -22,11 +21,11 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
  public:
   QVTiffImageFileDirectory();
 
-  /// Reads the directory at the stream's position, parsing the listed tags alone and only until
-  /// each was met once; an empty list wants every entry. Of a repeated tag the first entry counts.
-  /// False: the entry count, a tag, a wanted entry or the next directory's offset cannot be read;
-  /// only in the last case are the new `entries` kept. False too: the entries parsed hold more than
-  /// 1048576 values, which the tags of no reader can.
+  /// Reads the directory at the stream's position, parsing only the listed tags, and only until
+  /// each has been met once; an empty list wants every entry. Of a repeated tag the first entry
+  /// counts. False: the entry count, a tag, a wanted entry or the next directory's offset cannot be
+  /// read; only in the last case are the new `entries` kept. False too: the entries parsed hold
+  /// more than 1048576 values, which the tags of no reader can.
   bool read(std::shared_ptr<QVStream>& stream, std::vector<unsigned short> const& tags);
 
   /// The entry kept for `tag`, or null.
@@ -39,8 +38,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
  private:
   friend class detail::ReaderDirectory;
 
-  detail::ReaderDirectory const* ofReader =
-      nullptr;  // this object, if a reader reads it for itself
+  detail::ReaderDirectory const* ofReader = nullptr;  // this object, when it is one
 };
 
 }  // namespace quavel

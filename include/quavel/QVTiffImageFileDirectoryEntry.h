@@ -6,32 +6,34 @@
 #include <string>
 #include <vector>
 
+#include "quavel/QVStream.h"
+#include "quavel/QVTiffImageFileDirectoryEntryValue.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVStream;
-class QVTiffImageFileDirectoryEntryValue;
 
 /// One entry of a TIFF image file directory, without its tag, which the directory keeps.
 class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
  public:
   QVTiffImageFileDirectoryEntry();
 
-  /// Reads the entry with the stream just behind its tag, wherever its values are. The stream is
-  /// left where the last value ended. False: the data ended, the field type is unknown, or more
-  /// than 65536 values are declared; `values` is then unchanged.
+  /// Reads the entry with the stream right after its tag, wherever its values lie. The stream is
+  /// left where the last value ends. False: the data ends too early, the field type is unknown, or
+  /// more than 65536 values are declared; `values` is then unchanged.
   bool read(std::shared_ptr<QVStream>& stream);
 
-  /// The ASCII values up to the first NUL, untrimmed. False: a value of another type was met;
-  /// `out` holds the text before it. An entry without values gives the empty string and true.
+  /// The ASCII values up to the first NUL, untrimmed. False: a value of another type is
+  /// among them; `out` holds the text before it. An entry without values gives the empty string and
+  /// true.
   bool convertToString(std::string& out) const;
 
   /// All values in file order; null for an UNDEFINED entry and before a `read`.
   std::shared_ptr<std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>> values;
-  std::shared_ptr<std::vector<std::uint8_t>> bytes;  ///< UNDEFINED of up to 4 bytes; else null.
-  std::uint32_t dataOffset = 0;  ///< UNDEFINED of more: where, from the TIFF header; else 0.
-  std::uint32_t dataCount = 0;   ///< UNDEFINED of more: how many bytes; else 0.
+  std::shared_ptr<std::vector<std::uint8_t>>
+      bytes;  ///< Of an UNDEFINED entry of up to 4 bytes; else null.
+  /// Where the bytes of a longer UNDEFINED entry lie, counted from the TIFF header; else 0.
+  std::uint32_t dataOffset = 0;
+  std::uint32_t dataCount = 0;  ///< How many bytes a longer UNDEFINED entry has; else 0.
 };
 
 }  // namespace quavel

@@ -5,11 +5,10 @@
 #include <cstdint>
 #include <memory>
 
+#include "quavel/QVStream.h"
 #include "quavel/export.h"
 
 namespace quavel {
-
-class QVStream;
 
 /// The TIFF 6.0 field types: a type's code in the file, less one.
 enum class EntryValueType : std::uint8_t {
@@ -59,7 +58,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// False: the data ended, or the type holds no values; `value` is then to be taken as unset.
   bool read(std::shared_ptr<QVStream>& stream);
 
-  /// Bytes that one value takes in a file; 0 for UNDEFINED and for what is no type.
+  /// Bytes that one value takes in a file; 0 for UNDEFINED and for an unknown type.
   static unsigned int sizeOfValueOfType(EntryValueType const& type);
 
   /// @name As an integer
@@ -88,14 +87,14 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @name As stored
   /// @{
 
-  /// The pair of a RATIONAL, respectively SRATIONAL; any other type gives 0/0.
+  /// The pair of a RATIONAL and of an SRATIONAL; any other type gives 0/0.
   Rational rationalValue() const;
   SRational sRationalValue() const;
   /// @}
 
   EntryValueType type = EntryValueType::UNDEFINED;  ///< Of the value held or to be read.
-  std::uint8_t value[8] =
-      {};  ///< In host byte order, left-justified; a fraction's numerator first.
+  /// In host byte order, left-justified; a fraction's numerator first.
+  std::uint8_t value[8] = {};
 };
 
 }  // namespace quavel

@@ -3,18 +3,20 @@
 #include "formats/BoxTypes.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVStream.h"
+#include "stream/Bytes.h"
 
 namespace quavel::detail {
 
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
-  long const start = stream->getOffset();
+  std::int64_t const start = stream->getOffset();
   std::int64_t const position = stream->baseOffset + start;
+  static constexpr char kHeaderPattern[] = "the header of the next box{}";
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
   if (!header.read(stream)) {
-    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", place);
+    return refuseCut(journal, position, box::kHeaderSize, kHeaderPattern, place);
   }
   // A smaller one, 0 above all, would lead a walk back to where it has been. That leaves out the
   // standard's sizes 0 (to the end of the file) and 1 (64 bits), which precede no metadata.
@@ -27,8 +29,8 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
                   : header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)"
                                         : "");
   }
-  stream->setOffset(start + long{header.boxSize});
-  return true;
+  return seek(*stream, start + header.boxSize) ||
+         refuseCut(journal, position + header.boxSize, box::kHeaderSize, kHeaderPattern, place);
 }
 
 void append(std::string& out, PlacedBox box) {

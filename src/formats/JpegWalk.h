@@ -13,6 +13,7 @@ struct QVJPEGImage::Walk {
   bool sawExif = false;
   unsigned short frameWidth = 0;
   unsigned short frameHeight = 0;
+  std::int64_t next = 0;   ///< Offset of the segment after the one being read.
   std::int64_t start = 0;  ///< Of the segment being read.
   std::int64_t frame = -1;
   std::int64_t otherFrame = -1;  ///< A progressive one.

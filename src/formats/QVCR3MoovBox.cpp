@@ -16,13 +16,13 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   if (!QVCR3Box::read(stream)) {
     return false;
   }
-  stream->setOffset(start + long{box::kHeaderSize});
+  stream->setOffset(start + static_cast<long>(box::kHeaderSize));
   PlacedBox const moov = {boxHeader->type(), stream->baseOffset + start};
   if (moov.type != box::Moov) {
     return refuse(journalOf(*stream), QVReason::OtherKind, moov.position,
                   "the {} is not a moov box", moov);
   }
-  long const end = start + long{boxHeader->size()};
+  long const end = start + static_cast<long>(boxHeader->size());  // sought above
 
   bool const isRead = readChildren(stream, start, end);
   stream->setOffset(end);

@@ -35,9 +35,9 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   if (uuid.type != box::Uuid) {
     return refuse(journal, QVReason::OtherKind, uuid.position, "the {} is not a uuid box", uuid);
   }
-  long const end = start + long{boxHeader->size()};
+  long const end = start + static_cast<long>(boxHeader->size());  // sought above
 
-  stream->setOffset(start + long{box::kHeaderSize});
+  stream->setOffset(start + static_cast<long>(box::kHeaderSize));
   for (auto& word : userType) {
     if (!stream->readLong(&word)) {
       return refuseCut(journal, uuid.position + box::kHeaderSize, sizeof(userType),

@@ -24,7 +24,7 @@ constexpr unsigned short kSOS = 0xffda;
 constexpr unsigned short kAPP1 = 0xffe1;
 
 // A segment's length counts its own two bytes but not the marker's.
-constexpr long kLengthSize = 2;
+constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
 // Below it, the Exif size is taken for that of a thumbnail.
@@ -46,6 +46,12 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd7, 2},  // RST7
     {0xffd9, 2},  // EOI
 }};
+
+/// Moves to the next segment. False: it is out of reach.
+bool seekNext(QVStream& stream, std::int64_t offset) {
+  return seek(stream, offset) || refuseCut(journalOf(stream), stream.baseOffset + offset,
+                                           sizeof(kSOI), "the marker of the next segment");
+}
 
 }  // namespace
 
@@ -77,7 +83,8 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
       noteEnd(journal, walk.start);
       break;
     }
-    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk)) {
+    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk) ||
+        !seekNext(*stream, walk.next)) {
       noteHints(journal, walk);
       return false;
     }
@@ -93,7 +100,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
                               Walk& walk) {
   for (auto const& [skippedMarker, skip] : kFixedSkips) {
     if (marker == skippedMarker) {
-      stream->setOffset(stream->getOffset() + skip);
+      walk.next = std::int64_t{stream->getOffset()} + skip;
       return true;
     }
   }
@@ -103,7 +110,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
     return refuseCut(journalOf(*stream), walk.start + std::int64_t{sizeof(marker)}, sizeof(length),
                      "the length of the segment {} at {}", HexCode{marker}, Offset{walk.start});
   }
-  long const segmentEnd = stream->getOffset() + length - kLengthSize;
+  walk.next = std::int64_t{stream->getOffset()} + length - kLengthSize;
   if (marker == kAPP1 && !readAPP1(stream, walk)) {
     return false;
   }
@@ -118,7 +125,6 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   if (marker == kSOF2 && walk.scan < 0) {
     walk.otherFrame = walk.start;
   }
-  stream->setOffset(segmentEnd);
   return true;
 }
 

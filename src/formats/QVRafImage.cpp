@@ -44,10 +44,9 @@ bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
 /// Tells what the embedded image begins with when that explains why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
-  if (!wantsAll(journal)) {
+  if (!wantsAll(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
     return;
   }
-  stream.setOffset(static_cast<long>(imageOffset - stream.baseOffset));
   std::array<std::uint8_t, kTiffHeaderInImage> opening = {};
   std::size_t const received = readUpTo(stream, opening.data(), opening.size());
   if (received != 0 && !opensWithExif(opening)) {

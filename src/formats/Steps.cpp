@@ -64,9 +64,8 @@ bool storeText(Directory const& directory, unsigned short tag, std::string& fiel
 
 Directory readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
                           std::uint32_t offset, Tags tags) {
-  stream->setOffset(offset);
   auto directory = std::make_shared<ReaderDirectory>(name, stream->baseOffset + offset);
-  if (!directory->table.readWithNext(*stream, tags, &directory->nextIFDOffset)) {
+  if (!directory->table.readWithNext(*stream, offset, tags, &directory->nextIFDOffset)) {
     return nullptr;
   }
   return directory;

@@ -107,7 +107,9 @@ constexpr Signature kSignatures[] = {
 
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start,
                       Journal& journal) {
-  stream.setOffset(static_cast<long>(start - stream.baseOffset));
+  if (!seek(stream, start - stream.baseOffset)) {
+    return;
+  }
   std::array<std::uint8_t, kOpeningSize> opening;
   std::size_t const size = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
@@ -131,8 +133,11 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
 }
 
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
+  if (!journal.wantsAll()) {
+    return;
+  }
   for (auto const& row : kFields) {
-    if (journal.wantsAll() && isAbsent(row, record)) {
+    if (isAbsent(row, record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

@@ -38,7 +38,10 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
                                             std::string const& extension) {
   detail::Journal journal = begin();
   journal.knownSize = static_cast<std::int64_t>(length);
-  auto memory = std::make_shared<QVMStream>(buffer, length);
+  auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
+  if (sizeof(unsigned long) < sizeof(length)) {
+    memory->length = length;
+  }
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));
 }
 

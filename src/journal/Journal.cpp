@@ -1,12 +1,11 @@
 #include "journal/Journal.h"
 
-#include <sys/stat.h>
-
 #include <algorithm>
 #include <system_error>
 #include <utility>
 
 #include "journal/Reading.h"
+#include "system/File.h"
 
 namespace quavel::detail {
 
@@ -49,9 +48,8 @@ void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* p
 }
 
 std::int64_t Journal::dataSize() {
-  struct stat status = {};
-  if (knownSize < 0 && fd != -1 && ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode)) {
-    knownSize = status.st_size;
+  if (knownSize < 0 && fd != -1) {
+    knownSize = file::size(fd);
   }
   return knownSize;
 }

@@ -73,9 +73,11 @@ void append(std::string& out, QuotedBytes bytes) {
 
 std::string composed(char const* pattern, std::initializer_list<Word> words) {
   std::string text;
+  text.reserve(kMaxTextLength / 4);
   auto const* word = words.begin();
   std::string_view rest = pattern;
-  for (auto at = rest.find("{}"); at != rest.npos && word != words.end(); at = rest.find("{}")) {
+  // A pattern has no other braces.
+  for (auto at = rest.find('{'); at != rest.npos && word != words.end(); at = rest.find('{')) {
     text += rest.substr(0, at);
     word->appendTo(text);
     ++word;

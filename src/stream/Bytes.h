@@ -3,7 +3,9 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstdlib>
 #include <cstring>
+#include <limits>
 #include <type_traits>
 
 #include "journal/Reading.h"
@@ -18,9 +20,15 @@ inline bool isReversed(QVStream const& stream) {
   return isKnown && stream.byteOrder != stream.hostOrder;
 }
 
+#ifdef _MSC_VER
+inline std::uint16_t reversed(std::uint16_t bits) { return _byteswap_ushort(bits); }
+inline std::uint32_t reversed(std::uint32_t bits) { return _byteswap_ulong(bits); }
+inline std::uint64_t reversed(std::uint64_t bits) { return _byteswap_uint64(bits); }
+#else
 inline std::uint16_t reversed(std::uint16_t bits) { return __builtin_bswap16(bits); }
 inline std::uint32_t reversed(std::uint32_t bits) { return __builtin_bswap32(bits); }
 inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bits); }
+#endif
 
 /// Reverses a number by the unsigned integer as wide as it, without a look at what its bytes mean.
 template <class Number>
@@ -59,6 +67,22 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
     default:
       std::memcpy(destination, source, count);
   }
+}
+
+// Beyond the last offset to be sought, enough can be read that `long` still counts: more than the
+// entries of a directory take.
+inline constexpr long kReadBeyond = 1L << 20U;
+
+/// Moves the stream to an offset. False: `long`, which has 32 bits on some systems, cannot hold it.
+/// The stream would stay where it is, and what it reads there is not what was wanted.
+inline bool seek(QVStream& stream, std::int64_t offset) {
+  using Limits = std::numeric_limits<long>;
+  if (sizeof(long) < sizeof(offset) &&
+      (offset < Limits::min() || offset > Limits::max() - kReadBeyond)) {
+    return false;
+  }
+  stream.setOffset(static_cast<long>(offset));
+  return true;
 }
 
 /// Reads in one piece. False: the stream delivers another number of bytes than asked for.

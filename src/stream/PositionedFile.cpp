@@ -1,11 +1,7 @@
 #include "stream/PositionedFile.h"
 
-#include <fcntl.h>
-#include <unistd.h>
-
-#include <cerrno>
-
 #include "quavel/QVReadAheadStream.h"
+#include "system/File.h"
 
 namespace quavel::detail {
 
@@ -13,7 +9,7 @@ namespace {
 
 // Photos take one to four reads, those that are walked through their image data dozens.
 constexpr int kReadsOfAWalk = 16;
-constexpr off_t kForeseen = off_t{4} << 20;
+constexpr std::int64_t kForeseen = std::int64_t{4} << 20;
 
 // The metadata of most files lies in the first block. What lies beyond is a directory here and a
 // segment there. docs/speed.md tells how both sizes were measured.
@@ -35,17 +31,14 @@ struct ReadAheadFile {
 PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 void PositionedFile::advise() {
-#ifdef POSIX_FADV_RANDOM
   ++reads_;
-  // Left to itself, a system fetches several times what is asked for at a file's start. One that
-  // takes no advice does so still.
+  // Left to itself, a system fetches several times what is asked for at a file's start.
   if (reads_ == 1) {
-    ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM);
+    file::expectFewReads(fd);
   }
   if (reads_ == kReadsOfAWalk) {
-    ::posix_fadvise(fd, static_cast<off_t>(position_), kForeseen, POSIX_FADV_WILLNEED);
+    file::expectReads(fd, position_, kForeseen);
   }
-#endif
 }
 
 std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t count) {
@@ -53,10 +46,7 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   advise();
-  ssize_t delivered = ::pread(fd, destination, count, static_cast<off_t>(position_));
-  if (delivered == -1 && errno == ESPIPE) {
-    delivered = ::read(fd, destination, count);
-  }
+  std::int64_t const delivered = file::readAt(fd, destination, count, position_);
   position_ += delivered > 0 ? delivered : 0;
   return delivered;
 }
@@ -69,9 +59,8 @@ long PositionedFile::getOffset() {
 void PositionedFile::setOffset(long const& offset) {
   auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
                                                 static_cast<std::uint64_t>(offset));
-  bool const isAccepted = target <= kSurelyAccepted
-                              ? target >= 0
-                              : ::lseek(fd, static_cast<off_t>(target), SEEK_SET) == target;
+  bool const isAccepted =
+      target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
   if (isAccepted) {
     position_ = target;
   }

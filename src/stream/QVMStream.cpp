@@ -10,7 +10,7 @@ QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
     : buffer(bytes), length(count) {}
 
 std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
-  std::size_t const delivered = std::min<std::size_t>(count, length - offset);
+  auto const delivered = static_cast<std::size_t>(std::min<std::uint64_t>(count, length - offset));
   if (delivered == 0) {
     return 0;
   }

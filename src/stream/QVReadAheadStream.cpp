@@ -11,6 +11,21 @@
 
 namespace quavel {
 
+namespace {
+
+/// Moves to where `long` does not reach, by the base. Returns the position, or -1 when refused.
+std::int64_t seekByBase(QVStream& source, std::int64_t target) {
+  std::int64_t const base = source.baseOffset;
+  source.baseOffset = static_cast<std::int64_t>(static_cast<std::uint64_t>(base) +
+                                                static_cast<std::uint64_t>(target));
+  source.setOffset(0);
+  bool const isAccepted = source.getOffset() == 0;
+  source.baseOffset = base;
+  return isAccepted ? target : -1;
+}
+
+}  // namespace
+
 QVReadAheadStream::QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                                      std::size_t nextBlockSize)
     : source_(std::move(source)),
@@ -48,8 +63,12 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  source_->setOffset(static_cast<long>(target));
-  sourcePosition_ = source_->getOffset();
+  if (target != static_cast<long>(target)) {
+    sourcePosition_ = seekByBase(*source_, target);
+  } else {
+    source_->setOffset(static_cast<long>(target));
+    sourcePosition_ = source_->getOffset();
+  }
   return sourcePosition_ == target;
 }
 
@@ -64,7 +83,7 @@ std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destin
   if (position_ < block.start || skipped >= block.size) {
     return 0;
   }
-  std::size_t const copied = std::min(count, block.size - skipped);
+  std::size_t const copied = std::min(count, block.size - static_cast<std::size_t>(skipped));
   detail::copyBytes(destination, block.bytes.get() + skipped, copied);
   position_ += static_cast<std::int64_t>(copied);
   return copied;
@@ -99,7 +118,13 @@ void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t need
 
 std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
   if (std::exchange(sourcePosition_, -1) != position_) {
-    source_->setOffset(static_cast<long>(position_));
+    if (position_ == static_cast<long>(position_)) {
+      source_->setOffset(static_cast<long>(position_));
+    } else if (!sourceAccepts(position_)) {
+      return -1;
+    } else {
+      sourcePosition_ = -1;  // unless the read succeeds
+    }
   }
   std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
   // A count beyond what was asked for is not one; nor is a position beyond the last there can be.

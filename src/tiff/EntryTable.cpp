@@ -20,14 +20,18 @@ constexpr std::size_t kFirstCapacity = 112;
 // An entry count is only a claim.
 constexpr std::size_t kMaxReservedRows = 256;
 
+bool refuseCount(Journal* journal, EntryTable const& table) {
+  return refuseCut(journal, table.position(), kEntryCountSize, "the entry count of {}",
+                   PlacedDirectory{&table});
+}
+
 }  // namespace
 
 bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   Reading& reading = readingOf(stream);
   journal_ = reading.journal;
   if (!stream.readShort(&entryCount_)) {
-    return refuseCut(journal_, position_, kEntryCountSize, "the entry count of {}",
-                     PlacedDirectory{this});
+    return refuseCount(journal_, *this);
   }
   if (!reading.spend(Work::Directories, 1)) {
     return false;
@@ -46,9 +50,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
-    stream.setOffset(walk.nextOffset());
     RawEntry entry;
-    if (!walk.readRest(&entry)) {
+    if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
                        PlacedEntry{*this, Row{tag, 0, 0, walk.position(), 0, 0}});
@@ -59,8 +62,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   }
 
   // The entries may have left the stream anywhere.
-  stream.setOffset(walk.end());
-  return reading.spend(Work::Entries, walk.number() - 1);
+  return seek(stream, walk.end()) && reading.spend(Work::Entries, walk.number() - 1);
 }
 
 bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
@@ -81,7 +83,11 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
   return true;
 }
 
-bool EntryTable::readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIFDOffset) {
+bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, Tags tags,
+                              std::uint32_t* nextIFDOffset) {
+  if (!seek(stream, offset)) {
+    return refuseCount(readingOf(stream).journal, *this);
+  }
   WantedTags wanted(tags.begin(), tags.size());
   if (!read(stream, wanted)) {
     return false;

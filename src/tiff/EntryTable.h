@@ -45,8 +45,9 @@ class EntryTable {
   /// count, a tag or a wanted entry cannot be read, or the read has done too much work.
   bool read(QVStream& stream, WantedTags& wanted);
 
-  /// The same, then the next directory's offset. False too: that cannot be read.
-  bool readWithNext(QVStream& stream, Tags tags, std::uint32_t* nextIFDOffset);
+  /// The same at an offset, then the next directory's offset. False too: that cannot be read.
+  bool readWithNext(QVStream& stream, std::uint32_t offset, Tags tags,
+                    std::uint32_t* nextIFDOffset);
 
   /// The first row with the tag, or null.
   Row const* find(unsigned short tag) const {

@@ -52,13 +52,13 @@ class EntryWalk {
   }
 
   /// Where the next entry begins, and where the last one ends.
-  long nextOffset() const { return offset() + kStep; }
-  long end() const { return offset() + kStep * left_; }
+  std::int64_t nextOffset() const { return offset() + kStep; }
+  std::int64_t end() const { return offset() + kStep * left_; }
 
  private:
-  static constexpr long kStep = kEntrySize;
+  static constexpr std::int64_t kStep = kEntrySize;
 
-  long offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
+  std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
   /// Whether the buffer holds the first `size` bytes of the current entry.
   bool isBuffered(std::size_t size) const {
@@ -73,16 +73,16 @@ class EntryWalk {
   /// Buffers the current entry and those after it. False: its tag is not in the data.
   bool fillBuffer() {
     bufferOffset_ = offset();
-    stream_.setOffset(bufferOffset_);
     entry_ = buffer_.data();
     std::size_t const size = std::min(kEntrySize * left_, buffer_.size());
-    bufferEnd_ = entry_ + readUpTo(stream_, buffer_.data(), size);
+    bool const isReached = seek(stream_, bufferOffset_);
+    bufferEnd_ = entry_ + (isReached ? readUpTo(stream_, buffer_.data(), size) : 0);
     return isBuffered(kEntryTypePosition);
   }
 
   QVStream& stream_;
   bool const isReversed_;
-  long bufferOffset_;  // of the buffer's first byte in the stream
+  std::int64_t bufferOffset_;  // of the buffer's first byte in the stream
   std::int64_t const position_;
   std::uint32_t const count_;
   std::uint32_t left_;  // entries from the current one on

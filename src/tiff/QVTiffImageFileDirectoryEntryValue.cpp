@@ -1,5 +1,6 @@
 #include "quavel/QVTiffImageFileDirectoryEntryValue.h"
 
+#include <cfloat>
 #include <cmath>
 #include <cstring>
 #include <limits>
@@ -107,13 +108,25 @@ std::uint32_t to32Bits(Value const& value) {
   });
 }
 
+/// As the type has it: an x87 computes with more digits, and keeps them while it can.
+template <class Float, class Number>
+Float rounded(Number number) {
+  auto const result = static_cast<Float>(number);
+  if constexpr (FLT_EVAL_METHOD == 0) {
+    return result;
+  } else {
+    Float const volatile kept = result;
+    return kept;
+  }
+}
+
 template <class Float>
 Float toFloat(Value const& value) {
   return converted(value, [](auto number) {
     if constexpr (std::is_arithmetic_v<decltype(number)>) {
-      return static_cast<Float>(number);
+      return rounded<Float>(number);
     } else {
-      return static_cast<Float>(number.numerator) / static_cast<Float>(number.denominator);
+      return rounded<Float>(rounded<Float>(number.numerator) / rounded<Float>(number.denominator));
     }
   });
 }

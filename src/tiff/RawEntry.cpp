@@ -45,8 +45,8 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<Value>& val
   std::size_t const size = kValueSizes[static_cast<std::size_t>(type)];
   bool const isReversed = detail::isReversed(stream);
   bool const isInField = entry.count * size <= kEntryFieldSize;
-  if (!isInField) {
-    stream.setOffset(valueOffset(entry, isReversed));
+  if (!isInField && !seek(stream, valueOffset(entry, isReversed))) {
+    return false;
   }
 
   std::array<std::uint8_t, kPartSize> part;

@@ -4,12 +4,19 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cstring>
 #include <memory>
 
 #include "photo/Photo.h"
 #include "photo/Reasons.h"
 
 namespace app {
+
+namespace {
+
+constexpr std::size_t kUsualPath = 100;  // saves taking memory twice
+
+}  // namespace
 
 Walk::Walk(std::string const& folder, Report report) : report_(std::move(report)) {
   enter(folder, false);
@@ -27,9 +34,12 @@ bool Walk::next(Input& input) {
       levels_.pop_back();
       continue;
     }
-    Entry const entry = std::move(level.entries.back());
+    Entry const entry = level.entries.back();
     level.entries.pop_back();
-    if (visit(entry.type, level.path + entry.name, input)) {
+    std::string path;
+    path.reserve(kUsualPath);
+    path.append(level.path).append(&level.names[entry.name]);
+    if (visit(entry.type, std::move(path), input)) {
       return true;
     }
   }
@@ -83,7 +93,7 @@ void Walk::enter(std::string const& path, bool isLink) {
   if (isRepeated(path, identity, isLink)) {
     return;
   }
-  Level level = {path.back() == '/' ? path : path + '/', identity, {}};
+  Level level = {path.back() == '/' ? path : path + '/', identity, {}, {}};
   readEntries(folder.get(), level);
   levels_.push_back(std::move(level));
 }
@@ -105,20 +115,23 @@ bool Walk::isRepeated(std::string const& path, Identity const& identity, bool is
 void Walk::readEntries(DIR* folder, Level& level) {
   errno = 0;
   while (dirent const* const entry = ::readdir(folder)) {
-    std::string name = entry->d_name;
+    std::string_view const name = entry->d_name;
     unsigned char const type = entry->d_type;
     bool const isWanted = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN ||
                           isPhotoExtension(extensionOf(name));
     if (isWanted && name != "." && name != "..") {
-      level.entries.push_back({std::move(name), type});
+      level.entries.push_back({level.names.size(), type});
+      level.names.append(name).append(1, '\0');
     }
     errno = 0;
   }
   if (errno != 0) {
     miss(level.path, errno);
   }
-  std::sort(level.entries.begin(), level.entries.end(),
-            [](Entry const& a, Entry const& b) { return a.name > b.name; });
+  char const* const names = level.names.data();
+  std::sort(level.entries.begin(), level.entries.end(), [names](Entry const& a, Entry const& b) {
+    return std::strcmp(names + a.name, names + b.name) > 0;
+  });
 }
 
 void Walk::miss(std::string const& path, int error) {

@@ -4,6 +4,7 @@
 #include <dirent.h>
 #include <sys/types.h>
 
+#include <cstddef>
 #include <functional>
 #include <optional>
 #include <set>
@@ -31,12 +32,13 @@ class Walk {
  private:
   using Identity = std::pair<dev_t, ino_t>;
   struct Entry {
-    std::string name;
+    std::size_t name;    // where it starts in the names
     unsigned char type;  // the system's, such as DT_REG
   };
   struct Level {
     std::string path;  // with a "/" at the end
     Identity identity;
+    std::string names;           // each ends with a NUL
     std::vector<Entry> entries;  // still to be visited, the last one first
   };
 

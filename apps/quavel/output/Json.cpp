@@ -12,24 +12,23 @@ namespace {
 // Room for a usual record: growing the text step by step would cost more than filling it.
 constexpr std::size_t kUsualObject = 700;
 
-bool isPlain(char c) { return ' ' <= c && c <= '~' && c != '"' && c != '\\'; }
+bool needsEscape(std::string const& text) {
+  return !isPlain(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
+}
 
-/// Appends a value. Nearly all texts are plain; the others are left to the JSON library.
+/// Appends a value that is not absent. Nearly all texts stand as they are; the others are left to
+/// the JSON library.
 void append(std::string& json, Value const& value) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
-  if (std::holds_alternative<std::monostate>(value)) {
-    json += "null";
-  } else if (text != nullptr && std::all_of(text->begin(), text->end(), isPlain)) {
-    json += '"';
-    json += *text;
-    json += '"';
-  } else if (text != nullptr) {
+  if (text != nullptr && needsEscape(*text)) {
     json += nlohmann::json(*text).dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
-  } else if (number != nullptr && std::isinf(*number)) {
-    json += '"' + exact(value) + '"';
+  } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
+    json += '"';
+    appendExact(json, value);
+    json += '"';
   } else {
-    json += exact(value);
+    appendExact(json, value);
   }
 }
 
@@ -53,17 +52,18 @@ std::string notesOf(Outcome const& outcome) {
     notes.push_back(std::move(object));
   }
   std::string const further = ",\"furtherSteps\":" + std::to_string(outcome.furtherSteps);
-  return "\"notes\":" + notes.dump() + (outcome.furtherSteps == 0 ? "" : further);
+  return ",\"notes\":" + notes.dump() + (outcome.furtherSteps == 0 ? "" : further);
 }
 
 bool holds(Fields const& fields, std::string_view name) {
   return std::find(fields.begin(), fields.end(), fieldNamed(name)) != fields.end();
 }
 
-/// A field, and its name as JSON with the colon.
+/// A field, its name as JSON with a comma before it and a colon after it, and the same with "null".
 struct Member {
   Field const* field;
   std::string name;
+  std::string absent;
 };
 
 using Members = std::vector<Member>;
@@ -71,7 +71,8 @@ using Members = std::vector<Member>;
 Members membersOf(Fields const& fields) {
   Members members;
   for (auto const* field : fields) {
-    members.push_back({field, '"' + std::string(field->name) + "\":"});
+    std::string const name = ",\"" + std::string(field->name) + "\":";
+    members.push_back({field, name, name + "null"});
   }
   return members;
 }
@@ -110,19 +111,22 @@ std::string JsonObjects::operator()(Outcome const& outcome) const {
   auto const add = [&](Members const& members, bool showAbsent) {
     for (auto const& member : members) {
       Value const value = member.field->value(outcome);
-      if (showAbsent || !std::holds_alternative<std::monostate>(value)) {
-        object += object.empty() ? '{' : ',';
+      if (!std::holds_alternative<std::monostate>(value)) {
         object += member.name;
         append(object, value);
+      } else if (showAbsent) {
+        object += member.absent;
       }
     }
   };
   add(outcome.record ? members_ : errorMembers_, showAbsent_);
   add(outcome.record ? pathBytes_ : bytesOfErrors_, false);
   if (hasNotes_) {
-    object.append(1, object.empty() ? '{' : ',').append(notesOf(outcome));
+    object += notesOf(outcome);
   }
-  object += object.empty() ? "{}" : "}";
+  object.resize(std::max<std::size_t>(object.size(), 1));
+  object.front() = '{';  // in place of the first comma
+  object += '}';
   object += endsLine_ ? "\n" : "";
   return object;
 }

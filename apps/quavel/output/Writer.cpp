@@ -29,7 +29,7 @@ class TextWriter : public Writer {
   }
   void add(Outcome&& outcome) override {
     if (!outcome.text.empty()) {
-      output_.add(outcome.text.insert(0, start_));
+      output_.add(start_.empty() ? outcome.text : outcome.text.insert(0, start_));
       start_ = separator_;
     }
   }

@@ -48,7 +48,7 @@ Value problem(Outcome const& outcome) {
 }
 
 Value pathBytes(Outcome const& outcome) {
-  if (pathAsUtf8(outcome.path) == outcome.path) {
+  if (isPlain(outcome.path) || pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";
@@ -77,18 +77,21 @@ std::string isoSpeed(std::int32_t value) { return number(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-struct Exact {
-  std::string operator()(std::monostate) const { return {}; }
-  std::string operator()(bool value) const { return value ? "true" : "false"; }
-  std::string operator()(std::string const& value) const { return value; }
+struct AppendExact {
+  std::string& text;
+
+  void operator()(std::monostate) const {}
+  void operator()(bool value) const { text += value ? "true" : "false"; }
+  void operator()(std::string const& value) const { text += value; }
   template <class Number>
-  std::string operator()(Number value) const {
+  void operator()(Number value) const {
     if (std::is_same_v<Number, float> && std::isinf(value)) {
-      return value < 0 ? "-Infinity" : "Infinity";
+      text += value < 0 ? "-Infinity" : "Infinity";
+      return;
     }
-    char text[32];
-    auto const result = std::to_chars(std::begin(text), std::end(text), value);
-    return {std::begin(text), result.ptr};
+    char digits[32];
+    auto const result = std::to_chars(std::begin(digits), std::end(digits), value);
+    text.append(digits, result.ptr);
   }
 };
 
@@ -160,6 +163,12 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   return keepStart(escaped(text), kLongestCell, kMostBytes);
 }
 
-std::string exact(Value const& value) { return std::visit(Exact(), value); }
+void appendExact(std::string& text, Value const& value) { std::visit(AppendExact{text}, value); }
+
+std::string exact(Value const& value) {
+  std::string text;
+  appendExact(text, value);
+  return text;
+}
 
 }  // namespace app

@@ -36,8 +36,10 @@ Fields recordFields();
 /// (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
 
-/// The value for programs: text as it is, digits that read back to the same number, "Infinity",
-/// "true". Empty when absent.
+/// Appends the value for programs: text as it is, digits that read back to the same number,
+/// "Infinity", "true". Nothing when absent.
+void appendExact(std::string& text, Value const& value);
+/// The same by itself.
 std::string exact(Value const& value);
 
 }  // namespace app

@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <exception>
-#include <set>
+#include <unordered_set>
 #include <utility>
 
 #include "photo/Reasons.h"
@@ -30,12 +30,9 @@ Problem irregular(mode_t mode) {
 }
 
 /// Why the library is not to be given the path, if so.
-Problem whyUnfit(Input const& input) {
+Problem whyUnfit(std::string const& path) {
   struct stat status = {};
-  if (input.problem || input.isPhoto) {
-    return input.problem;
-  }
-  if (::stat(input.path.c_str(), &status) == -1) {
+  if (::stat(path.c_str(), &status) == -1) {
     return reason::cannotOpen(errno);
   }
   return S_ISREG(status.st_mode) ? Problem() : irregular(status.st_mode);
@@ -93,7 +90,7 @@ std::string extensionOf(std::string_view path) {
 bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");
   // The library answers with a record, which costs too much for each name of a large folder.
-  thread_local std::set<std::string> known;
+  thread_local std::unordered_set<std::string> known;
   if (known.count(extension) != 0) {
     return true;
   }
@@ -115,8 +112,11 @@ std::string whyUnknown(std::string const& extension) {
 
 Outcome readPhoto(Input input, Detail detail) {
   Outcome outcome;
-  outcome.problem = whyUnfit(input);
   outcome.path = std::move(input.path);
+  outcome.problem = std::move(input.problem);
+  if (!input.isPhoto && !outcome.problem) {
+    outcome.problem = whyUnfit(outcome.path);
+  }
   try {
     fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });
   } catch (std::exception const& error) {

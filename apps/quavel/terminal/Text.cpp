@@ -3,7 +3,9 @@
 #include <utf8proc.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdio>
+#include <cstring>
 
 namespace app {
 
@@ -73,11 +75,6 @@ std::string shown(Character const& character) {
   return text;
 }
 
-/// It is visible ASCII, as nearly all texts are: not worth a look at each character.
-bool isPlain(std::string_view text) {
-  return std::all_of(text.begin(), text.end(), [](char c) { return ' ' <= c && c <= '~'; });
-}
-
 bool isUtf8(std::string_view text) {
   bool isValid = true;
   while (isValid && !text.empty()) {
@@ -87,6 +84,24 @@ bool isUtf8(std::string_view text) {
 }
 
 }  // namespace
+
+bool isPlain(std::string_view text) {
+  // Eight characters at a time: taking away the space, or adding one, sets the top bit of a byte
+  // that is not visible ASCII, unless it was set already.
+  constexpr std::uint64_t kOnes = 0x0101010101010101;
+  constexpr std::uint64_t kSpaces = kOnes * ' ';
+  std::uint64_t word = kSpaces;
+  std::uint64_t tops = 0;
+  for (; text.size() >= sizeof word; text.remove_prefix(sizeof word)) {
+    std::memcpy(&word, text.data(), sizeof word);
+    tops |= word | (word - kSpaces) | (word + kOnes);
+  }
+  for (char const c : text) {
+    word = word << 8U | static_cast<unsigned char>(c);
+  }
+  tops |= word | (word - kSpaces) | (word + kOnes);
+  return (tops & (kOnes << 7U)) == 0;
+}
 
 std::string textAsUtf8(std::string text) {
   if (isPlain(text) || isUtf8(text)) {

@@ -7,6 +7,8 @@
 
 namespace app {
 
+/// Nothing but visible ASCII, as nearly all texts are: not worth a look at each character.
+bool isPlain(std::string_view text);
 /// A text out of a file as UTF-8. Files that are not UTF-8 are mostly Latin-1: when any byte is
 /// wrong, all from 0x80 on are taken as the characters of that number.
 std::string textAsUtf8(std::string text);

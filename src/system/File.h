@@ -1,0 +1,75 @@
+#ifndef QUAVEL_SRC_SYSTEM_FILE_H
+#define QUAVEL_SRC_SYSTEM_FILE_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+
+#ifndef _WIN32
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#endif
+
+// What the library asks of the system: files, by descriptors and with 64-bit positions. -1 is a
+// failure, and `errno` says why.
+namespace quavel::detail::file {
+
+#ifdef _WIN32
+
+int open(std::string const& path);  // a path in UTF-8, of any length
+void close(int fd);
+std::int64_t read(int fd, std::uint8_t* destination, std::size_t count);
+std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::int64_t position);
+std::int64_t position(int fd);
+std::int64_t seek(int fd, std::int64_t position);
+std::int64_t size(int fd);
+inline void expectFewReads(int /*fd*/) {}
+inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
+
+#else
+
+static_assert(sizeof(off_t) == 8, "files above 2 GB want _FILE_OFFSET_BITS=64");
+
+inline int open(std::string const& path) { return ::open(path.c_str(), O_RDONLY, 0); }
+
+inline void close(int fd) { ::close(fd); }
+
+inline std::int64_t read(int fd, std::uint8_t* destination, std::size_t count) {
+  return ::read(fd, destination, count);
+}
+
+/// At a position, if the file has positions: a pipe is read on.
+inline std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count,
+                           std::int64_t position) {
+  std::int64_t const delivered = ::pread(fd, destination, count, position);
+  return delivered == -1 && errno == ESPIPE ? read(fd, destination, count) : delivered;
+}
+
+inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
+
+inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
+
+/// Of a regular file; -1: it is none.
+inline std::int64_t size(int fd) {
+  struct stat status = {};
+  return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode) ? std::int64_t{status.st_size} : -1;
+}
+
+#ifdef POSIX_FADV_RANDOM
+inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
+inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
+  ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
+}
+#else  // a system without such advice reads as it likes
+inline void expectFewReads(int /*fd*/) {}
+inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
+#endif
+
+#endif
+
+}  // namespace quavel::detail::file
+
+#endif  // QUAVEL_SRC_SYSTEM_FILE_H
