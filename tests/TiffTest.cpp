@@ -199,11 +199,13 @@ TEST(TiffDirectory, ReadsAListedTagOnceInListsOfAnyLength) {
   // The second 274 is malformed; 0x0140 and 0x0180 differ in their upper bits alone.
   Bytes const bytes = tiff(kII, {{shorts(274, {6}), values(274, 99, 1, {1}), shorts(0x0140, {1}),
                                   shorts(0x0180, {2}), shorts(0x9000, {3})}});
-  for (std::size_t const count : {5U, 15U, 16U, 17U, 18U, 40U}) {
-    TagList tags = {274, 0x0140, 0x0180, 0x0140};
+  for (std::size_t const count : {4U, 15U, 16U, 17U, 40U}) {
+    TagList tags = {274, 0x0140, 0x0180};
     for (int tag = 0x9000; tags.size() < count; ++tag) {
       tags.push_back(static_cast<unsigned short>(tag));
     }
+    EXPECT_EQ(readDirectory(bytes, tags), "274: 6, 320: 1, 384: 2, 36864: 3, next 0") << count;
+    tags.push_back(0x0140);
     EXPECT_EQ(readDirectory(bytes, tags), "274: 6, 320: 1, 384: 2, 36864: 3, next 0") << count;
   }
 }
