@@ -20,7 +20,7 @@ TEST(Sweep, OfPrefixesGivesTheWholeRecordOnceAllNeededBytesAreThere) {
       for (std::size_t length = 0; length <= bytes.size(); ++length) {
         std::string const result = resultOf(bytes.substr(0, length), fixture.extension);
         if (isJpeg(fixture) && length < bytes.size()) {
-          continue;  // running out between segments is no failure there
+          continue;  // running out between segments is not a failure there
         }
         EXPECT_TRUE(result == fixture.expected || (!wasRead && result[0] == '!'))
             << length << ": " << result;
