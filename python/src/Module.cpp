@@ -98,33 +98,15 @@ void refuseSubinterpreter() {
 }
 
 void addTo(py::module_& module) {
-  py::options options;
-  options.disable_function_signatures();  // the texts begin with one that `inspect` understands
   module.attr("__version__") = std::to_string(QUAVEL_VERSION_MAJOR) + '.' +
                                std::to_string(QUAVEL_VERSION_MINOR) + '.' +
                                std::to_string(QUAVEL_VERSION_PATCH);
   addRecord(module);
-  module.def("read", read, py::arg("path"),
-             "read($module, /, path)\n--\n\n"
-             "The record of the photo at a path: str, bytes or os.PathLike. What follows the last\n"
-             "'.' of the path names the format. Raises NoRecord when there is no record.");
-  module.def("get", get, py::arg("path"),
-             "get($module, /, path)\n--\n\n"
-             "As read, but None when there is no record.");
-  module.def("read_bytes", readBytes, py::arg("buffer"), py::arg("extension"),
-             "read_bytes($module, /, buffer, extension)\n--\n\n"
-             "The record of a photo in memory: bytes, memoryview, mmap, numpy.ndarray or anything\n"
-             "else with the buffer protocol. It is read in place, and must not change meanwhile.\n"
-             "The extension, such as 'nef' or '.NEF', names the format. Raises NoRecord.");
-  module.def("read_file", readFile, py::arg("file"), py::arg("extension"),
-             "read_file($module, /, file, extension)\n--\n\n"
-             "The record of a photo in a binary file object with read() and seek(). It is read\n"
-             "from position 0, in blocks, and left at any position. Raises NoRecord, and whatever\n"
-             "the file raises.");
-  module.def("explain", explain, py::arg("path"),
-             "explain($module, /, path)\n--\n\n"
-             "What a read of the photo at a path comes across, as a list of Note: why there is no\n"
-             "record, or why attributes of the record are None.");
+  module.def("read", read);
+  module.def("get", get);
+  module.def("read_bytes", readBytes);
+  module.def("read_file", readFile);
+  module.def("explain", explain);
   module.def("refuse_subinterpreter", refuseSubinterpreter);
   py::class_<Scanner>(module, "Scanner", py::module_local())
       .def(py::init<py::object, bool, unsigned>())

@@ -238,7 +238,7 @@ void addRecord(py::module_& module) {
         field.name, [value = field.value](QVMetadata const& self) { return shown(self.*value); },
         field.doc);
   });
-  record.def("to_dict", toDict, "to_dict($self, /)\n--\n\nAll attributes by name.")
+  record.def("to_dict", toDict, "All attributes by name.")
       .def("__eq__", areEqual, py::is_operator())
       .def("__hash__", hashOf)
       .def("__repr__", represent)
