@@ -32,6 +32,8 @@ class CMakeBuild(build_ext):
             f"-DPython_EXECUTABLE={sys.executable}",
             f"-Dpybind11_ROOT={Path(pybind11.origin).parent if pybind11 else ''}",
         ]
+        if shutil.which("ninja") and not Path(self.build_temp, "CMakeCache.txt").exists():
+            options.append("-GNinja")
         subprocess.run(["cmake", "-S", ROOT, "-B", self.build_temp, *options], check=True)
         jobs = str(os.cpu_count() or 1)
         build = ["cmake", "--build", self.build_temp, "--target", "quavel_python", "-j", jobs]

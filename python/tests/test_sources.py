@@ -4,11 +4,13 @@ import http.server
 import io
 import mmap
 import os
+import subprocess
+import sys
 import threading
 import zipfile
 
 import pytest
-from conftest import PHOTOS
+from conftest import PHOTOS, ROOT
 
 import quavel
 
@@ -173,13 +175,25 @@ class Ranges(http.server.SimpleHTTPRequestHandler):
         pass
 
 
-def test_fsspec():
-    fsspec = pytest.importorskip("fsspec")
+def test_remote_photos(tmp_path):
+    """The example with fsspec, on an archive and a web server."""
+    pytest.importorskip("fsspec")
     pytest.importorskip("aiohttp")
+    example = ROOT / "python" / "examples" / "remote_photos.py"
+    with zipfile.ZipFile(tmp_path / "photos.zip", "w", zipfile.ZIP_DEFLATED) as file:
+        file.write(NIGHT, "night.nef")
     with http.server.ThreadingHTTPServer(("127.0.0.1", 0), Ranges) as server:
         threading.Thread(target=server.serve_forever, daemon=True).start()
-        url = f"http://127.0.0.1:{server.server_port}/night.nef"
-        with fsspec.open(url, "rb", block_size=16384) as file:
-            assert quavel.read_file(file, "nef").width == 6032
+        urls = [
+            f"zip://night.nef::{tmp_path}/photos.zip",
+            f"http://127.0.0.1:{server.server_port}/night.nef",
+            f"zip://gone.nef::{tmp_path}/photos.zip",
+        ]
+        command = [sys.executable, example, *urls]
+        lines = subprocess.run(command, stdout=subprocess.PIPE, text=True, check=True).stdout
         server.shutdown()
-    assert 1 <= len(Ranges.requests) <= 3
+    zipped, served, gone = lines.splitlines()
+    assert zipped == f"{urls[0]}: 6032 x 4032, 2021:05:01 10:00:00"
+    assert served == f"{urls[1]}: 6032 x 4032, 2021:05:01 10:00:00"
+    assert gone.startswith(urls[2])
+    assert 1 <= len(Ranges.requests) <= 2
