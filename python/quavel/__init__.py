@@ -91,8 +91,8 @@ def scan(
     """Read many photos on threads; give a Result for each, in order, whether it can be read or not.
 
     Of a folder, the photos in it and in the folders in it are read, in the order of their names.
-    Any other path stands for itself. An iterable is run on the caller's thread, and some hundred
-    paths ahead. `jobs` files are read at a time, at most 256; by default as many as there are
+    Any other path stands for itself. An iterable is run on the caller's thread, ahead of the
+    results. `jobs` files are read at a time, at most 256; by default as many as there are
     processors, or 32 when the files turn out not to be cached.
 
     Closing the iterator, or leaving it to the garbage collector, ends the threads.

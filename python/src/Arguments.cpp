@@ -33,7 +33,12 @@ std::string extensionOf(py::handle extension) {
   if (!py::isinstance<py::str>(extension)) {
     throw py::type_error("extension must be str, not " + typeName(extension));
   }
-  auto text = extension.cast<std::string>();
+  Py_ssize_t size = 0;
+  char const* const utf8 = PyUnicode_AsUTF8AndSize(extension.ptr(), &size);
+  if (utf8 == nullptr) {
+    raiseOf(PyExc_ValueError, "extension holds what no extension can");
+  }
+  std::string text(utf8, static_cast<std::size_t>(size));
   if (!text.empty() && text.front() == '.') {
     text.erase(0, 1);
   }

@@ -99,15 +99,16 @@ void Scanner::submitNext() {
 }
 
 void Scanner::takeFound(Work& work) {
-  py::gil_scoped_release const release;
-  Photo photo;
-  while (work.batch.photos.size() < batchSize_) {
-    if (!walk_->next(photo)) {
-      py::gil_scoped_acquire const acquire;
-      source_ = py::object();
-      return;
+  bool isFound = true;
+  {
+    py::gil_scoped_release const release;
+    Photo photo;
+    while (work.batch.photos.size() < batchSize_ && (isFound = walk_->next(photo))) {
+      work.batch.photos.push_back(std::move(photo));
     }
-    work.batch.photos.push_back(std::move(photo));
+  }
+  if (!isFound) {
+    source_ = py::object();
   }
 }
 

@@ -31,6 +31,7 @@ RELEASED.release()
         (lambda: quavel.read_bytes(RELEASED, "nef"), ValueError, "buffer must be .* not released"),
         (lambda: quavel.read_bytes(memoryview(b"abcd")[::2], "nef"), ValueError, "buffer must be"),
         (lambda: quavel.read_bytes(b"", b"nef"), TypeError, "extension must be str, not bytes"),
+        (lambda: quavel.read_bytes(b"", "\ud800"), ValueError, "extension"),
         (lambda: quavel.read_file(io.BytesIO(), None), TypeError, "extension must be str"),
         (lambda: quavel.read_file("night.nef", "nef"), TypeError, "file must be .* not str"),
         (lambda: quavel.scan(1), TypeError, "paths_or_folder must be .* not int"),
