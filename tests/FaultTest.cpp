@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
+#ifndef _WIN32
 #include <sys/resource.h>
-#include <unistd.h>
+#endif
 
 #include <filesystem>
 #include <functional>
@@ -103,14 +104,15 @@ TEST(Fault, OfAFileThatShrinksEndsTheRead) {
 
 TEST(Fault, OfAFileThatVanishesIsNone) {
   Fixture const& fixture = fixtures().front();
-  auto file = std::make_unique<TemporaryFile>(fixture.bytes(kII), fixture.extension);
-  std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file->path);
-  file.reset();
+  TemporaryFile const file(fixture.bytes(kII), fixture.extension);
+  std::shared_ptr<QVStream> stream = std::make_shared<QVFStream>(file.path);
+  EXPECT_TRUE(std::filesystem::remove(file.path));  // others may delete what is being read
   QVTiffImage record;
   EXPECT_TRUE(record.read(stream));
   EXPECT_EQ(describe(record), fixture.expected);
 }
 
+#ifndef _WIN32  // has no such limit
 TEST(Fault, OfTheDescriptorsGivesNoRecordUntilThereAreSomeAgain) {
   Fixture const& fixture = fixtures().front();
   TemporaryFile const file(fixture.bytes(kII), fixture.extension);
@@ -125,6 +127,7 @@ TEST(Fault, OfTheDescriptorsGivesNoRecordUntilThereAreSomeAgain) {
   EXPECT_FALSE(record);
   EXPECT_EQ(describe(QVReader(file.path).metadata), fixture.expected);
 }
+#endif
 
 TEST(Threads, ReadTheSameFilesAtOnce) {
   std::vector<std::unique_ptr<TemporaryFile>> files;
@@ -138,7 +141,8 @@ TEST(Threads, ReadTheSameFilesAtOnce) {
       std::size_t const k = i % files.size();
       Fixture const& fixture = fixtures()[k];
       auto* const data = reinterpret_cast<unsigned char*>(contents[k].data());
-      QVReader const byMemory(data, contents[k].size(), fixture.extension);
+      QVReader const byMemory(data, static_cast<unsigned long>(contents[k].size()),
+                              fixture.extension);
       isRight = isRight && describe(QVReader(files[k]->path).metadata) == fixture.expected &&
                 describe(byMemory.metadata) == fixture.expected;
     }

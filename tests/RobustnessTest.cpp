@@ -43,7 +43,8 @@ void sweepChanges(Bytes bytes, std::string const& extension, bool flipsEachBit) 
         continue;
       }
       data[i] = static_cast<unsigned char>(bit < 8 ? original ^ 1U << bit : 8 - bit);
-      auto const record = QVReader(data, bytes.size(), extension).metadata;
+      auto const record =
+          QVReader(data, static_cast<unsigned long>(bytes.size()), extension).metadata;
       EXPECT_TRUE(!record || record->captureDate().size() <= bytes.size());
     }
     data[i] = original;

@@ -223,7 +223,7 @@ std::string describe(std::shared_ptr<QVMetadata> const& record) {
 
 std::shared_ptr<QVMetadata> readBuffer(Bytes bytes, std::string const& extension) {
   auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
-  return QVReader(data, bytes.size(), extension).metadata;
+  return QVReader(data, static_cast<unsigned long>(bytes.size()), extension).metadata;
 }
 
 TemporaryFile::TemporaryFile(Bytes const& bytes, std::string const& extension) {
