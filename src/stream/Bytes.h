@@ -69,16 +69,19 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// Beyond the last offset to be sought, enough can be read that `long` still counts: more than the
-// entries of a directory take.
-inline constexpr long kReadBeyond = 1L << 20U;
+// Where `long` has 32 bits, what lies beyond 2 GB has no offset. Somewhat before that is the last
+// place to read at: the offset after more bytes than a directory's entries take can still be told.
+inline constexpr bool kIsLongShort = sizeof(long) < sizeof(std::int64_t);
+inline constexpr long kLastOffset =
+    std::numeric_limits<long>::max() - (kIsLongShort ? 1L << 20U : 0);
 
-/// Moves the stream to an offset. False: `long`, which has 32 bits on some systems, cannot hold it.
-/// The stream would stay where it is, and what it reads there is not what was wanted.
+/// Stands for all that has no offset.
+inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLongShort ? 1 : 0);
+
+/// Moves the stream to an offset. False: that is out of reach. The stream would stay where it is,
+/// and what it reads there is not what was wanted.
 inline bool seek(QVStream& stream, std::int64_t offset) {
-  using Limits = std::numeric_limits<long>;
-  if (sizeof(long) < sizeof(offset) &&
-      (offset < Limits::min() || offset > Limits::max() - kReadBeyond)) {
+  if (offset > kLastOffset || offset < std::numeric_limits<long>::min()) {
     return false;
   }
   stream.setOffset(static_cast<long>(offset));
