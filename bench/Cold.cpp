@@ -13,6 +13,7 @@ namespace quavel::bench {
 namespace {
 
 constexpr double kBlockOfUsage = 512;
+constexpr int kCannotRun = 126;  // and above: what a shell gives for a command that it cannot run
 
 void require(bool isDone, char const* what) {
   if (!isDone) {
@@ -41,6 +42,7 @@ ColdUse readInChild(Contender const& contender, Paths const& files) {
   int status = 0;
   rusage usage = {};
   require(::wait4(child, &status, 0, &usage) == child, "the process is lost");
+  require(WIFEXITED(status) && WEXITSTATUS(status) < kCannotRun, "a reader cannot be run");
   std::chrono::duration<double> const time = std::chrono::steady_clock::now() - start;
   return {time.count(), static_cast<double>(usage.ru_inblock) * kBlockOfUsage};
 }

@@ -41,6 +41,8 @@ void readWithQuavel(Paths const& files) {
   }
 }
 
+constexpr int kNoSuchCommand = 127;
+
 /// Becomes a command that takes the files from a list, which comes last. Its output goes nowhere.
 void become(Paths command, Paths const& files) {
   // In memory: the list itself is not to be read from the disk.
@@ -48,7 +50,7 @@ void become(Paths command, Paths const& files) {
   for (auto const& file : files) {
     std::string const line = file + "\n";
     if (::write(list, line.data(), line.size()) != static_cast<ssize_t>(line.size())) {
-      return;
+      ::_exit(kNoSuchCommand);
     }
   }
   ::lseek(list, 0, SEEK_SET);
@@ -62,6 +64,7 @@ void become(Paths command, Paths const& files) {
   ::dup2(nowhere, STDOUT_FILENO);
   ::dup2(nowhere, STDERR_FILENO);
   ::execvp(arguments.front(), arguments.data());
+  ::_exit(kNoSuchCommand);
 }
 
 Contender command(std::string const& name, Paths const& files, Paths const& arguments) {

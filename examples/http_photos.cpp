@@ -3,6 +3,8 @@
 #include <curl/curl.h>
 #include <quavel/quavel.h>
 
+#include <algorithm>
+#include <cctype>
 #include <cstdio>
 #include <cstring>
 #include <iostream>
@@ -19,8 +21,8 @@ class HttpStream : public quavel::QVStream {
     curl_easy_setopt(connection, CURLOPT_PROTOCOLS_STR, "http,https");
     curl_easy_setopt(connection, CURLOPT_FOLLOWLOCATION, 1L);
     curl_easy_setopt(connection, CURLOPT_CONNECTTIMEOUT, 10L);
-    curl_easy_setopt(connection, CURLOPT_LOW_SPEED_LIMIT, 1L);  // bytes in a second, and for
-    curl_easy_setopt(connection, CURLOPT_LOW_SPEED_TIME, 20L);  // so long: it has stalled
+    curl_easy_setopt(connection, CURLOPT_LOW_SPEED_LIMIT, 500L);  // fewer bytes a second, for
+    curl_easy_setopt(connection, CURLOPT_LOW_SPEED_TIME, 20L);    // so long: it has stalled
     curl_easy_setopt(connection, CURLOPT_HEADERFUNCTION, &HttpStream::takeHeader);
     curl_easy_setopt(connection, CURLOPT_HEADERDATA, this);
     curl_easy_setopt(connection, CURLOPT_WRITEFUNCTION, &HttpStream::takeBody);
@@ -113,7 +115,7 @@ class HttpStream : public quavel::QVStream {
       throw std::runtime_error(curl_easy_strerror(code));
     }
     auto const received = static_cast<long long>(answer_.received);
-    if (answer_.first != position_ || answer_.last - answer_.first + 1 != received) {
+    if (answer_.first != position_ || answer_.last != position_ + received - 1) {
       throw std::runtime_error("the server sends another range than it says");
     }
     if (size_ != -1 && answer_.size != size_) {
@@ -135,7 +137,10 @@ constexpr std::size_t kNextBlock = 8192;
 
 bool readPhoto(CURL* connection, std::string const& url) {
   quavel::QVReader const reader(nullptr, 0, "");  // no format, so it reads nothing by itself
-  auto const record = reader.createMetadata(reader.getPathExtension(url));
+  std::string extension = reader.getPathExtension(url.substr(0, url.find_first_of("?#")));
+  std::transform(extension.begin(), extension.end(), extension.begin(),
+                 [](unsigned char c) { return std::tolower(c); });
+  auto const record = reader.createMetadata(extension);
   if (!record) {
     std::cerr << url << ": not a photo's extension\n";
     return false;
@@ -164,8 +169,12 @@ int main(int argc, char** argv) {
   }
   curl_global_init(CURL_GLOBAL_DEFAULT);
   CURL* const connection = curl_easy_init();
-  bool isRead = connection != nullptr;
-  for (int i = 1; i < argc && connection != nullptr; ++i) {
+  if (connection == nullptr) {
+    std::cerr << "http_photos: libcurl cannot be started\n";
+    return 1;
+  }
+  bool isRead = true;
+  for (int i = 1; i < argc; ++i) {
     isRead = readPhoto(connection, argv[i]) && isRead;
   }
   curl_easy_cleanup(connection);

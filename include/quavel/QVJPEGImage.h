@@ -39,15 +39,15 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
   static std::map<std::uint16_t, std::uint16_t> const markerSkipLengths;
 
  private:
-  struct Walk;
+  struct WalkState;
 
   QUAVEL_NO_EXPORT bool readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
-                                    Walk& walk);
-  QUAVEL_NO_EXPORT bool readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk);
-  QUAVEL_NO_EXPORT static bool readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk);
-  QUAVEL_NO_EXPORT void reconcileSizeWith(Walk const& walk);
-  QUAVEL_NO_EXPORT static void noteHints(detail::Journal* journal, Walk const& walk);
-  QUAVEL_NO_EXPORT static void noteWhatIsMissing(detail::Journal* journal, Walk const& walk);
+                                    WalkState& walk);
+  QUAVEL_NO_EXPORT bool readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk);
+  QUAVEL_NO_EXPORT static bool readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk);
+  QUAVEL_NO_EXPORT void reconcileSizeWith(WalkState const& walk);
+  QUAVEL_NO_EXPORT static void noteHints(detail::Journal* journal, WalkState const& walk);
+  QUAVEL_NO_EXPORT static void noteWhatIsMissing(detail::Journal* journal, WalkState const& walk);
 };
 
 }  // namespace quavel

@@ -15,7 +15,7 @@ namespace quavel {
 /// and seeks like a file: a seek past the end succeeds, one to before the start is refused.
 class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
  public:
-  /// Position 0 is the source's offset 0. The source must be able to seek, and nobody else may use
+  /// Position 0 is the source's offset 0. The source is not null and can seek; nobody else may use
   /// it from then on. The first block is `firstBlockSize` bytes long, each later one
   /// `nextBlockSize`, or the larger of the two where it continues the block before; 0 counts as 1.
   /// Takes memory for two blocks of the larger size.

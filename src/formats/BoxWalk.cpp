@@ -18,8 +18,9 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
   if (!header.read(stream)) {
     return refuseCut(journal, position, box::kHeaderSize, kHeaderPattern, place);
   }
-  // A smaller one, 0 above all, would lead a walk back to where it has been. That leaves out the
-  // standard's sizes 0 (to the end of the file) and 1 (64 bits), which precede no metadata.
+  // A smaller size, such as 0, would lead the walk back to where it has been. The sizes 0 (to the
+  // end of the file) and 1 (64 bits) of the standard are refused too: no metadata follows such a
+  // box.
   if (header.boxSize < box::kHeaderSize) {
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",

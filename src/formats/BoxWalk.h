@@ -25,12 +25,12 @@ void append(std::string& out, PlacedBox box);
 /// Where a box lies, for notes: "in the moov box at 0x18 (24)".
 struct BoxPlace {
   char const* text;
-  PlacedBox parent = {};  ///< Its type 0: the text says it all.
+  PlacedBox parent = {};  ///< Appended to the text, unless its type is 0.
 };
 void append(std::string& out, BoxPlace place);
 
 /// Reads the box header at the stream's position and moves past the box. False: the header cannot
-/// be read, its size does not even cover the header, or the read has seen too many boxes.
+/// be read, its size is smaller than the header, or the read has seen too many boxes.
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header);
 
 }  // namespace detail

@@ -11,7 +11,7 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
              Offset{size < 0 ? position : std::min(position, size)});
 }
 
-void detail::noteSize(Directory const& exifIFD, int width, int height) {
+void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
   bool const hasWidth =
       findEntry(exifIFD, tag::ImageWidth) || findEntry(exifIFD, tag::PixelXDimension);
   bool const hasHeight =
@@ -24,7 +24,7 @@ void detail::noteSize(Directory const& exifIFD, int width, int height) {
              static_cast<std::uint32_t>(height));
 }
 
-void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
+void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;
   }
@@ -43,7 +43,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, Walk const& walk) {
   }
 }
 
-void QVJPEGImage::noteHints(Journal* journal, Walk const& walk) {
+void QVJPEGImage::noteHints(Journal* journal, WalkState const& walk) {
   if (walk.otherFrame >= 0) {
     noteHint(journal, QVReason::NotBaseline, walk.otherFrame,
              "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",

@@ -6,9 +6,10 @@
 
 namespace quavel {
 
-/// What the segments have shown so far. Positions, in the file, serve notes alone.
-struct QVJPEGImage::Walk {
-  bool sawAPP1 = false;  ///< Of any content, Exif or not.
+/// What the walk over the segments has met so far. Positions are those in the file; only notes use
+/// them.
+struct QVJPEGImage::WalkState {
+  bool sawAPP1 = false;  ///< With any content, Exif or not.
   bool sawSOF0 = false;
   bool sawExif = false;
   unsigned short frameWidth = 0;
@@ -16,18 +17,18 @@ struct QVJPEGImage::Walk {
   std::int64_t next = 0;   ///< Offset of the segment after the one being read.
   std::int64_t start = 0;  ///< Of the segment being read.
   std::int64_t frame = -1;
-  std::int64_t otherFrame = -1;  ///< A progressive one.
-  std::int64_t scan = -1;        ///< Where picture data begins.
+  std::int64_t otherFrame = -1;  ///< A progressive frame.
+  std::int64_t scan = -1;        ///< Where image data begins.
   char const* missingAtScan = "";
 };
 
 namespace detail {
 
-/// Notes where the data ends; a segment's length may lead beyond that.
+/// Notes where the data ends, which may be before the end of the last segment.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes why an Exif size does not count, if it does not.
-void noteSize(Directory const& exifIFD, int width, int height);
+/// Notes why the Exif size does not count, unless it does.
+void noteSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail
 }  // namespace quavel

@@ -12,8 +12,8 @@
 
 namespace quavel::detail {
 
-/// Reads a metadata box of the given type: its `readExif` on the payload, with the payload's own
-/// base and byte order, which are put back on success only.
+/// Reads a metadata box of the given type by its `readExif`, which gets the stream with the
+/// payload's base. The stream's base and byte order are restored on success only.
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {

@@ -18,7 +18,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory exifIFD;
+  DirectoryPointer exifIFD;
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;
@@ -29,7 +29,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
                TagName{tag::ExifIFDPointer}, placed(mainIFD));
     return true;
   }
-  Directory rawIFD;
+  DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, 0, {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength},
                   rawIFD)) {
     return false;

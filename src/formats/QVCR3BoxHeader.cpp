@@ -9,14 +9,14 @@
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // Both at once: a walk reads many headers and little else.
+  // Both numbers in one read: a walk reads many headers and little else.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
-  std::size_t const there = detail::readUpTo(*stream, bytes.data(), bytes.size());
-  bool const isReversed = detail::isReversed(*stream);
-  if (there >= sizeof(boxSize)) {
+  std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
+  bool const isReversed = detail::needsReversal(*stream);
+  if (received >= sizeof(boxSize)) {
     boxSize = detail::numberAt<std::uint32_t>(bytes.data(), isReversed);
   }
-  if (there < bytes.size()) {
+  if (received < bytes.size()) {
     return false;
   }
   boxType = detail::numberAt<std::uint32_t>(bytes.data() + sizeof(boxSize), isReversed);

@@ -12,16 +12,16 @@ namespace {
 
 /// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
 /// untouched. Not a single value: false.
-bool storeShort(Directory const& directory, unsigned short tag, std::int32_t& field) {
+bool storeShort(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
   bool const isRead = findNumber(directory, tag, value);
   field = value == nullptr ? field : value->shortValue();
   return isRead;
 }
 
-/// Stores the tag's fraction. Absent: true, the field untouched. Not a single value, or of
+/// Stores the tag's fraction. Absent: true, the field untouched. Not a single value, or one of
 /// another type: false.
-bool storeFraction(Directory const& directory, unsigned short tag, EntryValueType type,
+bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
   ValuePointer value = nullptr;
   bool const isRead = findNumber(directory, tag, value);
@@ -68,8 +68,8 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
          storeFraction(ifd, tag::FNumber, EntryValueType::RATIONAL, fNumber);
 }
 
-// APEX counts in powers of two (Exif, annex C): the f-number is 2^(Av/2), the exposure time 2^-Tv
-// seconds, and NaN stays NaN.
+// APEX values are powers of two (Exif, annex C): the f-number is 2^(Av/2), the exposure time 2^-Tv
+// seconds. NaN stays NaN.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {

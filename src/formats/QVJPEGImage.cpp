@@ -27,12 +27,12 @@ constexpr unsigned short kAPP1 = 0xffe1;
 constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
-// Below it, the Exif size is taken for that of a thumbnail.
-constexpr int kLargestThumbnailSide = 500;
+// Up to it, a side given by the Exif directory is taken for a thumbnail's.
+constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// A constant, unlike the public map made of it: it is there before any constructor of a host's.
+// A constant, so that readers work even before the public map below is initialised.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -73,9 +73,9 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
                   "the file begins with {}, not with ff d8 (SOI)", HexPair{marker});
   }
 
-  // An ordinary file ends the walk at its frame header. One without a baseline frame or an APP1
-  // segment is walked through its scan to the end of the data, which is no failure.
-  Walk walk;
+  // In an ordinary file, the walk ends at the frame header. A file without a baseline frame or an
+  // APP1 segment is walked through its scan to the end of the data, which is not a failure.
+  WalkState walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
     walk.start = notedPosition(journal, *stream);
@@ -97,7 +97,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short marker,
-                              Walk& walk) {
+                              WalkState& walk) {
   for (auto const& [skippedMarker, skip] : kFixedSkips) {
     if (marker == skippedMarker) {
       walk.next = std::int64_t{stream->getOffset()} + skip;
@@ -121,14 +121,14 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
     walk.scan = walk.start;
     walk.missingAtScan = walk.sawAPP1 ? "SOF0" : walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
   }
-  // After the start of the scan, the same two bytes are picture data.
+  // After the start of the scan, the same two bytes are image data.
   if (marker == kSOF2 && walk.scan < 0) {
     walk.otherFrame = walk.start;
   }
   return true;
 }
 
-bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
+bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   Journal* const journal = journalOf(*stream);
   std::int64_t const baseOffset = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
@@ -156,7 +156,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, Walk& walk) {
   return true;
 }
 
-bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk) {
+bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   unsigned char precision = 0;
   unsigned short height = 0;
   unsigned short width = 0;
@@ -176,14 +176,14 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, Walk& walk) {
   return true;
 }
 
-void QVJPEGImage::reconcileSizeWith(Walk const& walk) {
+void QVJPEGImage::reconcileSizeWith(WalkState const& walk) {
   bool const hasFrame = walk.frameWidth != 0 && walk.frameHeight != 0;
   if ((width < 0 || height < 0) && hasFrame) {
     width = walk.frameWidth;
     height = walk.frameHeight;
   }
 
-  // Exif may give the turned image's size. The frame's holds when no rotation is declared.
+  // Exif may give the sides swapped. The frame's size counts unless a rotation is declared.
   bool const isTurned = width == walk.frameHeight && height == walk.frameWidth;
   bool const isUpright = orientation == 1 || orientation == -1;
   if (isTurned && isUpright) {
@@ -202,7 +202,7 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory exifIFD;
+  DirectoryPointer exifIFD;
   return readExifIFD(*this, stream, mainIFD,
                      {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
                       tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
@@ -225,7 +225,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (wantsAll(journalOf(ifd))) {
     noteSize(ifd, exifWidth, exifHeight);
   }
-  if (exifWidth > kLargestThumbnailSide && exifHeight > kLargestThumbnailSide) {
+  if (exifWidth > kMaxThumbnailSide && exifHeight > kMaxThumbnailSide) {
     width = exifWidth;
     height = exifHeight;
   }

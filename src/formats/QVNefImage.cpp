@@ -10,7 +10,8 @@ using namespace detail;
 
 namespace {
 
-// What a NEF is known by: its first directory describes a thumbnail of this size.
+// The rule by which this library recognises a NEF: its first directory describes a thumbnail of
+// this size. Some cameras write another one; their files are refused.
 constexpr std::int32_t kThumbnailWidth = 160;
 constexpr std::int32_t kThumbnailHeight = 120;
 constexpr char kThumbnailRule[] = "a NEF's first directory must be 160 x 120";
@@ -28,14 +29,14 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory exifIFD;
+  DirectoryPointer exifIFD;
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;
   }
 
   // The first SubIFD is a preview's, the second the raw image's, with or without an Exif directory.
-  Directory rawIFD;
+  DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, 1, {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType},
                   rawIFD)) {
     return false;

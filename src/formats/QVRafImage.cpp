@@ -15,7 +15,7 @@ namespace {
 
 constexpr std::array<std::uint8_t, 8> kMagic = {'F', 'U', 'J', 'I', 'F', 'I', 'L', 'M'};
 
-// Fields of the file's header, big-endian whatever the sections use.
+// Fields of the file's header, which is big-endian whatever order the sections have.
 constexpr long kImageOffsetPosition = 84;
 constexpr long kRawSectionOffsetPosition = 100;
 
@@ -35,13 +35,13 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
   return true;
 }
 
-/// Whether an image opens as the reader takes for granted. The segment's length may be anything.
+/// Whether an image begins as the reader expects. The segment's length may be anything.
 bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
   return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
          std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
 }
 
-/// Tells what the embedded image begins with when that explains why its directories are not found.
+/// Notes what the embedded image begins with, when that explains why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
   if (!wantsAll(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
@@ -102,7 +102,7 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory exifIFD;
+  DirectoryPointer exifIFD;
   return readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                      exifIFD);
 }
@@ -115,7 +115,7 @@ bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory vendorIFD;
+  DirectoryPointer vendorIFD;
   if (!followPointer(stream, rawSectionIFD, tag::RafDirectoryPointer, "the vendor directory",
                      {tag::RafImageWidth, tag::RafImageLength}, vendorIFD)) {
     return false;

@@ -10,9 +10,9 @@ using namespace detail;
 
 namespace {
 
-/// The first of the SubIFDs that says it is not a reduced image; null on failure and when none
-/// does.
-Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
+/// The first SubIFD that is marked as not reduced; null on failure, which includes that none is.
+DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
+                                     DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
@@ -27,7 +27,7 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const
     if (type != nullptr && !isReducedImage(type)) {
       return subIFD;
     }
-    // One that does not say what it is, is never taken.
+    // A SubIFD without a mark is never taken.
     noteHint(
         journal, QVReason::PassedOver, positionOf(subIFD),
         type == nullptr ? "{} has no 0x00fe NewSubfileType" : "{} declares a reduced image too",
@@ -42,8 +42,9 @@ Directory readFullImageSubIFD(std::shared_ptr<QVStream>& stream, Directory const
   return nullptr;
 }
 
-/// The directory of the full-size image; null on failure and when there is none.
-Directory chooseFullImageIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD) {
+/// The directory of the full-size image; null on failure, which includes that there is none.
+DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
+                                    DirectoryPointer const& mainIFD) {
   ValuePointer type = nullptr;
   if (!findNumber(mainIFD, tag::NewSubfileType, type)) {
     return nullptr;
@@ -69,7 +70,7 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  Directory exifIFD;
+  DirectoryPointer exifIFD;
   return readExifIFD(*this, stream, mainIFD,
                      {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
                      exifIFD);

@@ -10,12 +10,12 @@ namespace {
 
 constexpr unsigned short kTiffMagic = 42;
 
-// Stored in a record, it cannot be told from a number that is not there.
+// In a record, it cannot be told from a number that is absent.
 constexpr std::int32_t kAbsentNumber = -1;
 
 }  // namespace
 
-bool findNumber(Directory const& directory, unsigned short tag, ValuePointer& value) {
+bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value) {
   auto const entry = findEntry(directory, tag);
   value = entry.size() == 1 ? entry[0] : nullptr;
   if (!entry) {
@@ -24,7 +24,7 @@ bool findNumber(Directory const& directory, unsigned short tag, ValuePointer& va
   return value != nullptr || !entry || refuseContent(directory, tag, "exactly one wanted");
 }
 
-bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& field) {
+bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
   if (!findNumber(directory, tag, value)) {
     return false;
@@ -38,7 +38,7 @@ bool storeNumber(Directory const& directory, unsigned short tag, std::int32_t& f
   return true;
 }
 
-bool storeRequiredNumber(Directory const& directory, unsigned short tag, char const* rule,
+bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field) {
   if (!findEntry(directory, tag)) {
     return refuse(journalOf(directory), QVReason::MissingPart, positionOf(directory),
@@ -47,7 +47,7 @@ bool storeRequiredNumber(Directory const& directory, unsigned short tag, char co
   return storeNumber(directory, tag, field);
 }
 
-bool storeText(Directory const& directory, unsigned short tag, std::string& field) {
+bool storeText(DirectoryPointer const& directory, unsigned short tag, std::string& field) {
   auto const entry = findEntry(directory, tag);
   if (!entry) {
     noteNoEntry(directory, tag);
@@ -62,8 +62,8 @@ bool storeText(Directory const& directory, unsigned short tag, std::string& fiel
   return true;
 }
 
-Directory readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
-                          std::uint32_t offset, Tags tags) {
+DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
+                                 std::uint32_t offset, TagList tags) {
   auto directory = std::make_shared<ReaderDirectory>(name, stream->baseOffset + offset);
   if (!directory->table.readWithNext(*stream, offset, tags, &directory->nextIFDOffset)) {
     return nullptr;
@@ -71,7 +71,8 @@ Directory readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const
   return directory;
 }
 
-Directory readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure, Tags tags) {
+DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
+                                    TagList tags) {
   QVTiffHeader header;
   if (!readTiffHeader(*stream, kTiffMagic, structure, header)) {
     return nullptr;
@@ -79,8 +80,9 @@ Directory readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* stru
   return readDirectoryAt(stream, {"IFD0", structure}, header.firstIFDOffset, tags);
 }
 
-bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory,
-                   unsigned short pointer, char const* name, Tags tags, Directory& result) {
+bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& directory,
+                   unsigned short pointer, char const* name, TagList tags,
+                   DirectoryPointer& result) {
   ValuePointer offset = nullptr;
   if (!findNumber(directory, pointer, offset)) {
     return false;
@@ -89,8 +91,8 @@ bool followPointer(std::shared_ptr<QVStream>& stream, Directory const& directory
   return offset == nullptr || result != nullptr;
 }
 
-bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream, Directory const& mainIFD,
-                 Tags tags, Directory& exifIFD) {
+bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
+                 DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD) {
   if (!followPointer(stream, mainIFD, tag::ExifIFDPointer, "the Exif IFD", tags, exifIFD)) {
     return false;
   }
@@ -99,15 +101,15 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream, Director
                "no {} in {}", TagName{tag::ExifIFDPointer}, placed(mainIFD));
     return true;
   }
-  // A host's class may override what takes it, and keep any part of it.
+  // A host's class may override `storeInfoFromExifIFD` and keep any part of the directory.
   if (!readingOf(*stream).isOwnRecord) {
     exifIFD = static_cast<ReaderDirectory&>(*exifIFD).forHost();
   }
   return record.storeInfoFromExifIFD(exifIFD);
 }
 
-bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std::uint32_t index,
-                Tags tags, Directory& rawIFD) {
+bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainIFD,
+                std::uint32_t index, TagList tags, DirectoryPointer& rawIFD) {
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   if (count <= index) {
@@ -121,7 +123,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, Directory const& mainIFD, std
   return rawIFD != nullptr;
 }
 
-void noteNoEntry(Directory const& directory, unsigned short tag) {
+void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   Journal* const journal = journalOf(directory);
   if (wantsAll(journal) && fieldOf(tag) != nullptr) {
     noteAbsent(journal, {fieldOf(tag)}, QVReason::NotInFile, "no {} in {}", TagName{tag},
@@ -129,9 +131,9 @@ void noteNoEntry(Directory const& directory, unsigned short tag) {
   }
 }
 
-// Below, a directory without a row is a host's, of whose reads nobody keeps notes.
+// Below, a directory without a row is a host's, and no notes are kept of those.
 
-void noteNoValue(Directory const& directory, unsigned short tag, char const* pattern) {
+void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);
   auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
   if (row != nullptr && fieldOf(tag) != nullptr) {
@@ -140,7 +142,7 @@ void noteNoValue(Directory const& directory, unsigned short tag, char const* pat
   }
 }
 
-bool refuseContent(Directory const& directory, unsigned short tag, char const* wanted) {
+bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char const* wanted) {
   auto const* const own = ReaderDirectory::of(*directory);
   auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
   if (row == nullptr) {
@@ -154,7 +156,8 @@ bool refuseContent(Directory const& directory, unsigned short tag, char const* w
 
 bool isReducedImage(ValuePointer newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
 
-bool storeFullImageSize(Directory const& directory, std::int32_t& width, std::int32_t& height) {
+bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
+                        std::int32_t& height) {
   std::int32_t newSubfileType = 0;
   if (!storeRequiredNumber(directory, tag::NewSubfileType,
                            "the raw image must say that it is of full size", newSubfileType)) {

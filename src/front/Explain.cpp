@@ -17,33 +17,33 @@ constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 /// A field that can be absent.
 struct FieldRow {
   char name[22];
-  char origin[18];    ///< The field that it is computed from, if any.
-  unsigned families;  ///< The readers that fill it.
+  std::uint8_t origin;    ///< How many rows below is the field that it is computed from, or 0.
+  std::uint8_t families;  ///< The readers that fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
 
 using M = QVMetadata;
 constexpr FieldRow kFields[] = {
-    {"width", "", kAll, &M::width},
-    {"height", "", kAll, &M::height},
-    {"orientation", "", kAll, &M::orientation},
-    {"dateTimeOriginal", "", kAll & ~unsigned{kCr3}, &M::dateTimeOriginal},
-    {"dateTimeDigitized", "", kTiff, &M::dateTimeDigitized},
-    {"dateTime", "", kTiff | kCr3, &M::dateTime},
-    {"model", "", kCr3, &M::model},
-    {"lensModel", "", kCr3, &M::lensModel},
-    {"iso", "", kCr3, &M::iso},
-    {"apexFNumber", "apertureValue", kCr3, &M::apexFNumber},
-    {"apexExposureTime", "shutterSpeedValue", kCr3, &M::apexExposureTime},
-    {"apertureValue", "", kCr3, &M::apertureValue},
-    {"shutterSpeedValue", "", kCr3, &M::shutterSpeedValue},
-    {"focalLength", "", kCr3, &M::focalLength},
-    {"whiteBalance", "", kCr3, &M::whiteBalance},
-    {"meteringMode", "", kCr3, &M::meteringMode},
-    {"exposureBiasValue", "", kCr3, &M::exposureBiasValue},
-    {"focalLengthIn35mmFilm", "", kCr3, &M::focalLengthIn35mmFilm},
-    {"exposureTime", "", kCr3, &M::exposureTime},
-    {"fNumber", "", kCr3, &M::fNumber},
+    {"width", 0, kAll, &M::width},
+    {"height", 0, kAll, &M::height},
+    {"orientation", 0, kAll, &M::orientation},
+    {"dateTimeOriginal", 0, kAll & ~kCr3, &M::dateTimeOriginal},
+    {"dateTimeDigitized", 0, kTiff, &M::dateTimeDigitized},
+    {"dateTime", 0, kTiff | kCr3, &M::dateTime},
+    {"model", 0, kCr3, &M::model},
+    {"lensModel", 0, kCr3, &M::lensModel},
+    {"iso", 0, kCr3, &M::iso},
+    {"apexFNumber", 2, kCr3, &M::apexFNumber},
+    {"apexExposureTime", 2, kCr3, &M::apexExposureTime},
+    {"apertureValue", 0, kCr3, &M::apertureValue},
+    {"shutterSpeedValue", 0, kCr3, &M::shutterSpeedValue},
+    {"focalLength", 0, kCr3, &M::focalLength},
+    {"whiteBalance", 0, kCr3, &M::whiteBalance},
+    {"meteringMode", 0, kCr3, &M::meteringMode},
+    {"exposureBiasValue", 0, kCr3, &M::exposureBiasValue},
+    {"focalLengthIn35mmFilm", 0, kCr3, &M::focalLengthIn35mmFilm},
+    {"exposureTime", 0, kCr3, &M::exposureTime},
+    {"fNumber", 0, kCr3, &M::fNumber},
 };
 
 bool isAbsent(FieldRow const& row, QVMetadata const& record) {
@@ -63,7 +63,7 @@ QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
                                  : composed("never taken from {} files", {format.kind});
     return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, 0};
   }
-  auto const* const known = journal.absenceOf(row.origin[0] == '\0' ? row.name : row.origin);
+  auto const* const known = journal.absenceOf((&row + row.origin)->name);
   QVNote note = known == nullptr ? QVNote() : *known;
   note.field = row.name;
   return note;
@@ -79,10 +79,10 @@ struct Signature {
   std::uint8_t size;
   char bytes[9];
   char kind[36];
-  unsigned families;  ///< The readers of such files.
+  std::uint8_t families;  ///< The readers of such files.
 };
 
-constexpr unsigned kTiffFamilies = kTiff | kNef | kArw;
+constexpr std::uint8_t kTiffFamilies = kTiff | kNef | kArw;
 
 constexpr Signature kSignatures[] = {
     {0, 4, "II*\0", "a TIFF structure", kTiffFamilies},

@@ -24,8 +24,8 @@ namespace quavel::detail {
 
 namespace {
 
-/// Room for an image of any class: as none adds members to the record, one kind of room serves all,
-/// which keeps ten kinds of shared owner out of the library. It gets its image at once.
+/// Memory for an image of any class. As none of the classes adds members to the record, one type
+/// serves all, which keeps ten kinds of `shared_ptr` owners out of the library.
 struct ImageRoom {
   ImageRoom() {}  // leaves the bytes as they are
   ~ImageRoom() { image->~QVMetadata(); }
@@ -51,7 +51,7 @@ constexpr Format kFormats[] = {
     {"3fr", "3FR", kTiff, make<QV3FRImage>},    {"cr3", "CR3", kCr3, make<QVCR3Image>},
 };
 
-/// ASCII alone: in a Turkish locale the C library would not make "tif" of "TIF".
+/// ASCII only: in a Turkish locale, the C library would not turn "TIF" into "tif".
 char lowerCase(char letter) {
   return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
 }
@@ -74,7 +74,7 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
 }  // namespace
 
 std::string extensionOf(std::string const& path) {
-  // A "." in a folder's name counts too when the file's has none; no format is named so.
+  // When the file's name has no ".", one in a folder's name counts; it never names a format.
   auto const dot = path.rfind('.');
   return dot == std::string::npos ? std::string() : path.substr(dot + 1);
 }

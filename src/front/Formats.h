@@ -15,7 +15,7 @@ namespace detail {
 
 class Journal;
 
-/// A reader, by the fields of the record that it fills.
+/// The readers, told apart by the fields of the record that they fill.
 enum Family : unsigned { kTiff = 1, kNef = 2, kArw = 4, kJpeg = 8, kRaf = 16, kCr3 = 32 };
 
 /// What an extension stands for.
@@ -26,7 +26,7 @@ struct Format {
   std::shared_ptr<QVMetadata> (*makeRecord)();
 };
 
-/// What follows the path's last ".", its case kept; empty when there is no ".".
+/// What follows the path's last ".", in the case it is written in; empty without a ".".
 std::string extensionOf(std::string const& path);
 
 /// The format of an extension in lower case, or null.
@@ -35,13 +35,13 @@ Format const* formatOf(std::string_view extension);
 /// Notes why each absent field of the record is absent.
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
-/// Notes what a refused file, which begins at a position, looks like if it does not fit the format.
+/// Notes what a refused file, which begins at `start`, looks like when that is not the format.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);
 
-/// The record of a file that is the whole of a stream, or null.
+/// The record of the file that the whole stream is, or null.
 std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
                                        std::string const& extension, Journal* journal);
 

@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 namespace {
 
-// A screenful of each, whatever a file holds.
+// A screenful of each, whatever the file holds.
 constexpr std::size_t kMaxSteps = 8;
 constexpr std::size_t kMaxHints = 8;
 

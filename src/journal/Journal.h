@@ -11,8 +11,8 @@
 
 namespace quavel::detail {
 
-/// Collects the notes of one read. The readers state theirs through the functions below, to which
-/// a null journal means that nobody listens: then no text is made.
+/// Collects the notes of one read. The readers state theirs through the functions below. A null
+/// journal means that nobody listens; then no text is made.
 class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
@@ -22,20 +22,20 @@ class Journal {
 
   using Words = std::initializer_list<Word>;
 
-  /// The first refusal counts: one that follows from it says nothing new.
+  /// Only the first refusal counts: later ones follow from it.
   void refuse(QVReason reason, std::int64_t position, char const* pattern, Words words);
-  /// Refuses for want of `count` bytes at `position`: those of what the pattern names.
+  /// Refuses because `count` bytes at `position`, those of what the pattern names, are missing.
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
   /// Counts steps beyond the first few instead of keeping them.
   void passed(std::int64_t position, char const* pattern, Words words);
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
-  /// Tells why a field stays absent, if it does; the last reason counts.
+  /// Says why a field stays absent, in case it does; the last reason counts.
   void absent(char const* field, QVReason reason, char const* pattern, Words words);
 
-  /// The reason given for a field's absence by now, or null.
+  /// The reason given so far for a field's absence, or null.
   QVNote* absenceOf(char const* field);
 
-  /// The size of the data in bytes, which the file is not asked for earlier; -1: not known.
+  /// The size of the data in bytes; -1: not known. Only this asks the system for it.
   std::int64_t dataSize();
   /// Why bytes that end at a position cannot be read: as a reason, and in words.
   QVReason cutReason() const;
@@ -44,10 +44,10 @@ class Journal {
   std::vector<QVNote> notes;
   std::uint64_t furtherSteps = 0;
   char const* format = "";      ///< See QVJournal.
-  int fd = -1;                  ///< Of the file that is read; -1: it is none.
+  int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
-  bool hasReadFailed = false;   ///< The last read of bytes did, for another cause than their end.
-  int systemError = 0;          ///< The `errno` of what failed; 0: nothing did.
+  bool hasReadFailed = false;   ///< The last read failed, other than by the end of the data.
+  int systemError = 0;          ///< The `errno` of the failure; 0: there was none.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);
@@ -56,13 +56,13 @@ class Journal {
   bool isRefused_ = false;
   std::size_t steps_ = 0;
   std::size_t hints_ = 0;
-  std::vector<QVNote> absences_;  // by field, one for each
+  std::vector<QVNote> absences_;  // at most one for each field
 };
 
 /// Whether somebody listens who wants more than the refusal.
 inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
 
-/// States why the read ends. False, for the step to return on the spot.
+/// States why the read ends. Always false, for the step to return at once.
 template <class... Words>
 [[gnu::cold, gnu::noinline]] bool refuse(Journal* journal, QVReason reason, std::int64_t position,
                                          char const* pattern, Words... words) {
@@ -72,7 +72,7 @@ template <class... Words>
   return false;
 }
 
-/// The same when `count` bytes at `position` are not in the data; the pattern names what they are.
+/// The same when the data lacks `count` bytes at `position`; the pattern says what they are.
 template <class... Words>
 [[gnu::cold, gnu::noinline]] bool refuseCut(Journal* journal, std::int64_t position,
                                             std::int64_t count, char const* pattern,

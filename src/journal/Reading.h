@@ -11,11 +11,11 @@ namespace quavel::detail {
 
 class Journal;
 
-/// What a read does as often as the file has it done.
+/// Work that a file can make a read do many times over.
 enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
 
-/// How much of it one read may do. Nothing in the formats limits how many directories, segments or
-/// boxes come before the wanted one; but a file can lead to the same large directory again and
+/// How much of each one read may do. The formats do not limit how many directories, segments or
+/// boxes come before the wanted one, and a file can refer to the same large directory again and
 /// again. The bounds lie far above what cameras write.
 inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories opened, each with up to eleven values far apart
@@ -24,10 +24,10 @@ inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 24U,  // segments or boxes: 32 MB of zeros in a JPEG stay below
 };
 
-/// One read of a file: the work that it has done, and who listens.
+/// One read of a file: the work done so far, and the journal.
 class Reading {
  public:
-  /// Counts work. False, the refusal stated: that was too much.
+  /// Counts work. False: that was too much, and the refusal has been stated.
   bool spend(Work work, std::uint64_t amount) {
     std::uint64_t& done = done_[static_cast<std::size_t>(work)];
     done += amount;
@@ -36,7 +36,7 @@ class Reading {
 
   Journal* journal = nullptr;  ///< Null: nobody listens.
 
-  /// The library has made the record itself, so no class of a host's sees the directories.
+  /// The library made the record itself, so no class of the host's sees the directories.
   bool isOwnRecord = false;
 
  private:
@@ -45,8 +45,8 @@ class Reading {
   std::array<std::uint64_t, 4> done_ = {};
 };
 
-/// The time during which a stream serves a read. What readers or a host's own code call on the way
-/// joins the read instead of beginning another.
+/// The span of time in which a stream serves a read. Public operations called meanwhile, by readers
+/// or by a host's own code, join that read instead of beginning another.
 class ReadScope {
  public:
   explicit ReadScope(QVStream& stream) : stream_(stream), outer_(stream.reading_.current) {
@@ -54,7 +54,7 @@ class ReadScope {
       stream_.reading_.current = &own_;
     }
   }
-  /// For a record of the library's own: a read by itself, even inside another.
+  /// For a record that the library made: a read of its own, even within another.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
     own_.journal = journal;
     own_.isOwnRecord = true;
@@ -73,7 +73,7 @@ class ReadScope {
   Reading own_;
 };
 
-/// The read that the stream serves. Every public operation that can lead to here opens a scope.
+/// The read that the stream serves. Every public operation that can get here opens a scope.
 inline Reading& readingOf(QVStream const& stream) { return *ReadScope::current(stream); }
 
 /// The journal of the read that the stream serves, or null.
@@ -82,8 +82,8 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Remembers for the refusal that may follow whether bytes could be read, and the system's error,
-/// if it is known, when they could not.
+/// Remembers, for a refusal that may follow, whether the last read failed, and with which error of
+/// the system, if that is known.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.

@@ -8,7 +8,7 @@ namespace {
 
 constexpr std::size_t kMaxTextLength = 500;
 
-// Offsets below it read the same in both notations.
+// Smaller offsets look the same in both notations.
 constexpr std::int64_t kFirstHexadecimal = 10;
 
 void appendHex(std::string& out, std::uint64_t number, int minDigits) {

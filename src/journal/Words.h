@@ -47,8 +47,8 @@ void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 
-/// A part of a note's text. It refers to a value of a type that an `append` above, or one beside
-/// the type itself, puts into words; that is done only for a note that is kept.
+/// A part of a note's text. It refers to a value that one of the `append` functions, above or next
+/// to the value's own type, puts into words, which happens only for a note that is kept.
 class Word {
  public:
   template <class Value>

@@ -13,8 +13,8 @@
 
 namespace quavel::detail {
 
-/// Whether the numbers that come from the stream are to be reversed on this host.
-inline bool isReversed(QVStream const& stream) {
+/// Whether the bytes of numbers from the stream must be reversed on this host.
+inline bool needsReversal(QVStream const& stream) {
   bool const isKnown =
       stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
   return isKnown && stream.byteOrder != stream.hostOrder;
@@ -30,7 +30,7 @@ inline std::uint32_t reversed(std::uint32_t bits) { return __builtin_bswap32(bit
 inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bits); }
 #endif
 
-/// Reverses a number by the unsigned integer as wide as it, without a look at what its bytes mean.
+/// Reverses the bytes of a number of any type through an unsigned integer of the same size.
 template <class Number>
 void reverseBytes(Number* number) {
   constexpr std::size_t kSize = sizeof(Number);
@@ -52,7 +52,7 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// Copies bytes. Most reads are of a number: copied by its known size, it takes no call.
+/// Copies bytes. Most reads are of one number, which takes no call when its size is a constant.
 inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std::size_t count) {
   switch (count) {
     case 2:
@@ -69,12 +69,12 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// Beyond the last offset to be sought, enough can be read that `long` still counts: more than the
-// entries of a directory take.
+// What may be read after a seek to the last offset allowed, with a position that `long` still
+// holds: more than the entries of a directory take.
 inline constexpr long kReadBeyond = 1L << 20U;
 
 /// Moves the stream to an offset. False: `long`, which has 32 bits on some systems, cannot hold it.
-/// The stream would stay where it is, and what it reads there is not what was wanted.
+/// Then the stream stays where it is, and nothing must be read from there.
 inline bool seek(QVStream& stream, std::int64_t offset) {
   using Limits = std::numeric_limits<long>;
   if (sizeof(long) < sizeof(offset) &&
@@ -85,7 +85,7 @@ inline bool seek(QVStream& stream, std::int64_t offset) {
   return true;
 }
 
-/// Reads in one piece. False: the stream delivers another number of bytes than asked for.
+/// Reads in one piece. False: the stream does not deliver exactly as many bytes as asked for.
 inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t count) {
   std::int64_t const delivered = stream.readBuffer(destination, count);
   if (delivered == static_cast<std::int64_t>(count)) {
@@ -97,21 +97,21 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   return false;
 }
 
-/// Reads until `count` bytes are there or the data ends, for a stream may deliver less at a time
-/// than is asked for. Returns how many there are.
+/// Reads until `count` bytes are received or the data ends, since a stream may deliver fewer at a
+/// time than asked for. Returns how many were received.
 inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::size_t count) {
-  std::size_t there = 0;
-  while (there < count) {
-    std::int64_t const delivered = stream.readBuffer(destination + there, count - there);
-    if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - there) {
+  std::size_t received = 0;
+  while (received < count) {
+    std::int64_t const delivered = stream.readBuffer(destination + received, count - received);
+    if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - received) {
       if (delivered != 0) {
-        noteReadResult(stream, -1, 0);  // a count beyond what was asked for is not one
+        noteReadResult(stream, -1, 0);  // more than asked for is not a count either
       }
       break;
     }
-    there += static_cast<std::size_t>(delivered);
+    received += static_cast<std::size_t>(delivered);
   }
-  return there;
+  return received;
 }
 
 }  // namespace quavel::detail

@@ -1,5 +1,7 @@
 #include "stream/PositionedFile.h"
 
+#include <cerrno>
+
 #include "quavel/QVReadAheadStream.h"
 #include "system/File.h"
 
@@ -11,8 +13,8 @@ namespace {
 constexpr int kReadsOfAWalk = 16;
 constexpr std::int64_t kForeseen = std::int64_t{4} << 20;
 
-// The metadata of most files lies in the first block. What lies beyond is a directory here and a
-// segment there. docs/speed.md tells how both sizes were measured.
+// The metadata of most files lies in the first block; beyond it are single directories and
+// segments. docs/speed.md shows how both sizes were measured.
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
@@ -21,7 +23,7 @@ struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
 
   PositionedFile file;
-  // Shares the ownership of nothing: the file lives as long as this does.
+  // Owns nothing: the file lives as long as this object.
   QVReadAheadStream ahead{std::shared_ptr<QVStream>(std::shared_ptr<void>(), &file),
                           kFirstBlockSize, kNextBlockSize};
 };
@@ -32,12 +34,13 @@ PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 void PositionedFile::advise() {
   ++reads_;
-  // Left to itself, a system fetches several times what is asked for at a file's start.
+  // By default, a system fetches several times what is asked for at the start of a file.
   if (reads_ == 1) {
     file::expectFewReads(fd);
   }
-  if (reads_ == kReadsOfAWalk) {
+  if (reads_ >= kReadsOfAWalk && position_ >= foreseenEnd_) {
     file::expectReads(fd, position_, kForeseen);
+    foreseenEnd_ = position_ + kForeseen;
   }
 }
 
@@ -46,9 +49,27 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   advise();
-  std::int64_t const delivered = file::readAt(fd, destination, count, position_);
+  std::int64_t delivered = file::readAt(fd, destination, count, position_);
+  if (delivered == -1 && errno == ESPIPE) {
+    delivered = readPipe(destination, count);
+  }
   position_ += delivered > 0 ? delivered : 0;
   return delivered;
+}
+
+std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t count) {
+  if (position_ != pipePosition_) {
+    return -1;
+  }
+  // Whole: what has arrived by now depends on the writer.
+  std::size_t received = 0;
+  std::int64_t delivered = 1;
+  while (received < count && delivered > 0) {
+    delivered = file::read(fd, destination + received, count - received);
+    received += delivered > 0 ? static_cast<std::size_t>(delivered) : 0;
+  }
+  pipePosition_ += static_cast<std::int64_t>(received);
+  return received == 0 ? delivered : static_cast<std::int64_t>(received);
 }
 
 long PositionedFile::getOffset() {

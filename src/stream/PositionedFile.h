@@ -8,12 +8,13 @@
 
 namespace quavel::detail {
 
-/// Some file systems refuse positions beyond a limit of their own, none a smaller one.
+/// File systems may refuse positions beyond a limit of their own; none refuses one up to this.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
-/// A file for a few reads here and there: a read takes its position along, so that a seek costs
-/// nothing, and the system is asked not to read on by itself. A file that takes many reads is
-/// walked to its end, and the system is asked to fetch what follows. A pipe is read front to back.
+/// A file for a few scattered reads. Each read names its position, so that a seek costs nothing,
+/// and the system is asked not to read ahead. A file that takes many reads is being walked to its
+/// end, so the system is then asked to fetch what follows. A pipe is
+/// read front to back; a read anywhere else fails.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);
@@ -24,13 +25,16 @@ class PositionedFile : public QVFStream {
 
  private:
   void advise();
+  std::int64_t readPipe(std::uint8_t* destination, std::size_t count);
 
-  std::int64_t position_ = 0;  // absolute
+  std::int64_t position_ = 0;      // absolute
+  std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
+  std::int64_t foreseenEnd_ = 0;   // where the system no longer expects reads
   int reads_ = 0;
 };
 
-/// The file at `path` as every reader by path gets it: positioned, and read ahead. `fd` gets its
-/// descriptor, to be asked only; -1: it cannot be opened, and `errno` says why.
+/// The file at `path` as the readers by path get it, read ahead. `fd` is set to its descriptor,
+/// which stays the stream's; -1: the file cannot be opened, and `errno` says why.
 std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
 
 }  // namespace quavel::detail

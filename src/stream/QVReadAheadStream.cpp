@@ -13,15 +13,15 @@ namespace quavel {
 
 namespace {
 
-/// Moves to where `long` does not reach, by the base. Returns the position, or -1 when refused.
-std::int64_t seekByBase(QVStream& source, std::int64_t target) {
+/// Moves to where `long` does not reach, by the base. False: the stream is not there afterwards.
+bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = static_cast<std::int64_t>(static_cast<std::uint64_t>(base) +
                                                 static_cast<std::uint64_t>(target));
   source.setOffset(0);
-  bool const isAccepted = source.getOffset() == 0;
+  bool const isThere = source.getOffset() == 0;
   source.baseOffset = base;
-  return isAccepted ? target : -1;
+  return isThere;
 }
 
 }  // namespace
@@ -63,13 +63,14 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  if (target != static_cast<long>(target)) {
-    sourcePosition_ = seekByBase(*source_, target);
-  } else {
+  // A source that refuses the seek stays at 0. One that goes no further than its end accepts it.
+  sourcePosition_ = -1;
+  source_->setOffset(0);
+  if (target == static_cast<long>(target)) {
     source_->setOffset(static_cast<long>(target));
-    sourcePosition_ = source_->getOffset();
+    return source_->getOffset() != 0;
   }
-  return sourcePosition_ == target;
+  return seekByBase(*source_, target) || source_->getOffset() != 0;
 }
 
 std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_t count) {
@@ -80,7 +81,7 @@ std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_
 std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destination,
                                         std::size_t count) {
   auto const skipped = static_cast<std::uint64_t>(position_ - block.start);
-  if (position_ < block.start || skipped >= block.size) {
+  if (count == 0 || position_ < block.start || skipped >= block.size) {
     return 0;
   }
   std::size_t const copied = std::min(count, block.size - static_cast<std::size_t>(skipped));
@@ -99,17 +100,17 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[longest]);
   }
-  // Data that goes on where the source stands is likely to go on further.
+  // Reads that continue where the source stands are likely to continue further.
   fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // whatever happens from here on, what was there is overwritten
-  errno = 0;       // a source of the host's need not tell why it fails
+  block.size = 0;  // its bytes are overwritten, whatever happens
+  errno = 0;       // a host's stream need not say why it fails
   std::int64_t delivered = readSource(block, wanted);
-  if (delivered < 0) {
-    // What is broken may lie beyond the bytes that are needed.
-    delivered = readSource(block, std::min(needed, wanted));
+  if (delivered < 0 && needed < wanted) {
+    // The fault may lie beyond the bytes that are needed.
+    delivered = readSource(block, needed);
   }
   detail::noteReadResult(*this, delivered, errno);
   block.start = position_;

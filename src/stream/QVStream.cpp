@@ -4,7 +4,7 @@
 
 namespace quavel {
 
-using detail::isReversed;
+using detail::needsReversal;
 using detail::reverseBytes;
 
 namespace {
@@ -23,7 +23,7 @@ bool readNumber(QVStream& stream, Number* number) {
     return false;
   }
   if constexpr (sizeof(Number) > 1) {
-    if (isReversed(stream)) {
+    if (needsReversal(stream)) {
       reverseBytes(number);
     }
   }

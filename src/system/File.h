@@ -9,8 +9,6 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-#include <cerrno>
 #endif
 
 // What the library asks of the system: files, by descriptors and with 64-bit positions. -1 is a
@@ -41,11 +39,10 @@ inline std::int64_t read(int fd, std::uint8_t* destination, std::size_t count) {
   return ::read(fd, destination, count);
 }
 
-/// At a position, if the file has positions: a pipe is read on.
+/// At a position, which a pipe does not have: ESPIPE.
 inline std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count,
                            std::int64_t position) {
-  std::int64_t const delivered = ::pread(fd, destination, count, position);
-  return delivered == -1 && errno == ESPIPE ? read(fd, destination, count) : delivered;
+  return ::pread(fd, destination, count, position);
 }
 
 inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }

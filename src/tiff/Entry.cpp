@@ -4,7 +4,7 @@
 
 namespace quavel::detail {
 
-Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : isThere_(true) {
+Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : exists_(true) {
   if (entry.values) {
     shared_ = entry.values->data();
     size_ = entry.values->size();
@@ -12,7 +12,7 @@ Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : isThere_(true) {
 }
 
 bool Entry::convertToString(std::string& out) const {
-  // As long as it can get, then cut: appending would ask for room at each character.
+  // Resized to the longest it can get, then cut: appending would check the capacity each time.
   out.resize(size_);
   char* const text = out.data();
   std::size_t length = 0;

@@ -15,15 +15,15 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// An entry's values where they lie in a directory of either kind, whose life it must not exceed;
-/// or no entry.
+/// A view of an entry's values, in a reader's directory or a host's, which must outlive it; or no
+/// entry.
 class Entry {
  public:
   Entry() = default;
   explicit Entry(QVTiffImageFileDirectoryEntry const& entry);
-  Entry(ValuePointer values, std::size_t count) : isThere_(true), values_(values), size_(count) {}
+  Entry(ValuePointer values, std::size_t count) : exists_(true), values_(values), size_(count) {}
 
-  explicit operator bool() const { return isThere_; }
+  explicit operator bool() const { return exists_; }
 
   /// An UNDEFINED entry holds no values.
   std::size_t size() const { return size_; }
@@ -33,8 +33,8 @@ class Entry {
   bool convertToString(std::string& out) const;
 
  private:
-  bool isThere_ = false;
-  ValuePointer values_ = nullptr;  // one beside the other, or
+  bool exists_ = false;
+  ValuePointer values_ = nullptr;  // side by side, or
   std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;
   std::size_t size_ = 0;
 };

@@ -13,11 +13,11 @@ namespace quavel::detail {
 
 namespace {
 
-// Values, of 9 bytes. The wanted ones of most files are fewer, and allocators keep blocks of up to
-// 1 KB at hand.
+// Values, of 9 bytes each. Most files have fewer wanted ones, and allocators are quick with blocks
+// of up to 1 KB.
 constexpr std::size_t kFirstCapacity = 112;
 
-// An entry count is only a claim.
+// An entry count is only what the file claims.
 constexpr std::size_t kMaxReservedRows = 256;
 
 bool refuseCount(Journal* journal, EntryTable const& table) {
@@ -40,7 +40,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   rows_.reserve(std::min({std::size_t{entryCount_}, wanted.count(), kMaxReservedRows}));
   values_.reserve(kFirstCapacity);
   EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
-  for (; !walk.isAtEnd() && !wanted.areMet(); walk.advance()) {
+  for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
     if (!walk.hasTag()) {
       return refuseCut(journal_, walk.position(), kEntryTypePosition, "entry {} of {} of {}",
                        walk.number(), entryCount_, PlacedDirectory{this});
@@ -49,7 +49,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     if (!wanted.take(tag)) {
       continue;
     }
-    // Where the entry's own bytes end: a stream that refuses a seek to the values stays there.
+    // To the end of the entry itself: a stream that refuses the seek to its values stays there.
     RawEntry entry;
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
@@ -73,7 +73,7 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
     return refuseEntry(row, entry);
   }
   if (entry.typeCode == kUndefinedCode) {
-    row.field = undefinedField(entry, isReversed(stream));
+    row.field = undefinedField(entry, needsReversal(stream));
   } else if (!readingOf(stream).spend(Work::Values, entry.count)) {
     return false;
   } else if (!readValues(stream, entry, values_)) {
@@ -83,7 +83,7 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
   return true;
 }
 
-bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, Tags tags,
+bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList tags,
                               std::uint32_t* nextIFDOffset) {
   if (!seek(stream, offset)) {
     return refuseCount(readingOf(stream).journal, *this);
@@ -123,7 +123,7 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
   if (journal_ == nullptr) {
     return false;
   }
-  std::int64_t const begin = stream.baseOffset + valueOffset(entry, isReversed(stream));
+  std::int64_t const begin = stream.baseOffset + valueOffset(entry, needsReversal(stream));
   std::int64_t const end = begin + static_cast<std::int64_t>(sizeOfValues(entry));
   return refuse(journal_, journal_->cutReason(), begin,
                 "{}: its {} would begin at {} and end at {}, but {}", PlacedEntry{*this, row},
@@ -131,7 +131,7 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
                 journal_->cutText(end));
 }
 
-Entry findEntry(Directory const& directory, unsigned short tag) {
+Entry findEntry(DirectoryPointer const& directory, unsigned short tag) {
   if (auto const* const own = ReaderDirectory::of(*directory)) {
     return own->table.entry(tag);
   }

@@ -22,8 +22,8 @@ namespace detail {
 
 class Journal;
 
-/// The wanted entries of a directory as they are read, their values side by side. What hosts get,
-/// a map of entries whose every part they may keep, is made of it.
+/// The wanted entries of a directory as they are read, their values side by side. The map that
+/// hosts get, whose every entry and value they may keep, is made from it.
 class EntryTable {
  public:
   struct Row {
@@ -31,8 +31,8 @@ class EntryTable {
     std::uint16_t typeCode;
     std::uint32_t count;
     std::int64_t position;  ///< Of the entry, in the file.
-    std::uint32_t field;    ///< UNDEFINED: its bytes as they lie in the file, or their offset.
-    std::uint32_t first;    ///< Index of its first value; UNDEFINED has none.
+    std::uint32_t field;    ///< UNDEFINED: its bytes as in the file, or their offset.
+    std::uint32_t first;    ///< Index of its first value, if it has any.
 
     std::uint32_t valueCount() const { return typeCode == kUndefinedCode ? 0 : count; }
   };
@@ -41,12 +41,13 @@ class EntryTable {
   EntryTable(DirectoryName const& name, std::int64_t position) : name_(name), position_(position) {}
 
   /// Reads the entry count at the stream's position, which is the directory's, and the wanted
-  /// entries, until all were met; once. True: the stream stands after the last entry. False: the
-  /// count, a tag or a wanted entry cannot be read, or the read has done too much work.
+  /// entries, until all have been met. To be called once. True: the stream stands after the last
+  /// entry. False: the count, a tag or a wanted entry cannot be read, or the read has done too much
+  /// work.
   bool read(QVStream& stream, WantedTags& wanted);
 
-  /// The same at an offset, then the next directory's offset. False too: that cannot be read.
-  bool readWithNext(QVStream& stream, std::uint32_t offset, Tags tags,
+  /// The same at an offset, then the next directory's offset. Also false when that cannot be read.
+  bool readWithNext(QVStream& stream, std::uint32_t offset, TagList tags,
                     std::uint32_t* nextIFDOffset);
 
   /// The first row with the tag, or null.
@@ -62,7 +63,7 @@ class EntryTable {
   }
 
   using Map = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
-  /// Gives the values away: the table has none afterwards.
+  /// Moves the values out: the table has none afterwards.
   std::shared_ptr<Map> takeEntries();
 
   DirectoryName const& name() const { return name_; }
@@ -83,17 +84,17 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
-// An entry as hosts get it: each value can be kept by itself.
+// An entry as hosts get it: each value can outlive the others.
 
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
-/// Some of a block's values one by one; each keeps the block.
+/// Pointers to some of a block's values; each shares the ownership of the block.
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// The field of an UNDEFINED entry: up to 4 bytes as they lie in the file, missing ones as 0, or
-/// the offset of more.
+/// The field of an UNDEFINED entry: up to 4 bytes as in the file, missing ones as 0, or the offset
+/// of more.
 std::uint32_t undefinedField(RawEntry const& entry, bool isReversed);
 
 /// Stores such a field.

@@ -9,14 +9,13 @@
 
 namespace quavel::detail {
 
-/// A walk over a directory's entries, which takes from the stream as many at a time as its buffer
-/// holds.
+/// A walk over a directory's entries, which reads as many at a time as its buffer holds.
 class EntryWalk {
  public:
   /// The stream stands at the first of `count` entries, which is at `position` in the file.
   EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
-        isReversed_(isReversed(stream)),
+        isReversed_(needsReversal(stream)),
         bufferOffset_(stream.getOffset()),
         position_(position),
         count_(count),
@@ -38,7 +37,7 @@ class EntryWalk {
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
-  /// What follows the tag. False: the type or the count is not in the data.
+  /// What follows the tag. False: the data ends before the type or the count does.
   bool readRest(RawEntry* entry) const {
     if (!isBuffered(kEntryFieldPosition)) {
       return false;

@@ -41,7 +41,7 @@ void storeUndefined(std::uint32_t count, std::uint32_t field,
 }
 
 std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
-  // One block for all values, which lives as long as any of them is kept.
+  // One block for all values; it lives as long as anyone keeps one of them.
   auto const block = std::make_shared<ValueBlock>(std::move(values_));
   auto map = std::make_shared<Map>();
   for (Row const& row : rows_) {
@@ -57,7 +57,7 @@ std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
   return map;
 }
 
-Directory ReaderDirectory::forHost() {
+DirectoryPointer ReaderDirectory::forHost() {
   auto directory = std::make_shared<QVTiffImageFileDirectory>();
   directory->nextIFDOffset = nextIFDOffset;
   directory->entries = table.takeEntries();

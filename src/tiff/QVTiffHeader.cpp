@@ -9,7 +9,7 @@ namespace quavel {
 
 namespace {
 
-// Each reads the same in either byte order.
+// Each is the same in either byte order.
 constexpr unsigned short kLittleEndianMark = 0x4949;  // "II"
 constexpr unsigned short kBigEndianMark = 0x4d4d;     // "MM"
 

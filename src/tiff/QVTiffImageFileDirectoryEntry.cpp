@@ -25,9 +25,9 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   entry.field = field.data();
   entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Bytes in the field are stored even when some are missing; an offset is whole or none.
+    // Bytes in the field are stored even when some are missing, an offset only when it is whole.
     if (entry.count <= kEntryFieldSize || isWhole(entry)) {
-      storeUndefined(entry.count, undefinedField(entry, isReversed(*stream)), *this);
+      storeUndefined(entry.count, undefinedField(entry, needsReversal(*stream)), *this);
     }
     return isWhole(entry);
   }

@@ -13,10 +13,10 @@ namespace quavel {
 
 namespace {
 
-using Value = QVTiffImageFileDirectoryEntryValue;
+using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
 template <class T>
-T stored(Value const& value) {
+T stored(EntryValue const& value) {
   T result;
   std::memcpy(&result, value.value, sizeof(T));
   return result;
@@ -24,7 +24,7 @@ T stored(Value const& value) {
 
 /// Reads one number of type T into the value's storage, `position` bytes in.
 template <class T>
-bool readInto(Value& value, QVStream& stream, bool (QVStream::*readNumber)(T*),
+bool readInto(EntryValue& value, QVStream& stream, bool (QVStream::*readNumber)(T*),
               std::size_t position = 0) {
   T number{};
   if (!(stream.*readNumber)(&number)) {
@@ -42,7 +42,7 @@ std::int32_t quotient(SRational const& fraction) {
   if (fraction.denominator == 0) {
     return 0;
   }
-  // 64 bits hold the one quotient that 32 bits do not; cutting it gives the numerator back.
+  // 64 bits hold the one quotient that 32 bits cannot; truncated, it is the numerator again.
   return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
 }
 
@@ -60,10 +60,10 @@ Integer truncated(double number) {
   return static_cast<Integer>(number);
 }
 
-/// Gives what the value holds, as what it is, to a conversion. UNDEFINED and what is not a type,
-/// for `type` is public, hold nothing: the result is 0.
+/// Passes the value, in its own type, to a conversion. 0 for UNDEFINED and for an unknown type,
+/// which the public `type` may be set to.
 template <class Convert>
-auto converted(Value const& value, Convert const& convert) -> decltype(convert(0)) {
+auto converted(EntryValue const& value, Convert const& convert) -> decltype(convert(0)) {
   switch (value.type) {
     case EntryValueType::BYTE:
       return convert(stored<std::uint8_t>(value));
@@ -92,10 +92,10 @@ auto converted(Value const& value, Convert const& convert) -> decltype(convert(0
   return 0;
 }
 
-/// The value's low 32 bits, integers widened by their own sign; floats saturate at the limits of
-/// `Integer`, of 32 bits too.
+/// The value's low 32 bits. Integers are widened by their own sign; floats saturate at the limits
+/// of `Integer`, which also has 32 bits.
 template <class Integer>
-std::uint32_t to32Bits(Value const& value) {
+std::uint32_t to32Bits(EntryValue const& value) {
   return converted(value, [](auto number) {
     using Number = decltype(number);
     if constexpr (std::is_integral_v<Number>) {
@@ -121,7 +121,7 @@ Float rounded(Number number) {
 }
 
 template <class Float>
-Float toFloat(Value const& value) {
+Float toFloat(EntryValue const& value) {
   return converted(value, [](auto number) {
     if constexpr (std::is_arithmetic_v<decltype(number)>) {
       return rounded<Float>(number);
@@ -131,7 +131,7 @@ Float toFloat(Value const& value) {
   });
 }
 
-std::uint32_t bitsOf(Value const& value) { return to32Bits<std::int32_t>(value); }
+std::uint32_t bitsOf(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace
 
@@ -150,7 +150,7 @@ bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream)
       return readInto(*this, *stream, &QVStream::readLong) &&
              readInto(*this, *stream, &QVStream::readLong, 4);  // a fraction is two numbers
     default:
-      return false;  // UNDEFINED, or what is not a type: `type` is public
+      return false;  // UNDEFINED, or an unknown type: `type` is public
   }
 }
 

@@ -7,7 +7,7 @@ namespace quavel::detail {
 
 namespace {
 
-using Value = QVTiffImageFileDirectoryEntryValue;
+using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
 // Bytes of values read at a time: whole values of any size.
 constexpr std::size_t kPartSize = 512;
@@ -19,7 +19,7 @@ void storeNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* desti
 }
 
 /// Takes one value, whose type is set, from the bytes of a file.
-void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, Value& value) {
+void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, EntryValue& value) {
   switch (size) {
     case 1:
       value.value[0] = bytes[0];
@@ -40,10 +40,10 @@ void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, Va
 
 }  // namespace
 
-bool readValues(QVStream& stream, RawEntry const& entry, std::vector<Value>& values) {
+bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>& values) {
   EntryValueType const type = fieldTypeToValueType[entry.typeCode];
   std::size_t const size = kValueSizes[static_cast<std::size_t>(type)];
-  bool const isReversed = detail::isReversed(stream);
+  bool const isReversed = needsReversal(stream);
   bool const isInField = entry.count * size <= kEntryFieldSize;
   if (!isInField && !seek(stream, valueOffset(entry, isReversed))) {
     return false;
@@ -57,7 +57,7 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<Value>& val
     }
     std::uint8_t const* bytes = isInField ? entry.field : part.data();
     values.resize(values.size() + length);
-    Value* value = values.data() + (values.size() - length);
+    EntryValue* value = values.data() + (values.size() - length);
     for (std::size_t i = 0; i < length; ++i, ++value, bytes += size) {
       value->type = type;
       storeValue(bytes, size, isReversed, *value);

@@ -23,22 +23,22 @@ inline constexpr std::int64_t kEntryCountSize =
 
 inline constexpr std::uint16_t kUndefinedCode = 7;
 
-/// A directory entry behind its tag, before it is known what of it is used.
+/// What follows the tag in a directory entry, not yet interpreted.
 struct RawEntry {
   std::uint16_t typeCode;
   std::uint32_t count;
   std::uint8_t const* field;  ///< The values, or their offset.
-  std::size_t fieldSize;      ///< Bytes that the data holds of it; 4 unless the data ends there.
+  std::size_t fieldSize;      ///< How many of its 4 bytes the data holds.
 };
 
-// The wanted entries of real files hold some hundred values at most, the longest being texts. The
+// The wanted entries of real files hold some hundred values at most; the longest are texts. The
 // bound keeps what a damaged count can make an entry allocate below 2 MB.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
 /// Bytes of one value in a file, by field types.
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
-/// Whether it is the code of a field type.
+/// Whether the code stands for a field type.
 inline bool isKnown(std::uint16_t typeCode) {
   return typeCode != 0 && typeCode < fieldTypeToValueType.size();
 }
@@ -55,12 +55,12 @@ inline std::uint64_t sizeOfValues(RawEntry const& entry) {
   return std::uint64_t{entry.count} * (entry.typeCode == kUndefinedCode ? 1 : kValueSizes[type]);
 }
 
-/// How many bytes of the field an entry of a known type makes use of.
+/// How many bytes of the field an entry of a known type uses.
 inline std::size_t usedFieldSize(RawEntry const& entry) {
   return static_cast<std::size_t>(std::min<std::uint64_t>(sizeOfValues(entry), kEntryFieldSize));
 }
 
-/// Whether all that it uses of the field is in the data.
+/// Whether the data holds all the bytes of the field that the entry uses.
 inline bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
 /// The offset in the field of an entry that is whole.
@@ -68,8 +68,8 @@ inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }
 
-/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: they are not all in
-/// the data.
+/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: the data
+/// does not hold them all.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 

@@ -6,10 +6,10 @@
 // The tags read from TIFF 6.0 and Exif directories, under their standard names.
 namespace quavel::tag {
 
-/// A tag, its name for notes, and the record's field that an entry under it gives, if any.
+/// A tag, its name for notes, and the record's field that its entry gives, if any.
 struct Tag {
   unsigned short number;
-  char name[26];  // texts in place: pointers would be relocated whenever the library is loaded
+  char name[26];  // an array: pointers would be relocated each time the library is loaded
   char field[22] = "";
 
   constexpr operator unsigned short() const { return number; }
@@ -41,17 +41,17 @@ inline constexpr Tag FocalLengthIn35mmFilm = {0xa405, "FocalLengthIn35mmFilm",
                                               "focalLengthIn35mmFilm"};
 inline constexpr Tag LensModel = {0xa434, "LensModel", "lensModel"};
 
-// A RAF file's raw section: the vendor's directory and what it says of the raw image.
+// In a RAF file's raw section: the vendor's directory, and the raw image's size in it.
 inline constexpr Tag RafDirectoryPointer = {0xf000, "(the vendor directory)"};
 inline constexpr Tag RafImageWidth = {0xf001, "(the raw image's width)", "width"};
 inline constexpr Tag RafImageLength = {0xf002, "(the raw image's height)", "height"};
 
 template <class... Tags>
-constexpr std::array<Tag, sizeof...(Tags)> listOf(Tags const&... tags) {
+constexpr std::array<Tag, sizeof...(Tags)> arrayOf(Tags const&... tags) {
   return {tags...};
 }
 
-inline constexpr auto kAll = listOf(
+inline constexpr auto kAll = arrayOf(
     NewSubfileType, ImageWidth, ImageLength, Model, Orientation, DateTime, SubIFDs, ExposureTime,
     FNumber, ExifIFDPointer, ISOSpeedRatings, DateTimeOriginal, DateTimeDigitized,
     OffsetTimeOriginal, ShutterSpeedValue, ApertureValue, ExposureBiasValue, MeteringMode,

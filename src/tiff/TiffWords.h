@@ -24,7 +24,7 @@ struct TypedCount {
 struct DirectoryName {
   char const* name = "the directory";
   char const* structure = nullptr;  ///< Null for the structure that is the whole file.
-  std::uint32_t number = 0;         ///< Of so many like it; 0: it is the only one.
+  std::uint32_t number = 0;         ///< Among `count` of its kind; 0: it is the only one.
   std::uint32_t count = 0;
 };
 
@@ -32,7 +32,7 @@ void append(std::string& out, TagName tag);
 void append(std::string& out, TypedCount values);
 void append(std::string& out, DirectoryName const& directory);
 
-/// The record's field that an entry under the tag gives; null for none.
+/// The record's field that the tag's entry gives; null for none.
 char const* fieldOf(unsigned short tag);
 
 }  // namespace quavel::detail

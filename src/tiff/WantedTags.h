@@ -11,14 +11,14 @@
 namespace quavel::detail {
 
 /// A list of tags as readers write it.
-using Tags = std::initializer_list<unsigned short>;
+using TagList = std::initializer_list<unsigned short>;
 
-/// The tags that the reader of a directory still wants: each until it is met. None listed means
-/// all, always.
+/// The tags that the reader of a directory still wants, each until it is met. An empty list wants
+/// all tags, again and again.
 class WantedTags {
  public:
-  WantedTags(unsigned short const* tags, std::size_t count) : areAll_(count == 0) {
-    if (areAll_) {
+  WantedTags(unsigned short const* tags, std::size_t count) : wantsAll_(count == 0) {
+    if (wantsAll_) {
       mask_ = ~std::uint64_t{0};
     } else if (count > kShortList) {
       longList_ = std::make_unique<LongList>();
@@ -28,22 +28,22 @@ class WantedTags {
     }
   }
 
-  /// Whether the tag is wanted. Having been met, a listed tag is wanted no longer.
+  /// Whether the tag is wanted. A listed tag is wanted only once.
   bool take(unsigned short tag) {
     if ((mask_ & bitOf(tag)) == 0) {
       return false;
     }
-    return areAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
+    return wantsAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
   }
 
   /// How many are still to be met; more than a directory holds when all are wanted.
-  std::size_t count() const { return areAll_ ? SIZE_MAX : left_; }
+  std::size_t count() const { return wantsAll_ ? SIZE_MAX : left_; }
 
-  /// Whether there is a list and all that it names was met.
-  bool areMet() const { return left_ == 0 && !areAll_; }
+  /// Whether there is a list and all its tags have been met.
+  bool allMet() const { return left_ == 0 && !wantsAll_; }
 
  private:
-  static constexpr std::size_t kShortList = 16;  // no format's own list is longer
+  static constexpr std::size_t kShortList = 16;  // no reader's list is longer
   using LongList = std::bitset<std::size_t{UINT16_MAX} + 1>;
 
   static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
@@ -82,8 +82,8 @@ class WantedTags {
     return i;
   }
 
-  bool const areAll_;
-  std::uint64_t mask_ = 0;  // says of most unwanted tags that they are not listed
+  bool const wantsAll_;
+  std::uint64_t mask_ = 0;  // rules out most unwanted tags
   std::size_t left_ = 0;    // listed tags that are still to be met
   std::array<unsigned short, kShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null for a short one
