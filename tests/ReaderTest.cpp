@@ -114,12 +114,11 @@ TEST(Metadata, TakesDatesFromAHostsDirectory) {
 TEST(Metadata, PrefersTheOriginalDate) {
   QVTiffImage record;
   EXPECT_EQ(record.captureDate(), "");
-  record.dateTime = "file";
-  EXPECT_EQ(record.captureDate(), "file");
-  record.dateTimeDigitized = "digitized";
-  EXPECT_EQ(record.captureDate(), "digitized");
-  record.dateTimeOriginal = " ";
-  EXPECT_EQ(record.captureDate(), " ");
+  for (auto const date :
+       {&QVMetadata::dateTime, &QVMetadata::dateTimeDigitized, &QVMetadata::dateTimeOriginal}) {
+    record.*date = date == &QVMetadata::dateTime ? "file" : record.captureDate() + " ";
+    EXPECT_EQ(record.captureDate(), record.*date);
+  }
 }
 
 }  // namespace
