@@ -17,6 +17,11 @@ using test::Bytes;
 
 constexpr std::size_t kDamagedBytes = 4096;
 
+std::shared_ptr<QVMetadata> read(Bytes bytes, std::string const& extension) {
+  auto const size = static_cast<unsigned long>(bytes.size());
+  return QVReader(test::dataOf(bytes), size, extension).metadata;
+}
+
 /// Without what a library of mathematics gives: its last digit is the platform's own.
 std::string exact(std::shared_ptr<QVMetadata> const& record) {
   if (record) {
@@ -32,7 +37,7 @@ std::uint64_t damagedDigest(Bytes bytes, std::string const& extension) {
   for (std::size_t i = 0; i < std::min(bytes.size(), kDamagedBytes); ++i) {
     for (int const mask : {0x80, 0x01, 0xff}) {
       bytes[i] = static_cast<char>(bytes[i] ^ mask);
-      for (char const c : exact(test::readBuffer(bytes, extension)) + '\n') {
+      for (char const c : exact(read(bytes, extension)) + '\n') {
         digest = (digest ^ static_cast<unsigned char>(c)) * 0x100000001b3;
       }
       bytes[i] = static_cast<char>(bytes[i] ^ mask);
@@ -46,7 +51,7 @@ void describeFile(std::filesystem::path const& path) {
   Bytes const bytes{std::istreambuf_iterator<char>(file), {}};
   std::string const extension = QVReader("").getPathExtension(path.u8string());
   std::string const byPath = test::describe(QVReader(path.u8string()).metadata);
-  std::string const byMemory = test::describe(test::readBuffer(bytes, extension));
+  std::string const byMemory = test::describe(read(bytes, extension));
   std::cout << path.filename().u8string() << ": " << byPath << '\n'
             << (byMemory == byPath ? "  the same from memory" : byMemory)
             << "; damaged: " << std::hex << damagedDigest(bytes, extension) << '\n';
