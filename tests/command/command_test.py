@@ -252,11 +252,12 @@ class Forms(CommandTest):
     def test_blank_dates_are_absent_to_people(self):
         blank = "    :  :     :  :  "
         for name, date in (("a", blank), ("b", "2018:02:21 12:08:56"), ("c", "2018:13:01 00:00:00"),
-                           ("d", "2018: 2:21 12: 8:56"), ("e", "2018:02:21"), ("f", "0999:12:31 23:59:60")):
+                           ("d", "2018: 2:21 12:08:56"), ("e", "2018:02:21 12: 8:56"), ("f", "0999:12:31 23:59:60"),
+                           ("g", "2018:02:21 12:08:56Z")):
             self.put(name + ".tif", photo(date=date.encode()))
         dates = [row["dateTime"] for row in self.rows(".")]
         self.assertEqual((dates[0], dates[1]), (blank, "2018:02:21 12:08:56"))
-        iso = [None, "2018-02-21T12:08:56", dates[2], dates[3], dates[4], "0999-12-31T23:59:60"]
+        iso = [None, "2018-02-21T12:08:56", dates[2], dates[3], dates[4], "0999-12-31T23:59:60", dates[6]]
         self.assertEqual([r["captureDate"] for r in self.objects("--dates", "iso", ".")], iso)
         self.assertEqual(self.objects("--dates", "exif", "."), self.objects("."))
         self.assertEqual(self.names("--sort", "dateTime", "a.tif", "b.tif"), ["b.tif", "a.tif"])
@@ -434,23 +435,23 @@ class Inputs(CommandTest):
         self.put("cut.nef", photo()[:20])
         self.put("notes.txt", b"x")
         self.put("folder/a.tif", photo())
-        listed = b"pipe.jpg\nempty.nef\ncut.nef\n\nnotes.txt\nmissing.jpg\nfolder\n" + b"a" * 5000 + b"\nb\0c"
+        listed = b"pipe.jpg\nempty.nef\ncut.nef\n\nnotes.txt\nmissing.jpg\nfolder\n" + b"a" * 4096 + b"\n" + b"a" * 4097 + b"\nb\0c"
         done = self.run_quavel("--jsonl", "--files-from", "-", input=listed, status=1)
         manual = (COMMAND_SOURCE / "quavel.1").read_text(encoding="utf-8")
         for line, part, reason, position in zip(
                 done.stdout.splitlines(),
                 ("a FIFO, not a regular file", "is empty; copy it", "cut short: ", "tiff tif dng nef cr2 raf arw jpeg "
                  "jpg nrw 3fr cr3", "No such file or directory; check the name", "a folder; give it as an argument",
-                 "longer than a path", "NUL"),
+                 "File name too long", "longer than a path", "NUL"),
                 ("special-file", "empty", "cut-short", "unknown-extension", "cannot-open", "folder",
-                 "bad-path", "bad-path"), (None, None, 22, None, None, None, None, None), strict=True):
+                 "cannot-open", "bad-path", "bad-path"), (None, None, 22, *[None] * 6), strict=True):
             found = json.loads(line)
             self.assertIn(part, found["error"])
             self.assertIn(found["error"].encode(), done.stderr)
             self.assertNotIn("--why", found["error"])
             self.assertEqual((found["reason"], found["position"]), (reason, position))
             self.assertIn("\n" + reason + "\t", manual)
-        self.assertIn(b"8 files, 0 records, 8 without", done.stderr)
+        self.assertIn(b"9 files, 0 records, 9 without", done.stderr)
         self.assertEqual(self.run_quavel("-q", "--jsonl", "empty.nef", status=1).stderr, b"")
 
     def test_what_the_system_refuses_is_told(self):
@@ -491,6 +492,8 @@ class Inputs(CommandTest):
     def test_standard_input_holds_an_image(self):
         records = self.objects("--stdin", "--extension", "CR3", input=cr3())
         self.assertEqual((records[0]["path"], records[0]["iso"]), ("-", 400))
+        large, = self.objects("--stdin", "--extension", "tif", input=photo() + bytes(100000))
+        self.assertEqual(large["width"], 6000)
         self.run_quavel("--stdin", "--extension", "cr3", input=b"", status=1)
 
     def test_wrong_usage(self):

@@ -49,7 +49,7 @@ class Screens(CommandTest):
         """Each screen of the file: "$ WIDTH ARGUMENTS" (no WIDTH: a pipe), then all lines."""
         self.put("trip/2021/a.cr3", cr3(**FULL))
         self.put("trip/2021/day 2/b.cr3", cr3(exposure=(0, 0), main=[(0x112,), (0x132,)]))
-        self.put("trip/2021/day 2/c.tif", photo(date=b"2022"))
+        self.put("trip/2021/day 2/b2.tif", photo(date=b"2022"))
         self.put("trip/none.nef", b"")
         self.maxDiff = None
         for screen in SCREENS.read_text(encoding="utf-8").split("$ ")[1:]:
