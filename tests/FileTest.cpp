@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <chrono>
 #include <filesystem>
 #include <fstream>
 #include <functional>
@@ -147,14 +148,15 @@ TEST_F(FileTest, ThatShrinksGivesItsRecordOrNone) {
 
 TEST_F(FileTest, ThatIsWalkedToItsEndIsForeseen) {
   Bytes bytes = "\xff\xd8";
-  for (int i = 0; i < 40; ++i) {
+  for (int i = 0; i < 170; ++i) {
     bytes += segment(0xffe2, Bytes(30000, '\0'));
   }
   bytes += sof0() + segment(0xffe1, "none");
   TemporaryFile const file(bytes, "jpg");
   EXPECT_EQ(describePath(file), "width=4000 height=3000");
-  EXPECT_EQ(theSystem.advice, (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED}));
-  EXPECT_EQ(theSystem.advisedFrom, 2 + 15 * 30004);  // where its 16th read begins
+  EXPECT_EQ(theSystem.advice,
+            (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED, POSIX_FADV_WILLNEED}));
+  EXPECT_EQ(theSystem.advisedFrom, 2 + 155 * 30004);  // 4 MB after the first time, its 16th read
 }
 
 /// What a journal says of a pipe that others fill.
@@ -162,7 +164,12 @@ std::string readPipe(Bytes const& bytes, std::string const& extension) {
   std::string const path = testing::TempDir() + "quavel_pipe." + extension;
   fs::remove(path);
   EXPECT_EQ(::mkfifo(path.c_str(), 0600), 0);
-  std::thread writer([&] { std::ofstream(path, std::ios::binary) << bytes; });
+  std::thread writer([&] {
+    std::ofstream pipe(path, std::ios::binary);
+    pipe << bytes.substr(0, 10) << std::flush;
+    std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    pipe << bytes.substr(std::min<std::size_t>(10, bytes.size()));
+  });
   QVJournal journal;
   auto const record = journal.read(path);
   writer.join();
@@ -176,6 +183,9 @@ TEST_F(FileTest, ThatIsAPipeIsReadFrontToBack) {
   EXPECT_EQ(readPipe(fixture.bytes(kII), fixture.extension), fixture.expected);
   EXPECT_EQ(readPipe("II*", "tif"),
             "the TIFF header at 0: 2 bytes wanted at 2, but the data ends before that");
+  // It cannot go on elsewhere: what comes next is a frame here that is not the file's.
+  Bytes const payload = Bytes(16378, 'x') + sof0(13, 13) + Bytes(9000, 'x');
+  EXPECT_EQ(readPipe("\xff\xd8" + segment(0xffe2, payload) + sof0(), "jpg"), "");
 }
 
 TEST_F(FileTest, ThatIsAFolderCannotBeRead) {
