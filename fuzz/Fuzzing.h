@@ -7,10 +7,11 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
-#include <tuple>
+#include <type_traits>
 #include <vector>
 
 #include "quavel/quavel.h"
+#include "support/Fields.h"
 
 /// The fuzzer's entry point; 0 keeps the input in the corpus.
 extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size);
@@ -47,30 +48,22 @@ struct Input {
   std::vector<std::uint8_t> bytes;  // of its own exact size, so that a read beyond it is noticed
 };
 
-/// All fields, to be compared; floats by their bits, as a NaN differs from itself.
-inline auto fieldsOf(QVMetadata const& record) {
-  auto const bits = [](float number) {
-    std::uint32_t result = 0;
-    std::memcpy(&result, &number, sizeof(result));
-    return result;
-  };
-  return std::make_tuple(
-      std::make_tuple(record.width, record.height, record.orientation, record.isRaw,
-                      record.dateTimeOriginal, record.dateTimeDigitized, record.dateTime,
-                      record.hasShootingInfo, record.model, record.lensModel, record.iso,
-                      record.whiteBalance, record.meteringMode, record.focalLengthIn35mmFilm),
-      std::make_tuple(bits(record.apexFNumber), bits(record.apexExposureTime),
-                      bits(record.apertureValue), bits(record.shutterSpeedValue),
-                      bits(record.focalLength), bits(record.exposureBiasValue),
-                      bits(record.exposureTime), bits(record.fNumber)));
+/// All fields as bytes, to be compared: a float's NaN differs from itself.
+inline std::string bytesOf(QVMetadata const& record) {
+  std::string bytes;
+  test::eachField(record, [&](char const*, auto const& value) {
+    if constexpr (std::is_same_v<decltype(value), std::string const&>) {
+      bytes += value + '\0';
+    } else {
+      bytes.append(reinterpret_cast<char const*>(&value), sizeof(value));
+    }
+  });
+  return bytes;
 }
 
 /// Whether the two are the same record, or both no record.
 inline bool isSame(std::shared_ptr<QVMetadata> const& one, std::shared_ptr<QVMetadata> const& two) {
-  if (!one || !two) {
-    return !one && !two;
-  }
-  return fieldsOf(*one) == fieldsOf(*two);
+  return one && two ? bytesOf(*one) == bytesOf(*two) : !one && !two;
 }
 
 }  // namespace quavel::fuzz

@@ -29,7 +29,7 @@ class WatchedFile : public QVFStream {
   bool hasLeft = false;
 };
 
-/// A file of one extension, written anew for each input. It stays open and mapped: opening it
+/// A file of one extension, rewritten for each input. It stays open and mapped: opening it
 /// again would cost more than all the reads.
 class File {
  public:

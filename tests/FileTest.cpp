@@ -2,14 +2,17 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
+#include <chrono>
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <iterator>
 #include <thread>
 #include <utility>
 
@@ -26,6 +29,7 @@ struct System {
 
   int reads = 0;
   std::vector<int> advice;
+  off_t advisedFrom = 0;
 } theSystem;
 
 }  // namespace
@@ -43,13 +47,16 @@ extern "C" ssize_t pread(int fd, void* bytes, std::size_t count, off_t position)
              : ::read(fd, bytes, std::min(count, theSystem.mostAtOnce));
 }
 
-extern "C" int posix_fadvise(int /*fd*/, off_t /*from*/, off_t /*length*/, int advice) {
+extern "C" int posix_fadvise(int /*fd*/, off_t from, off_t /*length*/, int advice) {
+  theSystem.advisedFrom = from;
   theSystem.advice.push_back(advice);
   return theSystem.takesAdvice ? 0 : EINVAL;
 }
 
 namespace quavel::test {
 namespace {
+
+namespace fs = std::filesystem;
 
 class FileTest : public testing::Test {
  protected:
@@ -95,9 +102,9 @@ TEST_F(FileTest, TakesAnotherReadForWhatLiesBeyond16KB) {
 struct PlainFile : QVFStream {
   using QVFStream::QVFStream;
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
-    long const position = getOffset() + static_cast<long>(baseOffset);
+    std::int64_t const position = getOffset() + baseOffset;
     bool const isBroken = position <= theSystem.brokenByte &&
-                          theSystem.brokenByte < position + static_cast<long>(count);
+                          theSystem.brokenByte < position + static_cast<std::int64_t>(count);
     return isBroken ? -1 : QVFStream::readBuffer(destination, count);
   }
 };
@@ -109,12 +116,10 @@ TEST_F(FileTest, GivesWhatAPlainReadGivesWhateverByteIsBroken) {
     TemporaryFile const file(bytes, fixture.extension);
     for (off_t broken = 0; broken <= static_cast<off_t>(bytes.size()); ++broken) {
       theSystem.brokenByte = broken;
-      std::shared_ptr<QVStream> plain = std::make_shared<PlainFile>(file.path);
-      auto record = QVReader("").createMetadata(fixture.extension);
-      std::string const expected = record->read(plain) ? describe(*record) : "none";
+      auto const plain = readStream(std::make_shared<PlainFile>(file.path), fixture.extension);
       for (std::size_t const mostAtOnce : {std::size_t{SIZE_MAX}, std::size_t{50}}) {
         theSystem.mostAtOnce = mostAtOnce;
-        ASSERT_EQ(describePath(file), expected) << broken << " of " << bytes.size();
+        ASSERT_EQ(describePath(file), plain[0] == '!' ? "none" : plain) << broken;
       }
     }
   }
@@ -131,7 +136,7 @@ TEST_F(FileTest, ThatShrinksGivesItsRecordOrNone) {
       theSystem.mostAtOnce = 40;
       theSystem.beforeRead = [&](int number) {
         if (number == read) {
-          std::filesystem::resize_file(file.path, 0);
+          fs::resize_file(file.path, 0);
         }
       };
       std::string const found = describePath(file);
@@ -143,25 +148,87 @@ TEST_F(FileTest, ThatShrinksGivesItsRecordOrNone) {
 
 TEST_F(FileTest, ThatIsWalkedToItsEndIsForeseen) {
   Bytes bytes = "\xff\xd8";
-  for (int i = 0; i < 40; ++i) {
+  for (int i = 0; i < 170; ++i) {
     bytes += segment(0xffe2, Bytes(30000, '\0'));
   }
   bytes += sof0() + segment(0xffe1, "none");
   TemporaryFile const file(bytes, "jpg");
   EXPECT_EQ(describePath(file), "width=4000 height=3000");
-  EXPECT_EQ(theSystem.advice, (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED}));
+  EXPECT_EQ(theSystem.advice,
+            (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED, POSIX_FADV_WILLNEED}));
+  EXPECT_EQ(theSystem.advisedFrom, 2 + 155 * 30004);  // 4 MB after the first time, its 16th read
+}
+
+/// What a journal says of a pipe that others fill.
+std::string readPipe(Bytes const& bytes, std::string const& extension) {
+  std::string const path = testing::TempDir() + "quavel_pipe." + extension;
+  fs::remove(path);
+  EXPECT_EQ(::mkfifo(path.c_str(), 0600), 0);
+  std::thread writer([&] {
+    std::ofstream pipe(path, std::ios::binary);
+    pipe << bytes.substr(0, 10) << std::flush;
+    std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    pipe << bytes.substr(std::min<std::size_t>(10, bytes.size()));
+  });
+  QVJournal journal;
+  auto const record = journal.read(path);
+  writer.join();
+  fs::remove(path);
+  return record ? describe(record) : journal.refusal()->text;
 }
 
 TEST_F(FileTest, ThatIsAPipeIsReadFrontToBack) {
-  Fixture const& fixture = fixtures().front();
-  std::string const path = testing::TempDir() + "quavel_pipe." + fixture.extension;
-  std::filesystem::remove(path);
-  ASSERT_EQ(::mkfifo(path.c_str(), 0600), 0);
-  std::thread writer([&] { std::ofstream(path, std::ios::binary) << fixture.bytes(kII); });
   theSystem.takesAdvice = false;  // for a pipe, none is
-  EXPECT_EQ(describe(QVReader(path).metadata), fixture.expected);
-  writer.join();
-  std::filesystem::remove(path);
+  Fixture const& fixture = fixtures().front();
+  EXPECT_EQ(readPipe(fixture.bytes(kII), fixture.extension), fixture.expected);
+  EXPECT_EQ(readPipe("II*", "tif"),
+            "the TIFF header at 0: 2 bytes wanted at 2, but the data ends before that");
+  // It cannot go on elsewhere: what comes next is a frame here that is not the file's.
+  Bytes const payload = Bytes(16378, 'x') + sof0(13, 13) + Bytes(9000, 'x');
+  EXPECT_EQ(readPipe("\xff\xd8" + segment(0xffe2, payload) + sof0(), "jpg"), "");
+}
+
+TEST_F(FileTest, ThatIsAFolderCannotBeRead) {
+  TemporaryFile const folder("", "jpg");
+  fs::remove(folder.path);
+  fs::create_directory(folder.path);
+  QVJournal journal;
+  EXPECT_FALSE(journal.read(folder.path));
+  EXPECT_EQ(journal.refusal()->reason, QVReason::ReadError);
+  EXPECT_EQ(journal.refusal()->systemError, EISDIR);
+  EXPECT_NE(journal.refusal()->text.find("Is a directory"), std::string::npos);
+}
+
+std::ptrdiff_t openDescriptors() {
+  return std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator());
+}
+
+TEST_F(FileTest, IsOpenedReadOnlyAndClosedAgain) {
+  auto const before = openDescriptors();
+  Fixture const& fixture = fixtures().front();
+  TemporaryFile const good(fixture.bytes(kII), fixture.extension);
+  TemporaryFile const bad("II*", "tif");
+  for (TemporaryFile const* const file : {&good, &bad}) {
+    QVReader const reader(file->path);
+    EXPECT_EQ(describe(reader.metadata), file == &good ? fixture.expected : "none");
+    EXPECT_EQ(::fcntl(QVFStream(file->path).fd, F_GETFL) & O_ACCMODE, O_RDONLY);
+  }
+  EXPECT_EQ(openDescriptors(), before);
+}
+
+TEST_F(FileTest, GivesNoRecordWhileThereAreNoDescriptors) {
+  Fixture const& fixture = fixtures().front();
+  TemporaryFile const file(fixture.bytes(kII), fixture.extension);
+  // Read once first: a sanitizer wants descriptors when it meets a type for the first time.
+  EXPECT_EQ(describePath(file), fixture.expected);
+  rlimit before = {};
+  ASSERT_EQ(::getrlimit(RLIMIT_NOFILE, &before), 0);
+  rlimit const none = {0, before.rlim_max};
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &none), 0);
+  auto const record = QVReader(file.path).metadata;
+  ASSERT_EQ(::setrlimit(RLIMIT_NOFILE, &before), 0);
+  EXPECT_FALSE(record);
+  EXPECT_EQ(describePath(file), fixture.expected);
 }
 
 }  // namespace

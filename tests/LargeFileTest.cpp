@@ -1,9 +1,8 @@
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <fstream>
 
-#include "support/Fixtures.h"
+#include "support/Streams.h"
 
 namespace quavel::test {
 namespace {
@@ -11,46 +10,38 @@ namespace {
 constexpr bool kIsLongLong = sizeof(long) == 8;
 constexpr std::uint32_t kFar = 0x90000000;  // beyond what a `long` of 32 bits holds
 
-/// A file that leads to a place beyond 2 GB. Where a refused seek would leave the stream, it holds
-/// what must not be taken.
-struct Row {
-  char const* name;
-  char const* extension;
-  Bytes opening;
-  Bytes beyond;  // at `kFar`
-  char const* expected;
-  bool isInReach;  // of a `long` of 32 bits: counted from a base that holds more
-};
-
 /// A directory that is the same wherever it lies.
 Bytes loose(Directory const& directory) { return tiff(kII, directory).substr(8); }
 
-std::vector<Row> rows() {
+/// Where a refused seek would leave the stream, each file holds what must not be taken.
+TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
+  struct Row {
+    char const* extension;
+    Bytes opening;
+    Bytes beyond;  // at `kFar`
+    char const* expected;
+    bool isInReach = false;  // of a `long` of 32 bits: counted from a base that holds more
+  };
   Bytes const wrong = loose({{longs(kWidth, {13}), ascii(kDateTimeOriginal, "bad")}});
   Bytes const right = loose({{longs(kWidth, {42}), ascii(kDateTimeOriginal, "now")}});
-  Bytes const uuids[] = {uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, {13})}}))),
-                         uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, {42})}})))};
+  auto const moov = [](std::int64_t width) {
+    return box("moov", uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, {width})}}))));
+  };
   Bytes raf = "FUJIFILM";
   raf.resize(84);
   raf += u32(kMM, kFar);
   raf.resize(100);
   Bytes const image = jpegFile(tiff(kII, jpegExif()));
-  return {
-      {"IFD0", "tif", "II*" + Bytes(1, '\0') + u32(kII, kFar) + wrong, right, "width=42", false},
-      {"Exif IFD", "tif", tiff(kII, {{longs(kExif, {kFar})}}) + wrong, right,
-       "dateTimeOriginal=now", false},
-      {"values", "tif", tiff(kII, {{claim(kDateTime, kAscii, 6, kFar)}}) + "wrong", "right",
-       "dateTime=right", false},
-      {"box", "cr3", u32(kMM, kFar) + "free" + box("moov", uuids[0]), box("moov", uuids[1]),
-       "width=42 orientation=1 isRaw", false},
-      {"RAF", "raf", raf + u32(kMM, kFar + image.size()), image + tiff(kII, rafRawSection()),
+  Row const rows[] = {
+      {"tif", Bytes("II*\0", 4) + u32(kII, kFar) + wrong, right, "width=42"},
+      {"tif", tiff(kII, {{longs(kExif, {kFar})}}) + wrong, right, "dateTimeOriginal=now"},
+      {"tif", tiff(kII, {{claim(kDateTime, kAscii, 6, kFar)}}) + "wrong", "right",
+       "dateTime=right"},
+      {"cr3", u32(kMM, kFar) + "free" + moov(13), moov(42), "width=42 orientation=1 isRaw"},
+      {"raf", raf + u32(kMM, kFar + image.size()), image + tiff(kII, rafRawSection()),
        "width=6160 height=4032 orientation=6 isRaw dateTimeOriginal=2021:05:01 10:00:00", true},
   };
-}
-
-TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
-  for (Row const& row : rows()) {
-    SCOPED_TRACE(row.name);
+  for (Row const& row : rows) {
     TemporaryFile const file(row.opening, row.extension);
     std::fstream(file.path, std::ios::in | std::ios::out | std::ios::binary).seekp(kFar)
         << row.beyond << Bytes(8, '\0');
@@ -65,22 +56,17 @@ TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
 }
 
 /// SOI, then 4 GB of segments as long as they get.
-class Segments : public QVStream {
- public:
+struct Segments : QVStream {
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
     Bytes const period("\xff\xd8\xff\xe2\xff\xfe\0\0", 8);
-    if (position_ >= std::int64_t{1} << 32U) {
-      return 0;
-    }
-    std::copy_n(period.data() + position_ % 8, count, destination);
-    position_ += static_cast<std::int64_t>(count);
-    return static_cast<std::int64_t>(count);
+    bool const isThere = position < std::int64_t{1} << 32U;
+    period.copy(reinterpret_cast<char*>(destination), isThere ? count : 0, position % 8);
+    position += isThere ? static_cast<std::int64_t>(count) : 0;
+    return isThere ? static_cast<std::int64_t>(count) : 0;
   }
-  long getOffset() override { return static_cast<long>(position_); }
-  void setOffset(long const& offset) override { position_ = offset; }
-
- private:
-  std::int64_t position_ = 0;
+  long getOffset() override { return static_cast<long>(position); }
+  void setOffset(long const& offset) override { position = offset; }
+  std::int64_t position = 0;
 };
 
 TEST(LargeFile, IsWalkedAsFarAsOffsetsReach) {

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -54,26 +55,14 @@ struct Directory {
   std::vector<Field> fields;
   std::uint32_t next = 0;
 
-  Field* find(std::uint16_t tag) {
+  /// The field of the tag, which is added unless it is there.
+  Field& operator[](std::uint16_t tag) {
     for (Field& field : fields) {
       if (field.tag == tag) {
-        return &field;
+        return field;
       }
     }
-    return nullptr;
-  }
-  Directory& sub(std::uint16_t tag, std::size_t index = 0) {
-    return find(tag)->subdirectories.at(index);
-  }
-  void remove(std::uint16_t tag) {
-    fields.erase(std::remove_if(fields.begin(), fields.end(),
-                                [&](Field const& field) { return field.tag == tag; }),
-                 fields.end());
-  }
-  /// Replaces the field of the same tag, or adds the field.
-  void set(Field field) {
-    Field* const old = find(field.tag);
-    (old == nullptr ? fields.emplace_back() : *old) = std::move(field);
+    return fields.emplace_back(Field{tag});
   }
 };
 
@@ -107,20 +96,42 @@ inline Field claim(std::uint16_t tag, std::uint16_t type, std::uint32_t count,
   return {tag, type, count, 4, {}, {}, valueField};
 }
 
-/// The directory as it stands `start` bytes behind the TIFF header's first byte, with its values
-/// and sub-directories behind it.
+using Edit = std::function<void(Directory&)>;
+
+/// Replaces the field of the same tag, or adds the field.
+inline Edit put(Field const& field) {
+  return [field](Directory& directory) { directory[field.tag] = field; };
+}
+inline Edit drop(std::uint16_t tag) {
+  return [tag](Directory& directory) {
+    auto& all = directory.fields;
+    all.erase(std::remove_if(all.begin(), all.end(), [&](auto& field) { return field.tag == tag; }),
+              all.end());
+  };
+}
+/// Edits the sub-directory that the field points to, or the one of that index.
+inline Edit in(std::uint16_t tag, Edit const& edit, std::size_t index = 0) {
+  return [=](Directory& directory) { edit(directory[tag].subdirectories.at(index)); };
+}
+inline Edit both(Edit const& one, Edit const& other) {
+  return [=](Directory& directory) { one(directory), other(directory); };
+}
+inline void noEdit(Directory& /*directory*/) {}
+
+/// The directory as it stands `start` bytes after the TIFF header's first byte, followed by its
+/// values and sub-directories.
 inline Bytes directoryAt(ByteOrder order, std::size_t start, Directory const& directory) {
   std::size_t const end = start + 2 + 12 * directory.fields.size() + 4;
   Bytes entries = u16(order, directory.fields.size());
-  Bytes behind;
+  Bytes rest;
   for (Field const& field : directory.fields) {
     Bytes data;
     for (std::int64_t const value : field.numbers) {
       data += number(order, static_cast<std::uint64_t>(value), field.numberSize);
     }
     for (Directory const& subdirectory : field.subdirectories) {
-      data += u32(order, end + behind.size());
-      behind += directoryAt(order, end + behind.size(), subdirectory);
+      data += u32(order, end + rest.size());
+      rest += directoryAt(order, end + rest.size(), subdirectory);
     }
     if (field.rawField >= 0) {
       data = u32(order, static_cast<std::uint64_t>(field.rawField));
@@ -129,11 +140,11 @@ inline Bytes directoryAt(ByteOrder order, std::size_t start, Directory const& di
     if (data.size() <= 4) {
       entries += data + Bytes(4 - data.size(), '\0');
     } else {
-      entries += u32(order, end + behind.size());
-      behind += data;
+      entries += u32(order, end + rest.size());
+      rest += data;
     }
   }
-  return entries + u32(order, directory.next) + behind;
+  return entries + u32(order, directory.next) + rest;
 }
 
 /// A whole TIFF structure.

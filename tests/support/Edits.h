@@ -3,44 +3,59 @@
 
 #include <gtest/gtest.h>
 
-#include <functional>
-#include <memory>
-#include <string>
-#include <vector>
-
-#include "support/Fixtures.h"
+#include "support/JournalLaw.h"
+#include "support/Streams.h"
 
 namespace quavel::test {
 
-/// A well-made file with one edit, and what the reader makes of it.
-struct Edit {
-  char const* name;
-  std::function<void(Directory&)> edit;
-  bool isRead;
-  std::string fields;
+/// What a file gives its reader, as `readStream` describes it. Without a reader of one's own, and
+/// with a journal, the record is the same, and the journal keeps its law.
+inline std::string resultOf(Bytes bytes, std::string const& extension) {
+  std::string const result = readStream(streamOf(bytes), extension);
+  QVJournal journal;
+  auto const record = journal.read(dataOf(bytes), bytes.size(), extension);
+  EXPECT_EQ(describe(record), result[0] == '!' ? "none" : result);
+  EXPECT_EQ(readBuffer(bytes, extension), describe(record));
+  EXPECT_EQ(brokenLaw(journal, record.get()), "");
+  return result;
+}
+
+/// A result, and edits of a well-made file of which each leads to it.
+struct EditRow {
+  std::string result;
+  std::vector<Edit> edits;
 };
 
-/// Reads each row in both byte orders with a reader of its own, and looks at the reader itself: a
-/// failed read keeps what it had stored.
-template <class Format>
-void check(Directory (*wellMade)(), std::vector<Edit> const& rows,
-           std::function<Bytes(ByteOrder, Directory const&)> const& layOut = tiff) {
-  for (ByteOrder const order : kOrders) {
-    for (Edit const& row : rows) {
-      SCOPED_TRACE(row.name);
-      Directory directory = wellMade();
-      row.edit(directory);
-      Bytes bytes = layOut(order, directory);
-      std::shared_ptr<QVStream> stream =
-          std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size());
-      Format format;
-      EXPECT_EQ(format.read(stream), row.isRead);
-      EXPECT_EQ(describe(format), row.fields);
+/// Reads each in both byte orders.
+inline void check(std::string const& extension, Directory (*wellMade)(),
+                  std::vector<EditRow> const& rows,
+                  std::function<Bytes(ByteOrder, Directory const&)> const& layOut = tiff) {
+  for (EditRow const& row : rows) {
+    for (Edit const& edit : row.edits) {
+      for (ByteOrder const order : kOrders) {
+        Directory directory = wellMade();
+        edit(directory);
+        EXPECT_EQ(resultOf(layOut(order, directory), extension), row.result)
+            << "edit " << &edit - row.edits.data();
+      }
     }
   }
 }
 
-inline void noEdit(Directory& /*file*/) {}
+/// The same for files.
+struct FileRow {
+  std::string result;
+  std::vector<Bytes> files;
+};
+inline void check(std::string const& extension, std::vector<FileRow> const& rows,
+                  Bytes const& opening = "") {
+  for (FileRow const& row : rows) {
+    for (Bytes const& file : row.files) {
+      EXPECT_EQ(resultOf(opening + file, extension), row.result)
+          << "file " << &file - row.files.data();
+    }
+  }
+}
 
 }  // namespace quavel::test
 

@@ -1,11 +1,11 @@
 #include "support/Fixtures.h"
 
-#include <unistd.h>
-
-#include <atomic>
 #include <filesystem>
 #include <fstream>
+#include <random>
 #include <sstream>
+
+#include "support/Fields.h"
 
 namespace quavel::test {
 
@@ -24,10 +24,10 @@ Directory reducedTiff() {
   Directory const full = {{longs(kNewSubfileType, {0}), longs(kWidth, {6000}),
                            longs(kLength, {4000}), shorts(kOrientation, {3})}};
   Directory file = plainTiff();
-  file.set(longs(kNewSubfileType, {1}));
-  file.set(longs(kWidth, {256}));
-  file.set(longs(kLength, {171}));
-  file.set(pointer(kSubIFDs, {preview, full, preview}));
+  for (Field const& field : {longs(kNewSubfileType, {1}), longs(kWidth, {256}),
+                             longs(kLength, {171}), pointer(kSubIFDs, {preview, full, preview})}) {
+    file[field.tag] = field;
+  }
   return file;
 }
 
@@ -45,8 +45,8 @@ Directory nef() {
 
 Directory arw() {
   Directory file = nef();
-  file.set(longs(kWidth, {1616}));
-  file.set(pointer(kSubIFDs, {file.sub(kSubIFDs, 1)}));
+  file[kWidth] = longs(kWidth, {1616});
+  file[kSubIFDs] = pointer(kSubIFDs, {file[kSubIFDs].subdirectories[1]});
   return file;
 }
 
@@ -146,25 +146,6 @@ std::string const kCr3 =
     "exposureBiasValue=-0.5 focalLengthIn35mmFilm=56 exposureTime=0.00499999989 "
     "fNumber=5.5999999";
 
-template <class T>
-void show(std::ostream& out, char const* name, T const& value, bool isAbsent) {
-  if (!isAbsent) {
-    out << name << '=' << value << ' ';
-  }
-}
-void show(std::ostream& out, char const* name, std::int32_t value) {
-  show(out, name, value, value == -1);
-}
-void show(std::ostream& out, char const* name, float value) {
-  show(out, name, value, std::isnan(value));
-}
-void show(std::ostream& out, char const* name, std::string const& value) {
-  show(out, name, value, value.empty());
-}
-void show(std::ostream& out, char const* name, bool value) {
-  out << (value ? name + std::string(" ") : "");
-}
-
 }  // namespace
 
 std::vector<Fixture> const& fixtures() {
@@ -188,28 +169,13 @@ std::vector<Fixture> const& fixtures() {
 std::string describe(QVMetadata const& record) {
   std::ostringstream out;
   out.precision(9);
-  show(out, "width", record.width);
-  show(out, "height", record.height);
-  show(out, "orientation", record.orientation);
-  show(out, "isRaw", record.isRaw);
-  show(out, "dateTimeOriginal", record.dateTimeOriginal);
-  show(out, "dateTimeDigitized", record.dateTimeDigitized);
-  show(out, "dateTime", record.dateTime);
-  show(out, "hasShootingInfo", record.hasShootingInfo);
-  show(out, "model", record.model);
-  show(out, "lensModel", record.lensModel);
-  show(out, "iso", record.iso);
-  show(out, "apexFNumber", record.apexFNumber);
-  show(out, "apexExposureTime", record.apexExposureTime);
-  show(out, "apertureValue", record.apertureValue);
-  show(out, "shutterSpeedValue", record.shutterSpeedValue);
-  show(out, "focalLength", record.focalLength);
-  show(out, "whiteBalance", record.whiteBalance);
-  show(out, "meteringMode", record.meteringMode);
-  show(out, "exposureBiasValue", record.exposureBiasValue);
-  show(out, "focalLengthIn35mmFilm", record.focalLengthIn35mmFilm);
-  show(out, "exposureTime", record.exposureTime);
-  show(out, "fNumber", record.fNumber);
+  eachField(record, [&](char const* name, auto const& value) {
+    if constexpr (std::is_same_v<decltype(value), bool const&>) {
+      out << (value ? name + std::string(" ") : "");
+    } else if (!isAbsent(value)) {
+      out << name << '=' << value << ' ';
+    }
+  });
   std::string text = out.str();
   if (!text.empty()) {
     text.pop_back();
@@ -221,15 +187,21 @@ std::string describe(std::shared_ptr<QVMetadata> const& record) {
   return record ? describe(*record) : "none";
 }
 
-std::shared_ptr<QVMetadata> readBuffer(Bytes bytes, std::string const& extension) {
-  auto* const data = reinterpret_cast<unsigned char*>(bytes.data());
-  return QVReader(data, bytes.size(), extension).metadata;
+std::string readBuffer(Bytes bytes, std::string const& extension) {
+  return describe(
+      QVReader(dataOf(bytes), static_cast<unsigned long>(bytes.size()), extension).metadata);
+}
+
+std::string readStream(std::shared_ptr<QVStream> stream, std::string const& extension) {
+  auto const record = QVReader("").createMetadata(extension);
+  bool const isRead = record->read(stream);
+  return (isRead ? "" : "! ") + describe(*record);
 }
 
 TemporaryFile::TemporaryFile(Bytes const& bytes, std::string const& extension) {
-  static std::atomic<int> count{0};
-  auto const name = "quavel-" + std::to_string(::getpid()) + "-" + std::to_string(++count);
-  path = (std::filesystem::temp_directory_path() / (name + "." + extension)).string();
+  static thread_local std::mt19937_64 random{std::random_device{}()};
+  auto const name = "quavel-" + std::to_string(random()) + "." + extension;
+  path = (std::filesystem::temp_directory_path() / name).string();
   std::ofstream(path, std::ios::binary) << bytes;
 }
 

@@ -11,36 +11,18 @@
 namespace quavel::test {
 
 // Repeated here on purpose: a wrong number in the library must not repeat itself in the files.
+// clang-format off
 enum Tag : std::uint16_t {
-  kNewSubfileType = 0x00fe,
-  kWidth = 0x0100,
-  kLength = 0x0101,
-  kModel = 0x0110,
-  kOrientation = 0x0112,
-  kDateTime = 0x0132,
-  kSubIFDs = 0x014a,
-  kExposureTime = 0x829a,
-  kFNumber = 0x829d,
-  kExif = 0x8769,
-  kIso = 0x8827,
-  kDateTimeOriginal = 0x9003,
-  kDateTimeDigitized = 0x9004,
-  kOffsetTimeOriginal = 0x9011,
-  kShutterSpeed = 0x9201,
-  kAperture = 0x9202,
-  kExposureBias = 0x9204,
-  kMeteringMode = 0x9207,
-  kMakerNote = 0x927c,
-  kFocalLength = 0x920a,
-  kPixelX = 0xa002,
-  kPixelY = 0xa003,
-  kWhiteBalance = 0xa403,
-  kFocal35 = 0xa405,
-  kLensModel = 0xa434,
-  kRafPointer = 0xf000,
-  kRafWidth = 0xf001,
+  kNewSubfileType = 0x00fe, kWidth = 0x0100, kLength = 0x0101, kModel = 0x0110,
+  kOrientation = 0x0112, kDateTime = 0x0132, kSubIFDs = 0x014a, kExposureTime = 0x829a,
+  kFNumber = 0x829d, kExif = 0x8769, kIso = 0x8827, kDateTimeOriginal = 0x9003,
+  kDateTimeDigitized = 0x9004, kOffsetTimeOriginal = 0x9011, kShutterSpeed = 0x9201,
+  kAperture = 0x9202, kExposureBias = 0x9204, kMeteringMode = 0x9207, kMakerNote = 0x927c,
+  kFocalLength = 0x920a, kPixelX = 0xa002, kPixelY = 0xa003, kWhiteBalance = 0xa403,
+  kFocal35 = 0xa405, kLensModel = 0xa434, kRafPointer = 0xf000, kRafWidth = 0xf001,
   kRafLength = 0xf002,
 };
+// clang-format on
 
 constexpr ByteOrder kII = ByteOrder::LittleEndian;
 constexpr ByteOrder kMM = ByteOrder::BigEndian;
@@ -61,18 +43,17 @@ constexpr unsigned kFrameHeight = 3000;
 
 /// A JPEG segment: marker, length, payload.
 inline Bytes segment(std::uint16_t marker, Bytes const& payload) {
-  return u16(ByteOrder::BigEndian, marker) + u16(ByteOrder::BigEndian, payload.size() + 2) +
-         payload;
+  return u16(kMM, marker) + u16(kMM, payload.size() + 2) + payload;
 }
 
 /// An ISO base media box: size, type, payload.
 inline Bytes box(Bytes const& type, Bytes const& payload) {
-  return u32(ByteOrder::BigEndian, payload.size() + 8) + type + payload;
+  return u32(kMM, payload.size() + 8) + type + payload;
 }
 
 Bytes sof0(unsigned width = kFrameWidth, unsigned height = kFrameHeight);
 Bytes exifSegment(Bytes const& tiffStructure);
-/// SOI, the Exif segment and the frame header, with the start of a scan behind.
+/// SOI, the Exif segment and the frame header, followed by the start of a scan.
 Bytes jpegFile(Bytes const& tiffStructure);
 /// `image` is the embedded JPEG, `rawSection` a TIFF structure.
 Bytes rafFile(Bytes const& image, Bytes const& rawSection);
@@ -90,25 +71,19 @@ struct Fixture {
 };
 std::vector<Fixture> const& fixtures();
 
-/// The record's fields that differ from their initial values, in their order: "width=160 isRaw".
+/// The fields that are there, in their order: "width=160 isRaw"; "none" without a record.
 std::string describe(QVMetadata const& record);
-/// The same for a record that may be missing: "none".
 std::string describe(std::shared_ptr<QVMetadata> const& record);
 
-/// The record that the buffer gives.
-std::shared_ptr<QVMetadata> readBuffer(Bytes bytes, std::string const& extension);
+inline unsigned char* dataOf(Bytes& bytes) {
+  return reinterpret_cast<unsigned char*>(bytes.data());
+}
 
-/// A stream that keeps its bytes.
-struct Source {
-  explicit Source(Bytes data, ByteOrder order = ByteOrder::BigEndian)
-      : bytes(std::move(data)),
-        stream(std::make_shared<QVMStream>(reinterpret_cast<unsigned char*>(bytes.data()),
-                                           bytes.size())) {
-    stream->byteOrder = order;
-  }
-  Bytes bytes;
-  std::shared_ptr<QVStream> stream;
-};
+/// The record that the bytes give, described.
+std::string readBuffer(Bytes bytes, std::string const& extension);
+/// The record that the stream gives, described; if it is refused, after "! " what was stored
+/// before.
+std::string readStream(std::shared_ptr<QVStream> stream, std::string const& extension);
 
 /// A file of its own in the temporary folder, removed at the end of its life.
 class TemporaryFile {

@@ -39,7 +39,7 @@ inline Bytes headerTo(std::size_t base, std::size_t directory) {
 
 /// As many SubIFDs as values, all of them one directory that never says what it is.
 inline Bytes repeatedSubIFDs(Greed greed) {
-  constexpr std::uint32_t kList = 38;  // behind a directory of two entries
+  constexpr std::uint32_t kList = 38;  // after a directory of two entries
   std::uint32_t const shared = kList + 4 * greed.values;
   Bytes bytes =
       tiff(kII, {{shorts(kNewSubfileType, {1}), claim(kSubIFDs, kLong, greed.values, kList)}});

@@ -2,49 +2,21 @@
 #define QUAVEL_TESTS_JOURNALLAW_H
 
 #include <algorithm>
-#include <cmath>
 #include <set>
 #include <string>
 
-#include "quavel/quavel.h"
+#include "support/Fields.h"
 
 // Of the library alone: the fuzz targets hold it too.
 namespace quavel::test {
 
-/// The fields that can be absent, and whether this record has them not.
-inline std::set<std::string> absentFields(QVMetadata const& r) {
-  struct Row {
-    char const* name;
-    bool isAbsent;
-  };
-  Row const rows[] = {
-      {"width", r.width == -1},
-      {"height", r.height == -1},
-      {"orientation", r.orientation == -1},
-      {"dateTimeOriginal", r.dateTimeOriginal.empty()},
-      {"dateTimeDigitized", r.dateTimeDigitized.empty()},
-      {"dateTime", r.dateTime.empty()},
-      {"model", r.model.empty()},
-      {"lensModel", r.lensModel.empty()},
-      {"iso", r.iso == -1},
-      {"apexFNumber", std::isnan(r.apexFNumber)},
-      {"apexExposureTime", std::isnan(r.apexExposureTime)},
-      {"apertureValue", std::isnan(r.apertureValue)},
-      {"shutterSpeedValue", std::isnan(r.shutterSpeedValue)},
-      {"focalLength", std::isnan(r.focalLength)},
-      {"whiteBalance", r.whiteBalance == -1},
-      {"meteringMode", r.meteringMode == -1},
-      {"exposureBiasValue", std::isnan(r.exposureBiasValue)},
-      {"focalLengthIn35mmFilm", r.focalLengthIn35mmFilm == -1},
-      {"exposureTime", std::isnan(r.exposureTime)},
-      {"fNumber", std::isnan(r.fNumber)},
-  };
+inline std::set<std::string> absentFields(QVMetadata const& record) {
   std::set<std::string> absent;
-  for (Row const& row : rows) {
-    if (row.isAbsent) {
-      absent.insert(row.name);
+  eachField(record, [&](char const* name, auto const& value) {
+    if (isAbsent(value)) {
+      absent.insert(name);
     }
-  }
+  });
   return absent;
 }
 
