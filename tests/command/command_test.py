@@ -179,8 +179,9 @@ class Forms(CommandTest):
             self.assertEqual(self.run_quavel("--absent", "skip", *arguments).stdout, b"")
 
     def test_piped_table_depends_on_rows_alone(self):
-        for i in range(1100):
-            self.put(f"{i:04}.tif", photo())
+        first = self.put("0000.tif", photo())
+        for i in range(1, 1100):
+            os.link(first, self.folder / f"{i:04}.tif")
         self.put("later/x.cr3", cr3(model="写真機".encode()))
         tables = {self.run_quavel("-j", jobs, ".").stdout for jobs in "1271"}
         self.assertEqual(len(tables), 1)
@@ -648,12 +649,16 @@ class Endings(CommandTest):
                               cwd=self.folder) as process:
             os.close(side)
             time.sleep(0.6)  # a slow reader makes a slow run
-            while process.stdout.read(1000000):
-                time.sleep(0.15)
+            for megabytes in range(0, 20, 2):
+                if megabytes == 6:
+                    fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
+                process.stdout.read(2000000)
+                time.sleep(0.15 if process.poll() is None else 0)
             shown = os.read(main, 65536).decode()
             os.close(main)
         self.assertRegex(shown, r"^\r\x1b\[K\d+ files, \d+ files/s\r")
         self.assertRegex(shown, r"\r\x1b\[K\d+ of 20000 files, \d+ files/s, \d+ s left\r\x1b\[K")
+        self.assertRegex(shown, r"\r\x1b\[K\d{5} of 20000 files, …\r\x1b\[K")  # 23 of 24 cells
         self.assertRegex(shown, r"\r\x1b\[Kquavel: 20000 files, 20000 records, 0 without record, .* files/s\r\n$")
         self.assertEqual(self.on_terminal("--jsonl", "a.tif", stream="stderr"), "")
         self.assertNotIn("\x1b", self.on_terminal("--jsonl", ".", "a.tif", stream="stderr"))
