@@ -1,5 +1,6 @@
 # Run by cpack on the trees it is about to pack: gives each Debian package the documents that the
 # Debian policy asks of it, in the form it asks for.
+cmake_minimum_required(VERSION 3.23)
 if(NOT CPACK_GENERATOR STREQUAL "DEB")
   return()
 endif()
