@@ -5,6 +5,7 @@ set(config_dir ${CMAKE_INSTALL_LIBDIR}/cmake/quavel)
 set(pkgconfig_dir ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 
 install(TARGETS quavel EXPORT quavelTargets
+  RUNTIME COMPONENT runtime
   LIBRARY COMPONENT runtime NAMELINK_COMPONENT development
   ARCHIVE COMPONENT development
   FILE_SET HEADERS COMPONENT development)

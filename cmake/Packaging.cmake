@@ -12,6 +12,9 @@ set(CPACK_COMPONENTS_ALL runtime development)
 if(QUAVEL_BUILD_APPS)
   list(APPEND CPACK_COMPONENTS_ALL command)
 endif()
+if(QUAVEL_BUILD_PYTHON)
+  list(APPEND CPACK_COMPONENTS_ALL python)
+endif()
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_RELEASE 1)
@@ -47,6 +50,23 @@ set(CPACK_DEBIAN_COMMAND_PACKAGE_SECTION graphics)
 set(CPACK_DEBIAN_COMMAND_PACKAGE_DEPENDS "${runtime_package} (>= ${PROJECT_VERSION})")
 set(CPACK_COMPONENT_COMMAND_DESCRIPTION
     "shooting metadata from camera files - command\n${common_description}")
+
+if(QUAVEL_BUILD_PYTHON)
+  set(python_package python3-quavel)
+  set(CPACK_DEBIAN_PYTHON_PACKAGE_NAME ${python_package})
+  set(CPACK_DEBIAN_PYTHON_PACKAGE_SECTION python)
+  set(CPACK_DEBIAN_PYTHON_PACKAGE_DEPENDS
+      "${runtime_package} (>= ${PROJECT_VERSION}), python3 (>= ${python_version}), \
+python3 (<< ${next_python_version})")
+  set(CPACK_COMPONENT_PYTHON_DESCRIPTION
+      "shooting metadata from camera files - Python package\n${common_description}")
+  set(python_scripts ${CMAKE_CURRENT_BINARY_DIR}/debian/python)
+  file(WRITE ${python_scripts}/postinst "#!/bin/sh\nset -e\npy3compile -p ${python_package}\n")
+  file(WRITE ${python_scripts}/prerm "#!/bin/sh\nset -e\npy3clean -p ${python_package}\n")
+  file(CHMOD ${python_scripts}/postinst ${python_scripts}/prerm PERMISSIONS
+    OWNER_READ OWNER_WRITE OWNER_EXECUTE GROUP_READ GROUP_EXECUTE WORLD_READ WORLD_EXECUTE)
+  set(CPACK_DEBIAN_PYTHON_PACKAGE_CONTROL_EXTRA ${python_scripts}/postinst ${python_scripts}/prerm)
+endif()
 
 set(CPACK_PRE_BUILD_SCRIPTS ${CMAKE_CURRENT_SOURCE_DIR}/cmake/FinishDebianTree.cmake)
 include(CPack)

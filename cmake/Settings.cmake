@@ -1,8 +1,34 @@
 # What every target of the project is built with. Nobody who uses the library gets any of it.
 add_library(quavel_settings INTERFACE)
-target_compile_options(quavel_settings INTERFACE
-  -Wall -Wextra -Wpedantic -Wconversion -Wshadow
-  $<$<BOOL:${QUAVEL_WERROR}>:-Werror>)
+if(MSVC)
+  target_compile_options(quavel_settings INTERFACE
+    /W4 /utf-8 $<$<BOOL:${QUAVEL_WERROR}>:/WX>)
+else()
+  target_compile_options(quavel_settings INTERFACE
+    -Wall -Wextra -Wpedantic -Wconversion -Wshadow
+    $<$<BOOL:${QUAVEL_WERROR}>:-Werror>)
+endif()
+
+include(CheckCXXCompilerFlag)
+include(CheckLinkerFlag)
+
+# Options that make a library smaller or faster where the compiler, or the linker, knows them.
+function(quavel_compile_option_if_accepted target option)
+  string(MAKE_C_IDENTIFIER "quavel_accepts${option}" accepts)
+  check_cxx_compiler_flag(${option} ${accepts})
+  if(${accepts})
+    target_compile_options(${target} PRIVATE ${option})
+  endif()
+endfunction()
+
+function(quavel_link_option_if_accepted target option)
+  string(REGEX REPLACE "[=,]/.*" "" name "${option}")
+  string(MAKE_C_IDENTIFIER "quavel_accepts_${name}" accepts)
+  check_linker_flag(CXX ${option} ${accepts})
+  if(${accepts})
+    target_link_options(${target} PRIVATE ${option})
+  endif()
+endfunction()
 
 # Files above 2 GB, and such sizes, are out of reach of 32-bit systems unless they are asked for.
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)

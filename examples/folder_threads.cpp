@@ -16,8 +16,8 @@ int main(int argc, char** argv) {
   }
   std::vector<std::string> paths;
   for (auto const& entry : std::filesystem::recursive_directory_iterator(argv[1])) {
-    if (entry.is_regular_file()) {  // opening a named pipe would wait for its writer
-      paths.push_back(entry.path().string());
+    if (entry.is_regular_file()) {               // opening a named pipe would wait for its writer
+      paths.push_back(entry.path().u8string());  // the library takes UTF-8 on every system
     }
   }
 

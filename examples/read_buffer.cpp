@@ -15,8 +15,8 @@ int main(int argc, char** argv) {
   std::vector<char> bytes((std::istreambuf_iterator<char>(file)), {});
 
   // The bytes are read where they are: nothing is copied, and nothing is kept afterwards.
-  quavel::QVReader const reader(reinterpret_cast<unsigned char*>(bytes.data()), bytes.size(),
-                                argv[2]);
+  quavel::QVReader const reader(reinterpret_cast<unsigned char*>(bytes.data()),
+                                static_cast<unsigned long>(bytes.size()), argv[2]);
   if (!reader.metadata) {
     std::cerr << argv[1] << ": no " << argv[2] << " file\n";
     return 1;

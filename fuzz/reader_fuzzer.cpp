@@ -44,7 +44,8 @@ int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
   fuzz::Input input(data, size);
   auto const before = input.bytes;
 
-  QVReader const reader(input.bytes.data(), input.bytes.size(), input.extension);
+  auto const length = static_cast<unsigned long>(input.bytes.size());
+  QVReader const reader(input.bytes.data(), length, input.extension);
   fuzz::require(input.bytes == before, "the file is only read");
   if (reader.metadata) {
     fuzz::checkTexts(*reader.metadata, input.bytes.size());

@@ -1,8 +1,10 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <climits>
 #include <cmath>
 #include <filesystem>
+#include <random>
 #include <stdexcept>
 
 #include "stream/PositionedFile.h"
@@ -195,6 +197,28 @@ TEST(ReadAheadStream, AnswersFromItsBlocksAndMovesByOneSeekAndOneRead) {
   EXPECT_EQ(whole, bytes);
   stream.setOffset(16382);  // across the two blocks
   EXPECT_EQ(next(stream, &QVStream::readLong), 0x43444546U);
+}
+
+TEST(ReadAheadStream, DeliversTheSourcesBytesWhateverTheBlocks) {
+  constexpr long kFar = sizeof(long) == 8 ? static_cast<long>(0xfffffff0) : 0x7fffff00;
+  constexpr std::size_t kSizes[] = {0, 1, 3, 64, 1000};
+  std::mt19937 random;
+  Bytes bytes(300, '\0');
+  std::generate(bytes.begin(), bytes.end(), [&] { return static_cast<char>(random()); });
+  for (std::size_t i = 0; i < 25 * 100; ++i) {
+    QVReadAheadStream stream(std::make_shared<TestStream>(bytes), kSizes[i % 5], kSizes[i / 5 % 5]);
+    for (int step = 0; step < 6; ++step) {
+      bool const isFar = random() % 6 == 0;  // memory stops at its end, which is no refusal
+      auto const offset = isFar ? kFar : static_cast<long>(random() % 310);
+      auto const start = std::min(static_cast<std::size_t>(offset), bytes.size());
+      Bytes read(random() % 20, '\0');
+      Bytes const expected = bytes.substr(start, read.size());
+      stream.setOffset(offset);
+      read.resize(static_cast<std::size_t>(stream.readBuffer(dataOf(read), read.size())));
+      ASSERT_EQ(read, expected);
+      ASSERT_EQ(stream.getOffset(), offset + static_cast<long>(read.size()));
+    }
+  }
 }
 
 TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {

@@ -5,6 +5,7 @@ if(NOT QUAVEL_INSTALL OR QUAVEL_SANITIZE OR QUAVEL_COVERAGE)
 endif()
 
 set(prefix ${CMAKE_CURRENT_BINARY_DIR}/package/prefix)
+set(consumer_dir ${prefix}/bin)  # beside a DLL, where there are such
 set(consumer_photo ${PROJECT_SOURCE_DIR}/examples/photos/night.nef)
 
 add_test(NAME Package.Installs
@@ -15,6 +16,9 @@ add_test(NAME Package.IsFoundByCMake
   COMMAND ${CMAKE_CTEST_COMMAND}
     --build-and-test ${PROJECT_SOURCE_DIR}/tests/package ${CMAKE_CURRENT_BINARY_DIR}/package/build
     --build-generator ${CMAKE_GENERATOR}
-    --build-options -DCMAKE_PREFIX_PATH=${prefix} -DCMAKE_CXX_COMPILER=${CMAKE_CXX_COMPILER}
-    --test-command consumer ${consumer_photo})
+    --build-options -Dquavel_DIR=${prefix}/${CMAKE_INSTALL_LIBDIR}/cmake/quavel
+      -DCMAKE_TOOLCHAIN_FILE=${CMAKE_TOOLCHAIN_FILE} -DCMAKE_CXX_COMPILER=${CMAKE_CXX_COMPILER}
+      -DCMAKE_CXX_FLAGS=${CMAKE_CXX_FLAGS} -DCMAKE_RUNTIME_OUTPUT_DIRECTORY=${consumer_dir}
+    --test-command ${CMAKE_CROSSCOMPILING_EMULATOR}
+      ${consumer_dir}/consumer${CMAKE_EXECUTABLE_SUFFIX} ${consumer_photo})
 set_tests_properties(Package.IsFoundByCMake PROPERTIES FIXTURES_REQUIRED installed_tree)

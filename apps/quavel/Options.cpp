@@ -2,9 +2,9 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <sstream>
 #include <thread>
 
+#include "OptionValues.h"
 #include "photo/Photo.h"
 #include "terminal/Text.h"
 
@@ -12,7 +12,6 @@ namespace app {
 
 namespace {
 
-constexpr unsigned kMostJobs = 256;
 // For files that are not cached: there 32 are several times as fast as 2, and more gain little.
 constexpr unsigned kUsualJobs = 32;
 
@@ -39,37 +38,18 @@ class ShortFormatter : public CLI::Formatter {
   std::string make_positionals(CLI::App const* /*app*/) const override { return {}; }
 };
 
-Field const* wantedField(std::string const& option, std::string const& name) {
-  Field const* const field = fieldNamed(name);
-  if (field == nullptr) {
-    auto const nameOf = [](Field const& known) { return std::string(known.name); };
-    throw CLI::ValidationError(option + ": no field is called '" + name +
-                               "'; choose from: " + CLI::detail::join(allFields(), nameOf, " "));
-  }
-  return field;
-}
-
-/// The parser's own lists pass over empty names.
-void addFields(std::string const& list, Fields& fields) {
-  std::istringstream names(list + ',');  // each name is then ended, an empty last one too
-  for (std::string name; std::getline(names, name, ',');) {
-    auto const* const field = wantedField("--fields", name);
-    if (std::count(fields.begin(), fields.end(), field) > 0) {
-      throw CLI::ValidationError("--fields: '" + name + "' is named twice");
-    }
-    fields.push_back(field);
-  }
-}
-
-std::string refuseEmpty(std::string const& argument) {
-  return argument.empty() ? "is empty: name a file" : "";
-}
-
 void addInputs(CLI::App& command, Options& options) {
   command.add_option("PATH", options.inputs.paths, "Photos and folders of photos")->type_name("");
   auto* const list = command.add_option("--files-from", options.inputs.list,
                                         "Read the photos' paths from a file; -: standard input");
-  list->type_name("FILE")->check(refuseEmpty);
+  list->type_name("FILE")->check(values::refuseEmpty);
+  command.add_flag("--hidden", options.inputs.filter.showsHidden,
+                   "Walk hidden folders, and try files named ._*");
+  command
+      .add_option("--exclude", options.inputs.filter.excluded,
+                  "Leave these names, or paths, out of folders; repeatable")
+      ->allow_extra_args(false)
+      ->type_name("GLOB");
   command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
       ->needs(list);
   auto* const standardInput =
@@ -94,48 +74,49 @@ void addForms(CLI::App& command, Form& form) {
     forms.push_back(flag);
     return flag;
   };
+  add("--table", FormKind::Table, "A table, for one photo too")->excludes(why);
   add("--card", FormKind::Card, "A labelled card for every photo")->excludes(why);
   add("--json", FormKind::Json, "One JSON array, exact values");
   add("--jsonl", FormKind::Jsonl, "One JSON object a line, as they come");
-  add("--csv", FormKind::Csv, "CSV (RFC 4180) with a header row")->excludes(why);
+  auto* const csv = add("--csv", FormKind::Csv, "CSV (RFC 4180) with a header row");
+  csv->excludes(why);
+  add("--print0", FormKind::Paths, "The paths of the photos, NUL-ended")->excludes(why);
+  command.add_flag("--lf", form.endsWithLf, "End the lines of CSV with LF, not CRLF")->needs(csv);
 }
 
 void addChoices(CLI::App& command, Options& options) {
   Form& form = options.form;
   auto const setFields = [&form](std::vector<std::string> const& lists) {
     for (auto const& list : lists) {
-      addFields(list, form.fields);
+      values::addFields(list, form.fields);
     }
   };
-  auto const setSort = [&form](std::string const& name) {
-    form.sort = wantedField("--sort", name);
+  auto const add = [&command](char const* name, char const* type, char const* text, auto set) {
+    command.add_option_function<std::string>(name, set, text)->type_name(type);
   };
-  auto const setAbsent = [&form](std::string const& choice) {
-    if (choice != "skip" && choice != "show") {
-      throw CLI::ValidationError("--absent: give skip or show");
-    }
-    form.showAbsent = choice == "show";
+  auto const addMany = [&command](char const* name, char const* type, char const* text, auto set) {
+    command.add_option_function<std::vector<std::string>>(name, set, text)
+        ->expected(1, CLI::detail::expected_max_vector_size)
+        ->allow_extra_args(false)
+        ->type_name(type);
   };
-  command
-      .add_option_function<std::vector<std::string>>("--fields", setFields,
-                                                     "Show these fields, in this order")
-      ->expected(1, CLI::detail::expected_max_vector_size)
-      ->allow_extra_args(false)
-      ->type_name("A,B,..");
-  command
-      .add_option_function<std::string>("--sort", setSort,
-                                        "Sort by a field; all records are kept until the end")
-      ->type_name("FIELD");
-  command
-      .add_option_function<std::string>("--absent", setAbsent,
-                                        "Absent values: skip or show (CSV always shows)")
-      ->type_name("skip|show");
-  command
-      .add_option_function<unsigned>(
-          "--jobs", [&options](unsigned jobs) { options.jobs = options.cachedJobs = jobs; },
-          "Files read at a time [the processors; 32 if cold]")
-      ->type_name("N")
-      ->check(CLI::Range(1U, kMostJobs));
+  addMany("--fields", "A,B,..", "Show these fields, in this order", setFields);
+  addMany("--where", "EXPR", "Only photos like this, such as 'iso>=3200'; repeatable",
+          [&form](std::vector<std::string> const& texts) { values::addConditions(texts, form); });
+  add("--sort", "[-]FIELD", "Sort by a field (-: downwards), once all are read",
+      [&form](std::string const& name) { values::setSort(form, name); });
+  add("--absent", "skip|show", "Absent values: skip or show (CSV always shows)",
+      [&form](std::string const& choice) {
+        form.showAbsent = values::choose("--absent", choice, "skip", "show");
+      });
+  add("--dates", "exif|iso", "Dates in machine forms: as stored, or ISO 8601",
+      [&form](std::string const& choice) {
+        form.hasIsoDates = values::choose("--dates", choice, "exif", "iso");
+      });
+  add("-j,--jobs", "N", "Files read at a time [the processors; 32 if cold]",
+      [&options](std::string const& jobs) {
+        options.jobs = options.cachedJobs = values::jobsOf(jobs);
+      });
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
 }
 
@@ -155,6 +136,18 @@ void check(Options& options) {
   if (hasPaths == options.fromStdin) {
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
                                         : "no photos given: name files or folders");
+  }
+}
+
+/// The parser would take "--quiet=0" for a wish for noise, and "-q=0" for two options.
+void refuseValuesOfFlags(CLI::App const& command, int argc, char const* const* argv) {
+  for (int i = 1; i < argc && argv[i] != std::string_view("--"); ++i) {
+    std::string const word = argv[i];
+    auto const* const option = command.get_option_no_throw(word.substr(0, word.find('=')));
+    if (word.find('=') != std::string::npos && option != nullptr &&
+        option->get_items_expected_max() == 0) {
+      throw CLI::ValidationError("'" + word + "': this option takes no value");
+    }
   }
 }
 
@@ -178,12 +171,13 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.footer(kFooter);
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
-  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, kMostJobs);
+  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMostJobs);
   options.jobs = std::max(options.cachedJobs, kUsualJobs);
   addInputs(command, options);
   addForms(command, options.form);
   addChoices(command, options);
   try {
+    refuseValuesOfFlags(command, argc, argv);
     command.parse(argc, argv);
     check(options);
   } catch (CLI::CallForHelp const&) {

@@ -7,6 +7,10 @@
 
 #include "terminal/Interrupt.h"
 
+#ifdef __GLIBC__
+#include <malloc.h>
+#endif
+
 namespace app {
 
 namespace {
@@ -27,7 +31,12 @@ long countWaits() { return 0; }
 }  // namespace
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
-    : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {}
+    : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {
+#ifdef __GLIBC__
+  // Each arena takes 64 MB of addresses: one for each thread may exceed the user's limit.
+  ::mallopt(M_ARENA_MAX, 2);
+#endif
+}
 
 Pipeline::~Pipeline() {
   {

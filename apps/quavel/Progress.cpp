@@ -139,9 +139,11 @@ void Progress::sumUp() {
   double const seconds = secondsSince(start_);
   char time[32];
   std::snprintf(time, sizeof time, "%.3f s", seconds);
+  std::string const shown =
+      options_.form.conditions.empty() ? "" : std::to_string(shown_) + " shown, ";
   console_.say(std::to_string(files) + (files == 1 ? " file, " : " files, ") +
                std::to_string(records_) + (records_ == 1 ? " record, " : " records, ") +
-               std::to_string(failures_) + " without record, " + time + ", " +
+               std::to_string(failures_) + " without record, " + shown + time + ", " +
                rate(files, seconds) + " files/s");
 }
 

@@ -23,7 +23,10 @@ class Progress {
   Progress(Progress const&) = delete;
   Progress& operator=(Progress const&) = delete;
 
-  void count(bool hasRecord) { ++(hasRecord ? records_ : failures_); }
+  void count(bool hasRecord, bool isShown) {
+    ++(hasRecord ? records_ : failures_);
+    shown_ += isShown ? 1 : 0;
+  }
   /// Shows the line when it is time to.
   void tick();
   void sumUp();
@@ -44,6 +47,7 @@ class Progress {
   Clock::time_point nextTick_;
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
+  std::size_t shown_ = 0;
   std::thread counter_;
   std::mutex mutex_;
   std::condition_variable hasEnded_;

@@ -5,6 +5,7 @@
 #include <new>
 #include <optional>
 #include <system_error>
+#include <utility>
 
 #include "Pipeline.h"
 #include "Progress.h"
@@ -32,6 +33,7 @@ class Runner {
   int runSource(Source& source);
   std::unique_ptr<Batch> nextBatch(Source& source) const;
   void work(Batch& batch) const;
+  void prepare(Outcome& outcome) const;
   void emitOldest();
   void emit(Outcome&& outcome);
   void emitAll();
@@ -45,6 +47,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;
   std::size_t batchSize_ = 1;
+  bool lacksError_;  // and nobody was told
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -54,12 +57,14 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       writer_(makeWriter(options.form, output)),
       detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
-      pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }) {}
+      pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }),
+      lacksError_(options.form.kind == FormKind::Csv && !options.form.fields.empty() &&
+                  !contains(options.form.fields, "error")) {}
 
 int Runner::run() {
   if (options_.fromStdin) {
     Outcome outcome = readStandardInput(options_.extension, detail_);
-    writer_->prepareSafely(outcome);
+    prepare(outcome);
     emit(std::move(outcome));
     return end();
   }
@@ -111,10 +116,22 @@ void Runner::work(Batch& batch) const {
   batch.outcomes.reserve(batch.inputs.size());
   for (auto& input : batch.inputs) {
     Outcome& outcome = batch.outcomes.emplace_back(readPhoto(std::move(input), detail_));
-    writer_->prepareSafely(outcome);
+    prepare(outcome);
     batch.bytes += outcome.text.size();
   }
   batch.seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+void Runner::prepare(Outcome& outcome) const {
+  Form const& form = options_.form;
+  if (outcome.record && (form.hasIsoDates || !form.isForMachines())) {
+    tidyDates(*outcome.record, form.hasIsoDates);
+  }
+  outcome.isShown = std::all_of(form.conditions.begin(), form.conditions.end(),
+                                [&](Condition const& each) { return each.holds(outcome); });
+  if (outcome.isShown) {
+    writer_->prepareSafely(outcome);
+  }
 }
 
 void Runner::emitAll() {
@@ -137,12 +154,18 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  progress_.count(!outcome.problem);
-  bool const isTold = form.isExplanation() || (options_.isQuiet && form.isForMachines());
+  progress_.count(!outcome.problem, outcome.isShown);
+  bool const isTold =
+      outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
   if (outcome.problem && !isTold) {
     console_.sayOf(outcome.path, outcome.problem.text);
   }
-  writer_->add(std::move(outcome));
+  if (outcome.problem && outcome.isShown && std::exchange(lacksError_, false)) {
+    console_.say("the rows of files without a record do not say why: add error to --fields");
+  }
+  if (outcome.isShown) {
+    writer_->add(std::move(outcome));
+  }
 }
 
 int Runner::end() {

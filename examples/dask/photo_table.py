@@ -1,19 +1,20 @@
 #!/usr/bin/python3
 """Reads a folder tree of photos into one CSV table, on the workers of a Dask cluster.
 
-Each task hands a batch of paths to `quavel --jsonl`. Without --scheduler, the cluster is a number
-of processes on this machine; with it, the workers must see the photos under the same paths.
+Each task reads a batch of paths in the worker's own process. Without --scheduler, the cluster is a
+number of processes on this machine; with it, the workers must see the photos under the same paths.
 """
 import argparse
 import csv
-import json
 import os
-import subprocess
 import sys
 
+import quavel
 from distributed import Client, LocalCluster, as_completed
 
 EXTENSIONS = ("tiff", "tif", "dng", "nef", "cr2", "raf", "arw", "jpeg", "jpg", "nrw", "3fr", "cr3")
+COLUMNS = ("capture_date", "width", "height", "orientation", "model", "lens_model", "iso")
+COLUMNS += ("exposure_time", "f_number", "focal_length")
 
 
 def photo_paths(folder):
@@ -34,30 +35,29 @@ def batches(paths, size):
         yield batch
 
 
-def read_batch(command, paths):
-    """The map step: one object for each path, with an `error` where there is no record."""
-    names = b"".join(os.fsencode(path) + b"\0" for path in paths)
-    # Dask runs a task for each core already, so the command reads one file at a time.
-    arguments = [command, "--jsonl", "--quiet", "--jobs", "1", "--null", "--files-from", "-"]
-    result = subprocess.run(arguments, input=names, capture_output=True, check=False)
-    if result.returncode not in (0, 1):  # 1: some files gave no record, and their lines say so
-        raise RuntimeError(result.stderr.decode(errors="replace"))
-    return [json.loads(line) for line in result.stdout.splitlines()]
+def read_batch(paths):
+    """The map step: one row for each path, with an `error` where there is no record."""
+    rows = []
+    # Dask runs a task for each core already.
+    for path, record, error in quavel.scan(paths, jobs=1):
+        row = {"path": path}
+        if record:
+            row.update((column, getattr(record, column)) for column in COLUMNS)
+        else:
+            row.update(error=error.text, reason=error.reason)
+        rows.append(row)
+    return rows
 
 
 def write_table(rows, out):
-    columns = list(dict.fromkeys(key for row in rows for key in row))
-    table = csv.DictWriter(out, columns, restval="")
+    table = csv.DictWriter(out, ("path", *COLUMNS, "error", "reason"))
     table.writeheader()
-    for row in rows:
-        # Python would write True where the command and other tools write true.
-        table.writerow({k: json.dumps(v) if isinstance(v, bool) else v for k, v in row.items()})
+    table.writerows(rows)
 
 
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("folder")
-    parser.add_argument("--command", default="quavel", help="the quavel command [%(default)s]")
     parser.add_argument("--scheduler", help="address of a running cluster's scheduler")
     parser.add_argument("--workers", type=int, default=os.cpu_count(), help="[%(default)s]")
     parser.add_argument("--batch", type=int, default=500, help="photos in a task [%(default)s]")
@@ -69,8 +69,8 @@ def main():
     with Client(cluster) as client:
         workers = client.scheduler_info()["workers"]
         parts = list(batches(photo_paths(options.folder), options.batch))
-        # pure=False: the files behind equal paths may have changed since they were read last.
-        tasks = client.map(read_batch, [options.command] * len(parts), parts, pure=False)
+        # pure=False: what is at a path may have changed since it was last read.
+        tasks = client.map(read_batch, parts, pure=False)
         rows = [row for _, part in as_completed(tasks, with_results=True) for row in part]
     rows.sort(key=lambda row: row["path"])  # batches end in any order
     write_table(rows, sys.stdout)

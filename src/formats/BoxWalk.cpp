@@ -1,5 +1,7 @@
 #include "formats/BoxWalk.h"
 
+#include <algorithm>
+
 #include "formats/BoxTypes.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVStream.h"
@@ -9,14 +11,13 @@ namespace quavel::detail {
 
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
-  std::int64_t const start = stream->getOffset();
+  long const start = stream->getOffset();
   std::int64_t const position = stream->baseOffset + start;
-  static constexpr char kHeaderPattern[] = "the header of the next box{}";
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
-  if (!header.read(stream)) {
-    return refuseCut(journal, position, box::kHeaderSize, kHeaderPattern, place);
+  if (start > kLastOffset || !header.read(stream)) {
+    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", place);
   }
   // A smaller size, such as 0, would lead the walk back to where it has been. The sizes 0 (to the
   // end of the file) and 1 (64 bits) of the standard are refused too: no metadata follows such a
@@ -30,8 +31,13 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
                   : header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)"
                                         : "");
   }
-  return seek(*stream, start + header.boxSize) ||
-         refuseCut(journal, position + header.boxSize, box::kHeaderSize, kHeaderPattern, place);
+  stream->setOffset(std::min(endOfBox(start, header), kOutOfReach));
+  return true;
+}
+
+long endOfBox(long start, QVCR3BoxHeader const& header) {
+  constexpr std::int64_t kMost = std::numeric_limits<long>::max();
+  return static_cast<long>(std::min(std::int64_t{start} + header.boxSize, kMost));
 }
 
 void append(std::string& out, PlacedBox box) {

@@ -33,6 +33,9 @@ void append(std::string& out, BoxPlace place);
 /// be read, its size is smaller than the header, or the read has seen too many boxes.
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header);
 
+/// Where a box ends, or the last of all offsets when it ends beyond.
+long endOfBox(long start, QVCR3BoxHeader const& header);
+
 }  // namespace detail
 }  // namespace quavel
 

@@ -38,7 +38,7 @@ bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
   }
 
   stream->baseOffset = outerBase;
-  stream->setOffset(start + static_cast<long>(header.size()));  // as `read` above did
+  stream->setOffset(endOfBox(start, header));
   stream->byteOrder = outerOrder;
   return true;
 }

@@ -22,7 +22,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
     return refuse(journalOf(*stream), QVReason::OtherKind, moov.position,
                   "the {} is not a moov box", moov);
   }
-  long const end = start + static_cast<long>(boxHeader->size());  // sought above
+  long const end = endOfBox(start, *boxHeader);
 
   bool const isRead = readChildren(stream, start, end);
   stream->setOffset(end);

@@ -35,7 +35,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   if (uuid.type != box::Uuid) {
     return refuse(journal, QVReason::OtherKind, uuid.position, "the {} is not a uuid box", uuid);
   }
-  long const end = start + static_cast<long>(boxHeader->size());  // sought above
+  long const end = endOfBox(start, *boxHeader);
 
   stream->setOffset(start + static_cast<long>(box::kHeaderSize));
   for (auto& word : userType) {

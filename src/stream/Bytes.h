@@ -69,16 +69,19 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// What may be read after a seek to the last offset allowed, with a position that `long` still
-// holds: more than the entries of a directory take.
-inline constexpr long kReadBeyond = 1L << 20U;
+// Where `long` has 32 bits, nothing beyond 2 GB has an offset. Reads start somewhat before that, so
+// that the offset after all entries of a directory still exists.
+inline constexpr bool kIsLongShort = sizeof(long) < sizeof(std::int64_t);
+inline constexpr long kLastOffset =
+    std::numeric_limits<long>::max() - (kIsLongShort ? 1L << 20U : 0);
 
-/// Moves the stream to an offset. False: `long`, which has 32 bits on some systems, cannot hold it.
-/// Then the stream stays where it is, and nothing must be read from there.
+/// Stands for everything that has no offset.
+inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLongShort ? 1 : 0);
+
+/// Moves the stream to an offset. False: that is out of reach. The stream then stays where it is,
+/// and nothing must be read from there.
 inline bool seek(QVStream& stream, std::int64_t offset) {
-  using Limits = std::numeric_limits<long>;
-  if (sizeof(long) < sizeof(offset) &&
-      (offset < Limits::min() || offset > Limits::max() - kReadBeyond)) {
+  if (offset > kLastOffset || offset < std::numeric_limits<long>::min()) {
     return false;
   }
   stream.setOffset(static_cast<long>(offset));

@@ -188,7 +188,8 @@ std::string describe(std::shared_ptr<QVMetadata> const& record) {
 }
 
 std::string readBuffer(Bytes bytes, std::string const& extension) {
-  return describe(QVReader(dataOf(bytes), bytes.size(), extension).metadata);
+  return describe(
+      QVReader(dataOf(bytes), static_cast<unsigned long>(bytes.size()), extension).metadata);
 }
 
 std::string readStream(std::shared_ptr<QVStream> stream, std::string const& extension) {

@@ -23,16 +23,23 @@ bool Source::nextOfPaths(Input& input) {
   while (walk_ || nextPath_ < inputs_.paths.size()) {
     if (walk_) {
       if (walk_->next(input)) {
+        isWalkEmpty_ = false;
         return true;
       }
       walk_.reset();
+      if (isWalkEmpty_) {
+        std::string const extensions = whyUnknown({});
+        report_(inputs_.paths[nextPath_ - 1], "no photos found in it: no name ends in" +
+                                                  extensions.substr(extensions.rfind(':') + 1));
+      }
       continue;
     }
     std::string const& path = inputs_.paths[nextPath_++];
     struct stat status = {};
     bool const exists = ::stat(path.c_str(), &status) == 0;
     if (exists && S_ISDIR(status.st_mode)) {
-      walk_.emplace(path, report_);
+      walk_.emplace(path, inputs_.filter, report_);
+      isWalkEmpty_ = true;
       continue;
     }
     bool const isFile = exists && S_ISREG(status.st_mode);
@@ -42,12 +49,29 @@ bool Source::nextOfPaths(Input& input) {
   return false;
 }
 
+/// Drops the CR that a list from another system leaves at the end of a path, unless it is truly
+/// the file's. True: nothing else was in the line.
+bool Source::dropCarriageReturn(std::string& path) {
+  struct stat status = {};
+  if (path.back() != '\r' || ::lstat(path.c_str(), &status) == 0) {
+    return false;
+  }
+  path.pop_back();
+  if (!hasCrlf_) {
+    report_(inputs_.list, "its lines end with CRLF; each CR is taken for a part of the line end");
+    hasCrlf_ = true;
+  }
+  return path.empty();
+}
+
 bool Source::nextOfList(Input& input) {
   if (!list_) {
     return false;
   }
-  if (list_->next(input)) {
-    return true;
+  while (list_->next(input)) {
+    if (inputs_.isNulSeparated || !dropCarriageReturn(input.path)) {
+      return true;
+    }
   }
   int const error = list_->error;
   list_.reset();

@@ -15,6 +15,7 @@ struct Inputs {
   std::vector<std::string> paths;
   std::string list;  ///< A file of paths; "-": standard input; empty: none.
   bool isNulSeparated = false;
+  Filter filter;  ///< For the folders among the paths.
 };
 
 /// The files that the inputs name, in their order: paths, then the list.
@@ -30,11 +31,14 @@ class Source {
  private:
   bool nextOfPaths(Input& input);
   bool nextOfList(Input& input);
+  bool dropCarriageReturn(std::string& path);
 
   Inputs const& inputs_;
   Report report_;
   std::size_t nextPath_ = 0;
   std::optional<Walk> walk_;
+  bool isWalkEmpty_ = true;
+  bool hasCrlf_ = false;  // the list's lines end so
   std::optional<PathList> list_;
 };
 

@@ -1,5 +1,6 @@
 #include "input/Walk.h"
 
+#include <fnmatch.h>
 #include <sys/stat.h>
 
 #include <algorithm>
@@ -18,7 +19,8 @@ constexpr std::size_t kUsualPath = 100;  // saves taking memory twice
 
 }  // namespace
 
-Walk::Walk(std::string const& folder, Report report) : report_(std::move(report)) {
+Walk::Walk(std::string const& folder, Filter const& filter, Report report)
+    : filter_(filter), report_(std::move(report)) {
   enter(folder, false);
 }
 
@@ -58,7 +60,7 @@ bool Walk::visit(unsigned char type, std::string path, Input& input) {
     case DT_UNKNOWN:  // not every file system says it here
       return visitUnknown(std::move(path), input);
     default:
-      report_(path, "is not a regular file; passed over");
+      report_(path, "is not a regular file; skipped");
       return false;
   }
 }
@@ -67,14 +69,16 @@ bool Walk::visitUnknown(std::string path, Input& input) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
     if (errno == ELOOP) {
-      report_(path, "is a symbolic link that leads to itself; passed over");
+      report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
     input = {std::move(path), false, {}};  // reading it will tell what is wrong
     return isPhotoExtension(extensionOf(input.path));
   }
   if (S_ISDIR(status.st_mode)) {
-    enter(path, true);
+    if (!isLeftOut({}, path.substr(path.rfind('/') + 1), true)) {
+      enter(path, true);
+    }
     return false;
   }
   if (!isPhotoExtension(extensionOf(path))) {
@@ -102,14 +106,26 @@ bool Walk::isRepeated(std::string const& path, Identity const& identity, bool is
   bool const isInside = std::any_of(levels_.begin(), levels_.end(),
                                     [&](Level const& level) { return level.identity == identity; });
   if (isInside) {
-    report_(path, "symbolic-link loop, back to a folder above; passed over");
+    report_(path, "symbolic-link loop, back to a folder above; skipped");
     return true;
   }
   if (isLink && !linked_.insert(identity).second) {
-    report_(path, "another symbolic link led to this folder before; passed over");
+    report_(path, "another symbolic link led to this folder before; skipped");
     return true;
   }
   return false;
+}
+
+bool Walk::isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const {
+  // macOS puts what other file systems cannot store of IMG.JPG into ._IMG.JPG, which is no photo.
+  if (!filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_")) {
+    return true;
+  }
+  return std::any_of(filter_.excluded.begin(), filter_.excluded.end(), [&](auto const& glob) {
+    bool const isOfPath = glob.find('/') != std::string::npos;
+    std::string const whole = (isOfPath ? folder : std::string()) + std::string(name);
+    return ::fnmatch(glob.c_str(), whole.c_str(), 0) == 0;
+  });
 }
 
 void Walk::readEntries(DIR* folder, Level& level) {
@@ -119,7 +135,7 @@ void Walk::readEntries(DIR* folder, Level& level) {
     unsigned char const type = entry->d_type;
     bool const isWanted = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN ||
                           isPhotoExtension(extensionOf(name));
-    if (isWanted && name != "." && name != "..") {
+    if (isWanted && name != "." && name != ".." && !isLeftOut(level.path, name, type == DT_DIR)) {
       level.entries.push_back({level.names.size(), type});
       level.names.append(name).append(1, '\0');
     }

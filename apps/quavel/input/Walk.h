@@ -9,6 +9,7 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -16,15 +17,22 @@
 
 namespace app {
 
-/// Takes a path that is passed over, and why.
+/// Takes a path that is skipped, and why.
 using Report = std::function<void(std::string const& path, std::string const& why)>;
+
+/// What a walk leaves out besides files that are no photos.
+struct Filter {
+  bool showsHidden = false;           ///< Not set: no "._" files, no folders that begin with ".".
+  std::vector<std::string> excluded;  ///< Globs of names or, with a "/" in them, of paths.
+};
 
 /// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
 /// are followed; one that leads back to a folder above it, or to where another link led before, is
-/// reported and passed over. Holds no more than the names of the folders it is inside of.
+/// reported and skipped. Holds no more than the names of the folders it is inside of.
 class Walk {
  public:
-  Walk(std::string const& folder, Report report);
+  /// The filter must outlive it.
+  Walk(std::string const& folder, Filter const& filter, Report report);
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
@@ -44,11 +52,13 @@ class Walk {
 
   void enter(std::string const& path, bool isLink);
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
+  bool isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const;
   void readEntries(DIR* folder, Level& level);
   void miss(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
 
+  Filter const& filter_;
   Report report_;
   std::vector<Level> levels_;
   std::set<Identity> linked_;

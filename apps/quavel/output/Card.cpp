@@ -33,7 +33,7 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
   static Fields const all = cardFields();
   std::string card;
   if (form.fields.empty()) {
-    card = escaped(outcome.path) + "\n";
+    card = escapedPath(outcome.path) + "\n";
   }
   for (auto const* field : form.fields.empty() ? all : form.fields) {
     std::string const text = inWords(*field, outcome);

@@ -1,4 +1,5 @@
 #include "output/Forms.h"
+#include "terminal/Text.h"
 
 namespace app {
 
@@ -14,6 +15,8 @@ std::string quoted(std::string const& text) {
   }
   return result + '"';
 }
+
+char const* lineEnd(Form const& form) { return form.endsWithLf ? "\n" : "\r\n"; }
 
 Fields columnsOf(Form const& form) {
   Fields fields = form.fields;
@@ -32,18 +35,19 @@ std::string csvHeader(Form const& form) {
   for (auto const* field : columnsOf(form)) {
     header.append(header.empty() ? "" : ",").append(field->name);
   }
-  return header + "\r\n";
+  return header + lineEnd(form);
 }
 
-TextOf csvRows(Form const& form) {
-  return [fields = columnsOf(form)](Outcome const& outcome) {
+TextOf csvRows(Form const& form, bool isForTerminal) {
+  return [fields = columnsOf(form), isForTerminal, end = lineEnd(form)](Outcome const& outcome) {
     std::string row;
     for (auto const* field : fields) {
-      row += quoted(exact(field->value(outcome)));
+      std::string const text = exact(field->value(outcome));
+      row += quoted(isForTerminal ? escaped(text) : text);
       row += ',';
     }
-    row.back() = '\r';
-    return row + '\n';
+    row.pop_back();
+    return row + end;
   };
 }
 

@@ -3,21 +3,28 @@
 
 #include <optional>
 
+#include "photo/Condition.h"
 #include "photo/Field.h"
 
 namespace app {
 
-enum class FormKind { Automatic, Card, Json, Jsonl, Csv };
+enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 
 /// How the files are shown.
 struct Form {
   FormKind kind = FormKind::Automatic;
-  Fields fields;                   ///< Empty: those of the form.
-  Field const* sort = nullptr;     ///< Null: the order of the input.
-  std::optional<bool> showAbsent;  ///< Not set: as the form does.
-  bool hasNotes = false;           ///< The notes of the read are shown too.
+  Fields fields;                      ///< Empty: those of the form.
+  Field const* sort = nullptr;        ///< Null: the order of the input.
+  bool isDescending = false;          ///< Sorted downwards.
+  std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
+  std::optional<bool> showAbsent;     ///< Not set: as the form does.
+  bool hasNotes = false;              ///< The notes of the read are shown too.
+  bool hasIsoDates = false;           ///< Dates are written as ISO 8601 has them.
+  bool endsWithLf = false;            ///< CSV's lines do, instead of CRLF.
 
-  bool isForMachines() const { return kind != FormKind::Automatic && kind != FormKind::Card; }
+  bool isForMachines() const {
+    return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
+  }
   /// Words that say of each file why it gave no record.
   bool isExplanation() const { return hasNotes && !isForMachines(); }
 };

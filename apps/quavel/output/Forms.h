@@ -20,16 +20,17 @@ std::string cardOf(Form const& form, Outcome const& outcome);
 std::string explanationOf(Outcome const& outcome);
 
 /// Comma-separated values by RFC 4180: a row for each file below the header row. Absent values are
-/// empty.
+/// empty. On a terminal, what could steer it is shown as `escaped` does.
 std::string csvHeader(Form const& form);
-TextOf csvRows(Form const& form);
+TextOf csvRows(Form const& form, bool isForTerminal);
 
 /// JSON objects, each on one line, which ends in the form of JSON lines. An infinity, which JSON
 /// has no number for, is the text "Infinity" or "-Infinity"; the notes are an array.
-TextOf jsonObjects(Form const& form);
+TextOf jsonObjects(Form const& form, bool isForTerminal);
 
 /// A table for people, laid out page by page so that no more than a page is ever held. On a
-/// terminal it fits the width; elsewhere nothing is cut. A single file becomes a card.
+/// terminal it fits the width; elsewhere nothing is cut, and the same rows give the same bytes. A
+/// single file becomes a card, unless a table is asked for.
 std::unique_ptr<Writer> makeTable(Form const& form, Output& output);
 
 }  // namespace app

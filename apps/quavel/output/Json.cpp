@@ -17,12 +17,13 @@ bool needsEscape(std::string const& text) {
 }
 
 /// Appends a value that is not absent. Nearly all texts stand as they are; the others are left to
-/// the JSON library.
-void append(std::string& json, Value const& value) {
+/// the JSON library. What would steer a terminal is written as \uNNNN when the text goes to one.
+void append(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && needsEscape(*text)) {
-    json += nlohmann::json(*text).dump(-1, ' ', false, nlohmann::json::error_handler_t::replace);
+    bool const isAscii = isForTerminal && escaped(*text) != *text;
+    json += nlohmann::json(*text).dump(-1, ' ', isAscii, nlohmann::json::error_handler_t::replace);
   } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
     json += '"';
     appendExact(json, value);
@@ -35,7 +36,7 @@ void append(std::string& json, Value const& value) {
 constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};
 
 /// The notes as JSON members, without what does not apply to them.
-std::string notesOf(Outcome const& outcome) {
+std::string notesOf(Outcome const& outcome, bool isForTerminal) {
   auto notes = nlohmann::ordered_json::array();
   for (auto const& note : outcome.notes) {
     nlohmann::ordered_json object = {{"kind", kKinds[static_cast<std::size_t>(note.kind)]}};
@@ -52,11 +53,8 @@ std::string notesOf(Outcome const& outcome) {
     notes.push_back(std::move(object));
   }
   std::string const further = ",\"furtherSteps\":" + std::to_string(outcome.furtherSteps);
-  return ",\"notes\":" + notes.dump() + (outcome.furtherSteps == 0 ? "" : further);
-}
-
-bool holds(Fields const& fields, std::string_view name) {
-  return std::find(fields.begin(), fields.end(), fieldNamed(name)) != fields.end();
+  return ",\"notes\":" + notes.dump(-1, ' ', isForTerminal) +
+         (outcome.furtherSteps == 0 ? "" : further);
 }
 
 /// A field, its name as JSON with a comma before it and a colon after it, and the same with "null".
@@ -79,7 +77,7 @@ Members membersOf(Fields const& fields) {
 
 class JsonObjects {
  public:
-  explicit JsonObjects(Form const& form);
+  JsonObjects(Form const& form, bool isForTerminal);
 
   std::string operator()(Outcome const& outcome) const;
 
@@ -92,15 +90,17 @@ class JsonObjects {
   bool showAbsent_;
   bool hasNotes_;
   bool endsLine_;
+  bool isForTerminal_;
 };
 
-JsonObjects::JsonObjects(Form const& form)
+JsonObjects::JsonObjects(Form const& form, bool isForTerminal)
     : showAbsent_(form.showAbsent.value_or(true)),
       hasNotes_(form.hasNotes),
-      endsLine_(form.kind == FormKind::Jsonl) {
+      endsLine_(form.kind == FormKind::Jsonl),
+      isForTerminal_(isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
   members_ = membersOf(fields);
-  if (holds(fields, "path") && !holds(fields, "pathBytes")) {
+  if (contains(fields, "path") && !contains(fields, "pathBytes")) {
     pathBytes_ = bytesOfErrors_;
   }
 }
@@ -113,7 +113,7 @@ std::string JsonObjects::operator()(Outcome const& outcome) const {
       Value const value = member.field->value(outcome);
       if (!std::holds_alternative<std::monostate>(value)) {
         object += member.name;
-        append(object, value);
+        append(object, value, isForTerminal_);
       } else if (showAbsent) {
         object += member.absent;
       }
@@ -122,7 +122,7 @@ std::string JsonObjects::operator()(Outcome const& outcome) const {
   add(outcome.record ? members_ : errorMembers_, showAbsent_);
   add(outcome.record ? pathBytes_ : bytesOfErrors_, false);
   if (hasNotes_) {
-    object += notesOf(outcome);
+    object += notesOf(outcome, isForTerminal_);
   }
   object.resize(std::max<std::size_t>(object.size(), 1));
   object.front() = '{';  // in place of the first comma
@@ -133,6 +133,8 @@ std::string JsonObjects::operator()(Outcome const& outcome) const {
 
 }  // namespace
 
-TextOf jsonObjects(Form const& form) { return JsonObjects(form); }
+TextOf jsonObjects(Form const& form, bool isForTerminal) {
+  return JsonObjects(form, isForTerminal);
+}
 
 }  // namespace app

@@ -10,14 +10,6 @@ namespace {
 
 constexpr std::size_t kGap = 2;
 
-std::size_t lineWidth(Widths const& widths) {
-  std::size_t sum = 0;
-  for (auto const width : widths) {
-    sum += width == 0 ? 0 : width + kGap;
-  }
-  return sum == 0 ? 0 : sum - kGap;
-}
-
 /// Shortens the widest columns first, each down to its least, until the line fits or none gives.
 void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t line) {
   while (lineWidth(widths) > line) {
@@ -47,6 +39,14 @@ std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& wi
 }
 
 }  // namespace
+
+std::size_t lineWidth(Widths const& widths) {
+  std::size_t sum = 0;
+  for (auto const width : widths) {
+    sum += width == 0 ? 0 : width + kGap;
+  }
+  return sum == 0 ? 0 : sum - kGap;
+}
 
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
   while (true) {

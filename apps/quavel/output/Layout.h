@@ -21,6 +21,9 @@ constexpr std::size_t kUnlimited = std::numeric_limits<std::size_t>::max();
 /// Widths in cells; 0: the column is left out.
 using Widths = std::vector<std::size_t>;
 
+/// The cells that a line takes.
+std::size_t lineWidth(Widths const& widths);
+
 /// The widths for columns whose longest cells take `natural`, in a line of `line` cells.
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line);
 

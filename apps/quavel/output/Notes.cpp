@@ -12,7 +12,7 @@ using quavel::QVNote;
 using quavel::QVNoteKind;
 
 std::string verdictOf(Outcome const& outcome) {
-  std::string const start = escaped(outcome.path) + ": ";
+  std::string const start = escapedPath(outcome.path) + ": ";
   if (outcome.problem) {
     return start + "no record: " + escaped(outcome.problem.text) + ".\n";
   }

@@ -7,7 +7,7 @@
 
 #include "output/Forms.h"
 #include "output/Layout.h"
-#include "photo/Words.h"
+#include "output/Rows.h"
 #include "terminal/Console.h"
 #include "terminal/Text.h"
 
@@ -18,43 +18,18 @@ namespace {
 constexpr std::size_t kPage = 500;
 constexpr auto kPatience = std::chrono::milliseconds(200);
 constexpr auto kFirstPatience = std::chrono::milliseconds(12);  // then a user sees that it works
-constexpr std::size_t kLeastChosen = 6;
 
-std::vector<Column> defaultColumns() {
-  return {{"File", 20, 0, true},     {"Captured", 16, 1, false}, {"Size", 9, 2, false},
-          {"Orient.", 7, 4, false},  {"Camera", 12, 5, false},   {"Lens", 12, 6, false},
-          {"Exposure", 24, 3, false}};
-}
-
-std::string word(std::string_view name, Outcome const& outcome) {
-  return inWords(*fieldNamed(name), outcome);
-}
-
-/// Without the seconds, for which a table has no room.
-std::string minutes(std::string const& date) {
-  bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
-  return isWellMade ? date.substr(0, 16) : date;
-}
-
-std::string withoutVerb(std::string const& orientation) {
-  constexpr std::string_view kVerb = "turn ";
-  return orientation.compare(0, kVerb.size(), kVerb) == 0 ? orientation.substr(kVerb.size())
-                                                          : orientation;
-}
-
-std::vector<std::string> defaultCells(Outcome const& outcome) {
-  return {escaped(outcome.path),           minutes(word("captureDate", outcome)),
-          words::size(*outcome.record),    withoutVerb(word("orientation", outcome)),
-          word("model", outcome),          word("lensModel", outcome),
-          words::exposure(*outcome.record)};
-}
-
-std::vector<Column> columnsOf(Fields const& fields) {
-  std::vector<Column> columns;
-  for (auto const* field : fields) {
-    columns.push_back({field->label, kLeastChosen, 0, field->name == "path"});
+/// The folder that all paths of the rows are in, with a "/" at its end; empty when there is none.
+std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std::size_t column) {
+  std::string folder = rows.front()[column];
+  for (auto const& row : rows) {
+    std::string const& path = row[column];
+    auto const limit =
+        folder.begin() + static_cast<std::ptrdiff_t>(std::min(folder.size(), path.size()));
+    folder.erase(std::mismatch(folder.begin(), limit, path.begin()).first, folder.end());
+    folder.erase(folder.rfind('/') + 1);
   }
-  return columns;
+  return folder.size() <= 2 ? "" : folder;  // "./" and "/" are not in the way
 }
 
 bool isWithin(Widths const& inner, Widths const& outer) {
@@ -71,10 +46,13 @@ class Table : public Writer {
   void end() override;
 
  private:
-  std::vector<std::string> cellsOf(Outcome const& outcome) const;
-  void writePage();
-  Widths naturalWidths() const;
-  void useLayout(Widths const& natural);
+  void writePage(bool isLast);
+  void widen(bool isLast);
+  void fitTerminal();
+  bool isInLayout(std::size_t line) const;
+  void writeHeader();
+  Widths naturalWidths(bool showAll) const;
+  std::vector<std::string> inLayout(std::vector<std::string> cells) const;
 
   Form const& form_;
   Output& output_;
@@ -84,34 +62,32 @@ class Table : public Writer {
   std::size_t files_ = 0;
   std::atomic<bool> isCardLikely_{true};  // no file has come yet: records are kept
   Outcome first_;
+  bool isTerminal_;
+  std::size_t pathColumn_ = 0;  // the number of columns when there is none
   std::size_t line_ = 0;
-  Widths natural_;  // of the layout in use
+  std::string folder_;        // of all paths, when it stands above the table
+  bool hasDaysOnly_ = false;  // dates are shown without the time
+  Widths natural_;            // of the layout in use
   Widths widths_;
 };
 
 Table::Table(Form const& form, Output& output)
     : form_(form),
       output_(output),
-      columns_(form.fields.empty() ? defaultColumns() : columnsOf(form.fields)) {}
+      columns_(rows::columnsOf(form.fields)),
+      isTerminal_(output.isTerminal()) {
+  while (pathColumn_ < columns_.size() && !columns_[pathColumn_].keepsEnd) {
+    ++pathColumn_;
+  }
+}
 
 void Table::prepare(Outcome& outcome) const {
   if (outcome.record) {
-    outcome.cells = cellsOf(outcome);
+    outcome.cells = rows::cellsOf(form_.fields, outcome);
     if (!isCardLikely_) {
       outcome.record.reset();
     }
   }
-}
-
-std::vector<std::string> Table::cellsOf(Outcome const& outcome) const {
-  if (form_.fields.empty()) {
-    return defaultCells(outcome);
-  }
-  std::vector<std::string> cells;
-  for (auto const* field : form_.fields) {
-    cells.push_back(inWords(*field, outcome));
-  }
-  return cells;
 }
 
 void Table::add(Outcome&& outcome) {
@@ -127,66 +103,125 @@ void Table::add(Outcome&& outcome) {
     page_.push_back(std::move(outcome.cells));
   }
   auto const patience = natural_.empty() ? kFirstPatience : kPatience;
-  if (page_.size() == kPage || (files_ > 1 && now - pageStart_ > patience)) {
-    writePage();
+  // Sorted rows come all at once: no page of them needs to be short.
+  bool const isDue =
+      isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > patience;
+  if (page_.size() == kPage || isDue) {
+    writePage(false);
   }
 }
 
 void Table::pause() {
-  if (files_ > 1) {
-    writePage();
+  if (isTerminal_ && files_ > 1) {
+    writePage(false);
   }
 }
 
 void Table::end() {
-  if (files_ == 1) {
+  if (files_ == 1 && form_.kind == FormKind::Automatic) {
     output_.add(cardOf(form_, first_));
   } else {
-    writePage();
+    writePage(true);
   }
 }
 
-void Table::writePage() {
+void Table::writePage(bool isLast) {
   if (page_.empty()) {
     return;
   }
-  useLayout(naturalWidths());
-  for (auto& cells : page_) {
-    std::replace(cells.begin(), cells.end(), std::string(), std::string("-"));
-    output_.add(lineOf(columns_, widths_, cells));
+  if (isTerminal_) {
+    fitTerminal();
+  } else {
+    widen(isLast);
+  }
+  for (auto& row : page_) {
+    row = inLayout(std::move(row));
+    std::replace(row.begin(), row.end(), std::string(), std::string("-"));
+    output_.add(lineOf(columns_, widths_, row));
   }
   page_.clear();
 }
 
-Widths Table::naturalWidths() const {
+/// One header serves all pages, so while more may come there is a column for whatever they bring.
+void Table::widen(bool isLast) {
+  bool const isFirst = natural_.empty();
+  Widths const natural = naturalWidths(!isFirst || !isLast);
+  natural_.resize(columns_.size());
+  std::transform(natural.begin(), natural.end(), natural_.begin(), natural_.begin(),
+                 [](std::size_t a, std::size_t b) { return std::max(a, b); });
+  widths_ = natural_;
+  if (isFirst) {
+    writeHeader();
+  }
+}
+
+/// Gives way in this order: what all paths begin with, cells, the time of day, columns.
+void Table::fitTerminal() {
+  std::size_t const line = terminalWidth(STDOUT_FILENO);
+  if (isInLayout(line)) {
+    return;
+  }
+  output_.add(natural_.empty() ? "" : "\n");
+  line_ = line;
+  folder_.clear();
+  hasDaysOnly_ = false;
+  natural_ = naturalWidths(false);
+  if (lineWidth(natural_) > line && pathColumn_ < columns_.size()) {
+    folder_ = commonFolder(page_, pathColumn_);
+    natural_ = naturalWidths(false);
+  }
+  widths_ = fit(columns_, natural_, line);
+  if (form_.fields.empty() && std::count(widths_.begin(), widths_.end(), 0U) >
+                                  std::count(natural_.begin(), natural_.end(), 0U)) {
+    hasDaysOnly_ = true;
+    natural_ = naturalWidths(false);
+    widths_ = fit(columns_, natural_, line);
+  }
+  output_.add(folder_.empty() ? "" : "In " + folder_ + "\n");
+  writeHeader();
+}
+
+bool Table::isInLayout(std::size_t line) const {
+  auto const isInFolder = [this](std::vector<std::string> const& row) {
+    return folder_.empty() || row[pathColumn_].compare(0, folder_.size(), folder_) == 0;
+  };
+  return line == line_ && std::all_of(page_.begin(), page_.end(), isInFolder) &&
+         isWithin(naturalWidths(false), natural_);
+}
+
+void Table::writeHeader() {
+  std::vector<std::string> labels;
+  for (auto const& column : columns_) {
+    labels.push_back(column.label);
+  }
+  output_.add(lineOf(columns_, widths_, labels));
+}
+
+Widths Table::naturalWidths(bool showAll) const {
+  bool const showAbsent = showAll || form_.showAbsent.value_or(!form_.fields.empty());
   Widths natural(columns_.size(), 0);
-  for (std::size_t i = 0; i < columns_.size(); ++i) {
-    for (auto const& cells : page_) {
-      natural[i] = std::max(natural[i], app::cells(cells[i]));
+  for (auto const& row : page_) {
+    auto const shown = inLayout(row);
+    for (std::size_t i = 0; i < shown.size(); ++i) {
+      natural[i] = std::max(natural[i], app::cells(shown[i]));
     }
-    if (natural[i] > 0 || form_.showAbsent.value_or(!form_.fields.empty())) {
+  }
+  for (std::size_t i = 0; i < natural.size(); ++i) {
+    if (natural[i] > 0 || showAbsent) {
       natural[i] = std::max(natural[i], columns_[i].label.size());
     }
   }
   return natural;
 }
 
-void Table::useLayout(Widths const& natural) {
-  std::size_t const line = output_.isTerminal() ? terminalWidth(STDOUT_FILENO) : kUnlimited;
-  if (line == line_ && isWithin(natural, natural_)) {
-    return;
+std::vector<std::string> Table::inLayout(std::vector<std::string> cells) const {
+  if (!folder_.empty()) {
+    cells[pathColumn_].erase(0, folder_.size());
   }
-  if (!natural_.empty()) {
-    output_.add("\n");
+  if (hasDaysOnly_) {
+    rows::dropTime(cells);
   }
-  line_ = line;
-  natural_ = natural;
-  widths_ = fit(columns_, natural, line);
-  std::vector<std::string> labels;
-  for (auto const& column : columns_) {
-    labels.push_back(column.label);
-  }
-  output_.add(lineOf(columns_, widths_, labels));
+  return cells;
 }
 
 }  // namespace

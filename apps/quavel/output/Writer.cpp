@@ -10,8 +10,6 @@ namespace app {
 
 namespace {
 
-bool isAbsent(Value const& value) { return std::holds_alternative<std::monostate>(value); }
-
 /// Shows each file by a text of its own, with `start` before the first one and `separator` before
 /// the others.
 class TextWriter : public Writer {
@@ -45,29 +43,29 @@ class TextWriter : public Writer {
 /// Keeps all outcomes and hands them to another writer in the order of a field.
 class SortingWriter : public Writer {
  public:
-  SortingWriter(Field const& field, std::unique_ptr<Writer> next)
-      : field_(field), next_(std::move(next)) {}
+  SortingWriter(Form const& form, std::unique_ptr<Writer> next)
+      : form_(form), next_(std::move(next)) {}
 
   void prepare(Outcome&) const override {}
   void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
   void end() override;
 
  private:
-  Field const& field_;
+  Form const& form_;
   std::unique_ptr<Writer> next_;
   std::vector<Outcome> outcomes_;
 };
 
 void SortingWriter::end() {
-  auto const value = field_.value;
-  std::stable_sort(outcomes_.begin(), outcomes_.end(), [value](Outcome const& a, Outcome const& b) {
-    Value const left = value(a);
-    Value const right = value(b);
+  auto const isBefore = [this](Outcome const& a, Outcome const& b) {
+    Value const left = form_.sort->value(a);
+    Value const right = form_.sort->value(b);
     if (isAbsent(left) || isAbsent(right)) {
       return !isAbsent(left) && isAbsent(right);  // what has no value comes last
     }
-    return left < right;
-  });
+    return form_.isDescending ? right < left : left < right;
+  };
+  std::stable_sort(outcomes_.begin(), outcomes_.end(), isBefore);
   for (auto& outcome : outcomes_) {
     next_->prepareSafely(outcome);
     next_->add(std::move(outcome));
@@ -80,12 +78,17 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
   switch (form.kind) {
     case FormKind::Json:
       output.enclose("[", "\n]\n");
-      return std::make_unique<TextWriter>(output, jsonObjects(form), "\n", ",\n");
+      return std::make_unique<TextWriter>(output, jsonObjects(form, output.isTerminal()), "\n",
+                                          ",\n");
     case FormKind::Jsonl:
-      return std::make_unique<TextWriter>(output, jsonObjects(form), "", "");
+      return std::make_unique<TextWriter>(output, jsonObjects(form, output.isTerminal()), "", "");
     case FormKind::Csv:
       output.add(csvHeader(form));
-      return std::make_unique<TextWriter>(output, csvRows(form), "", "");
+      return std::make_unique<TextWriter>(output, csvRows(form, output.isTerminal()), "", "");
+    case FormKind::Paths:
+      return std::make_unique<TextWriter>(
+          output, [](Outcome const& outcome) { return outcome.record ? outcome.path + '\0' : ""; },
+          "", "");
     case FormKind::Card:
       return std::make_unique<TextWriter>(
           output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
@@ -111,12 +114,13 @@ void Writer::prepareSafely(Outcome& outcome) const {
 }
 
 std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
-  bool const isTable = form.kind == FormKind::Automatic && !form.hasNotes;
+  bool const isTable =
+      form.kind == FormKind::Table || (form.kind == FormKind::Automatic && !form.hasNotes);
   auto writer = isTable ? makeTable(form, output) : makeText(form, output);
   if (form.sort == nullptr) {
     return writer;
   }
-  return std::make_unique<SortingWriter>(*form.sort, std::move(writer));
+  return std::make_unique<SortingWriter>(form, std::move(writer));
 }
 
 }  // namespace app

@@ -61,21 +61,20 @@ Value pathBytes(Outcome const& outcome) {
   return hex;
 }
 
-template <class T>
-std::string applied(std::string (*words)(T), Value const& value) {
-  return words(std::get<std::decay_t<T>>(value));
-}
-
-template <auto words>
-std::string said(Value const& value) {
-  return applied(words, value);
-}
-
 std::string plain(std::string const& text) { return text; }
-std::string number(std::int64_t value) { return std::to_string(value); }
-std::string isoSpeed(std::int32_t value) { return number(value); }
+std::string bytes(std::int64_t value) { return std::to_string(value); }
+std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
+
+/// A value in words.
+struct Said {
+  Value const& value;
+  template <class T>
+  std::string operator()(std::string (*words)(T)) const {
+    return words(std::get<std::decay_t<T>>(value));
+  }
+};
 
 struct AppendExact {
   std::string& text;
@@ -100,37 +99,34 @@ struct AppendExact {
 std::vector<Field> const& allFields() {
   using M = QVMetadata;
   static std::vector<Field> const fields = {
-      {"path", "File", path, said<plain>},
-      {"captureDate", "Captured", captureDate, said<words::date>},
-      {"width", "Width", valueOf<&M::width>, said<pixels>},
-      {"height", "Height", valueOf<&M::height>, said<pixels>},
-      {"orientation", "Orientation", valueOf<&M::orientation>, said<words::orientation>},
-      {"isRaw", "Raw format", valueOf<&M::isRaw>, said<words::yesNo>},
-      {"dateTimeOriginal", "Original date", valueOf<&M::dateTimeOriginal>, said<words::date>},
-      {"dateTimeDigitized", "Digitized date", valueOf<&M::dateTimeDigitized>, said<words::date>},
-      {"dateTime", "File date", valueOf<&M::dateTime>, said<words::date>},
-      {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, said<words::yesNo>},
-      {"model", "Camera", valueOf<&M::model>, said<plain>},
-      {"lensModel", "Lens", valueOf<&M::lensModel>, said<plain>},
-      {"iso", "ISO", valueOf<&M::iso>, said<isoSpeed>},
-      {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, said<words::fNumber>},
-      {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>,
-       said<words::exposureTime>},
-      {"apertureValue", "Aperture value", valueOf<&M::apertureValue>, said<words::apex>},
-      {"shutterSpeedValue", "Shutter value", valueOf<&M::shutterSpeedValue>, said<words::apex>},
-      {"focalLength", "Focal length", valueOf<&M::focalLength>, said<words::focalLength>},
-      {"whiteBalance", "White balance", valueOf<&M::whiteBalance>, said<words::whiteBalance>},
-      {"meteringMode", "Metering", valueOf<&M::meteringMode>, said<words::meteringMode>},
-      {"exposureBiasValue", "Exposure bias", valueOf<&M::exposureBiasValue>,
-       said<words::exposureBias>},
-      {"focalLengthIn35mmFilm", "In 35 mm film", valueOf<&M::focalLengthIn35mmFilm>,
-       said<millimetres>},
-      {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, said<words::exposureTime>},
-      {"fNumber", "F-number", valueOf<&M::fNumber>, said<words::fNumber>},
-      {"error", "Error", problem<&Problem::text>, said<plain>},
-      {"reason", "Reason", problem<&Problem::reason>, said<plain>},
-      {"position", "At byte", problem<&Problem::position>, said<number>},
-      {"pathBytes", "File (hex)", pathBytes, said<plain>},
+      {"path", "File", path, plain},
+      {"captureDate", "Captured", captureDate, words::date},
+      {"width", "Width", valueOf<&M::width>, pixels},
+      {"height", "Height", valueOf<&M::height>, pixels},
+      {"orientation", "Orientation", valueOf<&M::orientation>, words::orientation},
+      {"isRaw", "Raw format", valueOf<&M::isRaw>, words::yesNo},
+      {"dateTimeOriginal", "Original date", valueOf<&M::dateTimeOriginal>, words::date},
+      {"dateTimeDigitized", "Digitized date", valueOf<&M::dateTimeDigitized>, words::date},
+      {"dateTime", "File date", valueOf<&M::dateTime>, words::date},
+      {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, words::yesNo},
+      {"model", "Camera", valueOf<&M::model>, plain},
+      {"lensModel", "Lens", valueOf<&M::lensModel>, plain},
+      {"iso", "ISO", valueOf<&M::iso>, isoSpeed},
+      {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, words::fNumber},
+      {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>, words::exposureTime},
+      {"apertureValue", "Aperture value", valueOf<&M::apertureValue>, words::apex},
+      {"shutterSpeedValue", "Shutter value", valueOf<&M::shutterSpeedValue>, words::apex},
+      {"focalLength", "Focal length", valueOf<&M::focalLength>, words::focalLength},
+      {"whiteBalance", "White balance", valueOf<&M::whiteBalance>, words::whiteBalance},
+      {"meteringMode", "Metering", valueOf<&M::meteringMode>, words::meteringMode},
+      {"exposureBiasValue", "Exposure bias", valueOf<&M::exposureBiasValue>, words::exposureBias},
+      {"focalLengthIn35mmFilm", "In 35 mm film", valueOf<&M::focalLengthIn35mmFilm>, millimetres},
+      {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, words::exposureTime},
+      {"fNumber", "F-number", valueOf<&M::fNumber>, words::fNumber},
+      {"error", "Error", problem<&Problem::text>, plain},
+      {"reason", "Reason", problem<&Problem::reason>, plain},
+      {"position", "At byte", problem<&Problem::position>, bytes},
+      {"pathBytes", "File (hex)", pathBytes, plain},
   };
   return fields;
 }
@@ -140,6 +136,10 @@ Field const* fieldNamed(std::string_view name) {
   auto const found = std::find_if(all.begin(), all.end(),
                                   [name](Field const& field) { return field.name == name; });
   return found == all.end() ? nullptr : &*found;
+}
+
+bool contains(Fields const& fields, std::string_view name) {
+  return std::find(fields.begin(), fields.end(), fieldNamed(name)) != fields.end();
 }
 
 Fields recordFields() {
@@ -152,15 +152,21 @@ Fields recordFields() {
 
 std::string inWords(Field const& field, Outcome const& outcome) {
   if (field.value == path) {
-    return escaped(outcome.path);  // here the bytes that are no UTF-8 can be shown
+    return escapedPath(outcome.path);  // here the bytes that are no UTF-8 can be shown
   }
   Value const value = field.value(outcome);
-  if (std::holds_alternative<std::monostate>(value)) {
+  if (isAbsent(value)) {
     return {};
   }
-  std::string text = field.words(value);
+  std::string text = std::visit(Said{value}, field.words);
   text.erase(text.find_last_not_of(' ') + 1);  // cameras pad their texts
   return keepStart(escaped(text), kLongestCell, kMostBytes);
+}
+
+bool isAbsent(Value const& value) {
+  auto const* const text = std::get_if<std::string>(&value);
+  return text != nullptr ? text->find_first_not_of(" :") == std::string::npos
+                         : std::holds_alternative<std::monostate>(value);
 }
 
 void appendExact(std::string& text, Value const& value) { std::visit(AppendExact{text}, value); }

@@ -14,12 +14,17 @@ namespace app {
 /// An exact value; the first alternative is absence. Texts are UTF-8.
 using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
+/// What says a value in words, by the value's type: the same alternatives, without absence.
+using Words = std::variant<std::string (*)(bool), std::string (*)(std::int32_t),
+                           std::string (*)(std::int64_t), std::string (*)(float),
+                           std::string (*)(std::string const&)>;
+
 /// Something that can be told of a file.
 struct Field {
   std::string_view name;  ///< As --fields and the machine forms call it.
   char const* label;      ///< As the card and the table call it.
   Value (*value)(Outcome const&);
-  std::string (*words)(Value const&);  ///< Of a value that is not absent.
+  Words words;
 };
 
 using Fields = std::vector<Field const*>;
@@ -29,12 +34,16 @@ using Fields = std::vector<Field const*>;
 std::vector<Field> const& allFields();
 /// Null when there is no such field.
 Field const* fieldNamed(std::string_view name);
+bool contains(Fields const& fields, std::string_view name);
 /// The fields of a file that gave a record: those up to error.
 Fields recordFields();
 
 /// The field for people: in words, on one line, safe for a terminal and at most 200 cells long
 /// (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
+
+/// There is no value, or a text of nothing but blanks and colons, as cameras without a clock write.
+bool isAbsent(Value const& value);
 
 /// Appends the value for programs: text as it is, digits that read back to the same number,
 /// "Infinity", "true". Nothing when absent.

@@ -35,6 +35,7 @@ struct Outcome {
   char const* format = "";                     ///< As the journal has it.
   std::vector<quavel::QVNote> notes;           ///< When they are wanted.
   std::uint64_t furtherSteps = 0;              ///< Those that the notes leave out.
+  bool isShown = true;                         ///< It meets all conditions.
   std::string text;                            ///< As the chosen form shows it, once prepared.
   std::vector<std::string> cells;              ///< The same for the table.
 };

@@ -6,10 +6,12 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <ctime>
 #include <exception>
 #include <unordered_set>
 #include <utility>
 
+#include "photo/Field.h"
 #include "photo/Reasons.h"
 
 namespace app {
@@ -18,6 +20,7 @@ namespace {
 
 using quavel::QVJournal;
 
+constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kLargestInput = std::size_t{1} << 30;
 
 Problem irregular(mode_t mode) {
@@ -57,6 +60,14 @@ std::string readAll(Problem& problem) {
   }
   problem = {reason::kTooLong, "longer than 1 GiB; give the file's path instead"};
   return bytes;
+}
+
+bool isDate(std::string const& text) {
+  std::tm time = {};
+  char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
+  // Any number of blanks would do before a number.
+  return text.size() == kDateSize && end == text.c_str() + kDateSize && text.find(' ') == 10 &&
+         text.rfind(' ') == 10;
 }
 
 /// Fills the outcome with what `read` gives, unless there is a problem already.
@@ -123,6 +134,17 @@ Outcome readPhoto(Input input, Detail detail) {
     outcome.problem = reason::failure(error);
   }
   return outcome;
+}
+
+void tidyDates(quavel::QVMetadata& record, bool asIso) {
+  for (auto* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
+    if (isAbsent(*date)) {
+      date->clear();
+    } else if (asIso && isDate(*date)) {
+      (*date)[4] = (*date)[7] = '-';
+      (*date)[10] = 'T';
+    }
+  }
 }
 
 Outcome readStandardInput(std::string const& extension, Detail detail) {

@@ -27,12 +27,13 @@ std::string decimal(float value, int digits) {
   return result == "-0" ? "0" : result;
 }
 
+/// The name of a value that is counted from `first`.
 template <std::size_t count>
-std::string named(char const* const (&names)[count], std::int32_t value) {
-  if (value < 0 || static_cast<std::size_t>(value) >= count) {
+std::string named(char const* const (&names)[count], std::int32_t value, std::int32_t first = 0) {
+  if (value < first || static_cast<std::size_t>(value - first) >= count) {
     return "not standard (" + std::to_string(value) + ")";
   }
-  return names[value];
+  return names[value - first];
 }
 
 void append(std::string& text, std::string const& part) {
@@ -52,6 +53,8 @@ std::string date(std::string const& value) {
       value.find_first_not_of("0123456789: ") == std::string::npos) {
     result[4] = '-';
     result[7] = '-';
+  } else if (value.size() == 19 && value[4] == '-' && value[10] == 'T') {
+    result[10] = ' ';
   }
   return result;
 }
@@ -60,7 +63,7 @@ std::string orientation(std::int32_t value) {
   static constexpr char const* kNames[] = {"upright",         "mirrored",         "turn 180",
                                            "mirrored, 180",   "mirrored, 270 CW", "turn 90 CW",
                                            "mirrored, 90 CW", "turn 270 CW"};
-  return value == 0 ? "not standard (0)" : named(kNames, value - 1);
+  return named(kNames, value, 1);
 }
 
 std::string meteringMode(std::int32_t value) {

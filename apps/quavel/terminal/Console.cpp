@@ -23,7 +23,7 @@ void Console::say(std::string const& message) {
 }
 
 void Console::sayOf(std::string const& path, std::string const& problem) {
-  say((path.empty() ? "''" : escaped(path)) + ": " + escaped(problem));
+  say((path.empty() ? "''" : escapedPath(path)) + ": " + escaped(problem));
 }
 
 void Console::showProgress(std::string const& line) {

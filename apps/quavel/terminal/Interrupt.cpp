@@ -15,6 +15,18 @@ std::atomic<bool> isProgressShown{false};
 std::atomic<bool> isWriting{false};
 std::atomic<int> askedBy{0};
 
+/// Dies by the signal, so that a shell's loop around the command ends with it.
+[[noreturn]] void die() {
+  int const signal = askedBy;
+  sigset_t own;
+  ::sigemptyset(&own);
+  ::sigaddset(&own, signal);
+  ::signal(signal, SIG_DFL);
+  ::pthread_sigmask(SIG_UNBLOCK, &own, nullptr);
+  ::raise(signal);
+  ::_exit(128 + signal);
+}
+
 [[noreturn]] void leave() {
   ::alarm(1);  // should nobody read the tail
   isWriting = true;
@@ -24,13 +36,13 @@ std::atomic<int> askedBy{0};
   if (char const* const tail = tailToWrite) {
     write(STDOUT_FILENO, tail);
   }
-  ::_exit(128 + askedBy);
+  die();
 }
 
 void handle(int signal) {
   if (askedBy != 0) {
     if (signal == SIGALRM) {
-      ::_exit(128 + askedBy);
+      die();
     }
     return;  // the end is under way, and the alarm bounds it
   }

@@ -5,9 +5,8 @@
 
 #include <string_view>
 
-/// Ends the process at once, with status 128 + the signal's number, when the user or the system
-/// asks for it. No thread waits for that: a second thread makes each system call of a reader
-/// dearer.
+/// Ends the process at once, by the signal, when the user or the system asks for it. No thread
+/// waits for that: a second thread makes each system call of a reader dearer.
 namespace app::interrupt {
 
 /// Must be called once, on the thread that writes, before any other is started. Signals that are

@@ -144,6 +144,13 @@ std::string escaped(std::string const& text) {
   return result;
 }
 
+std::string escapedPath(std::string path) {
+  for (auto at = path.find('\\'); at != std::string::npos; at = path.find('\\', at + 2)) {
+    path.insert(at, 1, '\\');
+  }
+  return escaped(path);
+}
+
 std::size_t cells(std::string_view text) {
   if (isPlain(text)) {
     return text.size();

@@ -19,6 +19,8 @@ std::string pathAsUtf8(std::string const& path);
 /// characters, bytes that are no UTF-8 and characters that reorder their neighbours become \n, \t,
 /// \xNN or \u{NNNN}. Always one line of valid UTF-8; other text is kept as it is.
 std::string escaped(std::string const& text);
+/// The same for a file's name, whose own backslashes become two each.
+std::string escapedPath(std::string path);
 
 /// Terminal cells that an escaped text takes.
 std::size_t cells(std::string_view text);

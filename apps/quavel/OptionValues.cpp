@@ -1,0 +1,79 @@
+#include "OptionValues.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <charconv>
+#include <sstream>
+#include <stdexcept>
+
+namespace app::values {
+
+namespace {
+
+Field const* wantedField(std::string const& option, std::string const& name) {
+  Field const* const field = fieldNamed(name);
+  if (field == nullptr) {
+    auto const nameOf = [](Field const& known) { return std::string(known.name); };
+    throw CLI::ValidationError(option + ": no field is called '" + name +
+                               "'; choose from: " + CLI::detail::join(allFields(), nameOf, " "));
+  }
+  return field;
+}
+
+}  // namespace
+
+/// The parser's own lists pass over empty names.
+void addFields(std::string const& list, Fields& fields) {
+  std::istringstream names(list + ',');  // each name is then ended, an empty last one too
+  for (std::string name; std::getline(names, name, ',');) {
+    auto const* const field = wantedField("--fields", name);
+    if (std::count(fields.begin(), fields.end(), field) > 0) {
+      throw CLI::ValidationError("--fields: '" + name + "' is named twice");
+    }
+    fields.push_back(field);
+  }
+}
+
+std::string refuseEmpty(std::string const& argument) {
+  return argument.empty() ? "is empty: name a file" : "";
+}
+
+void setSort(Form& form, std::string const& name) {
+  form.isDescending = name.substr(0, 1) == "-";
+  form.sort = wantedField("--sort", name.substr(form.isDescending ? 1 : 0));
+}
+
+void addConditions(std::vector<std::string> const& texts, Form& form) {
+  for (auto const& text : texts) {
+    std::string name = text.substr(0, text.find_first_of(Condition::kSigns));
+    auto const comparison = std::string_view(text).substr(name.size());
+    name.erase(name.find_last_not_of(' ') + 1);
+    auto const* const field = wantedField("--where", name);
+    try {
+      form.conditions.emplace_back(*field, comparison);
+    } catch (std::invalid_argument const& error) {
+      throw CLI::ValidationError(std::string("--where: ") + error.what());
+    }
+  }
+}
+
+bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes) {
+  if (choice != no && choice != yes) {
+    throw CLI::ValidationError(option + ": '" + choice + "': give " + no + " or " + yes);
+  }
+  return choice == yes;
+}
+
+/// The parser's own numbers may be in other notations.
+unsigned jobsOf(std::string const& text) {
+  unsigned jobs = 0;
+  auto const* const end = text.data() + text.size();
+  auto const result = std::from_chars(text.data(), end, jobs);
+  if (result.ec != std::errc() || result.ptr != end || jobs < 1 || jobs > kMostJobs) {
+    throw CLI::ValidationError("--jobs: '" + text + "' is not a number from 1 to " +
+                               std::to_string(kMostJobs));
+  }
+  return jobs;
+}
+
+}  // namespace app::values

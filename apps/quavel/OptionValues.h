@@ -1,0 +1,26 @@
+#ifndef QUAVEL_APPS_OPTIONVALUES_H
+#define QUAVEL_APPS_OPTIONVALUES_H
+
+#include <string>
+#include <vector>
+
+#include "output/Form.h"
+
+/// What the options' arguments mean. Each refuses a wrong one with a CLI::ValidationError that
+/// names it.
+namespace app::values {
+
+constexpr unsigned kMostJobs = 256;
+
+void addFields(std::string const& list, Fields& fields);
+void setSort(Form& form, std::string const& name);
+void addConditions(std::vector<std::string> const& texts, Form& form);
+/// Whether the choice is `yes`.
+bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
+unsigned jobsOf(std::string const& text);
+/// For the parser: why the argument is wrong, or nothing.
+std::string refuseEmpty(std::string const& argument);
+
+}  // namespace app::values
+
+#endif  // QUAVEL_APPS_OPTIONVALUES_H

@@ -1,0 +1,80 @@
+#include "output/Rows.h"
+
+#include "photo/Words.h"
+#include "terminal/Text.h"
+
+namespace app::rows {
+
+namespace {
+
+constexpr std::size_t kLeastChosen = 3;
+constexpr std::size_t kLeastPath = 8;
+constexpr std::size_t kDateColumn = 1;  // of the default ones
+constexpr std::size_t kDay = 10;        // "2018-02-21"
+constexpr std::size_t kMinute = 16;     // "2018-02-21 12:08"
+
+std::vector<Column> defaultColumns() {
+  return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
+          {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
+          {"Exposure", 12, 5, false}};
+}
+
+std::string word(std::string_view name, Outcome const& outcome) {
+  return inWords(*fieldNamed(name), outcome);
+}
+
+bool isMinute(std::string const& date) {
+  return date.size() == kMinute && date[4] == '-' && date[13] == ':';
+}
+
+/// Without the seconds, for which a table has no room.
+std::string minutes(std::string const& date) {
+  bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
+  return isWellMade ? date.substr(0, 16) : date;
+}
+
+std::string withoutVerb(std::string const& orientation) {
+  constexpr std::string_view kVerb = "turn ";
+  return orientation.compare(0, kVerb.size(), kVerb) == 0 ? orientation.substr(kVerb.size())
+                                                          : orientation;
+}
+
+Cells defaultCells(Outcome const& outcome) {
+  return {escapedPath(outcome.path),       minutes(word("captureDate", outcome)),
+          words::size(*outcome.record),    withoutVerb(word("orientation", outcome)),
+          word("model", outcome),          word("lensModel", outcome),
+          words::exposure(*outcome.record)};
+}
+
+}  // namespace
+
+std::vector<Column> columnsOf(Fields const& fields) {
+  if (fields.empty()) {
+    return defaultColumns();
+  }
+  std::vector<Column> columns;
+  for (auto const* field : fields) {
+    bool const isPath = field->name == "path";
+    columns.push_back({field->label, isPath ? kLeastPath : kLeastChosen, 0, isPath});
+  }
+  return columns;
+}
+
+Cells cellsOf(Fields const& fields, Outcome const& outcome) {
+  if (fields.empty()) {
+    return defaultCells(outcome);
+  }
+  Cells cells;
+  for (auto const* field : fields) {
+    cells.push_back(inWords(*field, outcome));
+  }
+  return cells;
+}
+
+void dropTime(Cells& cells) {
+  if (isMinute(cells[kDateColumn])) {
+    cells[kDateColumn].resize(kDay);
+  }
+}
+
+}  // namespace app::rows

@@ -1,0 +1,92 @@
+#include "photo/Condition.h"
+
+#include <algorithm>
+#include <charconv>
+#include <iterator>
+#include <stdexcept>
+#include <system_error>
+#include <type_traits>
+
+namespace app {
+
+namespace {
+
+// As Relation has them; the longer ones come first. "=" serves those who mean "==".
+constexpr std::string_view kRelations[] = {">=", "<=", "!=", "==", ">", "<", "~"};
+constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
+                                  "a text"};
+
+/// The whole text as a value of a field's type; absent when it is none.
+struct Parsed {
+  std::string_view text;
+
+  template <class T>
+  Value operator()(std::string (*)(T)) const {
+    std::decay_t<T> value = {};
+    if constexpr (std::is_same_v<decltype(value), std::string>) {
+      return text.empty() ? Value() : Value(std::string(text));
+    } else if constexpr (std::is_same_v<T, bool>) {
+      return text == "true" || text == "false" ? Value(text == "true") : Value();
+    } else {
+      auto const* const end = text.data() + text.size();
+      auto const result = std::from_chars(text.data(), end, value);
+      bool const isWhole = result.ec == std::errc() && result.ptr == end;
+      return isWhole && value == value ? Value(value) : Value();  // NaN equals nothing
+    }
+  }
+};
+
+[[noreturn]] void refuse(std::string_view text, std::string const& why) {
+  throw std::invalid_argument("'" + std::string(text) + "' " + why);
+}
+
+}  // namespace
+
+Condition::Condition(Field const& field, std::string_view comparison)
+    : field_(field), relation_(Relation::Equal) {
+  std::size_t length = comparison.substr(0, 1) == "=" ? 1 : 0;
+  for (std::size_t i = std::size(kRelations); i-- > 0;) {
+    if (comparison.substr(0, kRelations[i].size()) == kRelations[i]) {
+      relation_ = static_cast<Relation>(i);
+      length = kRelations[i].size();
+    }
+  }
+  if (length == 0) {
+    refuse(std::string(field.name).append(comparison),
+           "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
+  }
+  comparison.remove_prefix(length);
+  comparison.remove_prefix(std::min(comparison.find_first_not_of(' '), comparison.size()));
+  value_ = std::visit(Parsed{comparison}, field.words);
+  if (std::holds_alternative<std::monostate>(value_)) {
+    refuse(comparison, std::string("is not ") + kTypes[field.words.index()]);
+  }
+  if (relation_ == Relation::Contains && !std::holds_alternative<std::string>(value_)) {
+    refuse("~", "looks into texts; " + std::string(field.name) + " is not one");
+  }
+}
+
+bool Condition::holds(Outcome const& outcome) const {
+  Value const value = field_.value(outcome);
+  if (isAbsent(value)) {
+    return false;
+  }
+  switch (relation_) {
+    case Relation::AtLeast:
+      return value >= value_;
+    case Relation::AtMost:
+      return value <= value_;
+    case Relation::Unequal:
+      return value != value_;
+    case Relation::Equal:
+      return value == value_;
+    case Relation::More:
+      return value > value_;
+    case Relation::Less:
+      return value < value_;
+    default:
+      return std::get<std::string>(value).find(std::get<std::string>(value_)) != std::string::npos;
+  }
+}
+
+}  // namespace app

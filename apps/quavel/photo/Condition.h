@@ -1,0 +1,34 @@
+#ifndef QUAVEL_APPS_CONDITION_H
+#define QUAVEL_APPS_CONDITION_H
+
+#include <string>
+#include <string_view>
+
+#include "photo/Field.h"
+
+namespace app {
+
+/// A comparison that the photos shown must meet.
+class Condition {
+ public:
+  /// What may begin the comparison after a field's name.
+  static constexpr char kSigns[] = "<>=!~";
+
+  /// `comparison` is a relation and a value, such as ">=3200". Throws std::invalid_argument, with
+  /// the words that were wrong, when it is not or does not go with the field.
+  Condition(Field const& field, std::string_view comparison);
+
+  /// Compares exact values. An absent value never meets it.
+  bool holds(Outcome const& outcome) const;
+
+ private:
+  enum class Relation { AtLeast, AtMost, Unequal, Equal, More, Less, Contains };
+
+  Field const& field_;
+  Relation relation_;
+  Value value_;
+};
+
+}  // namespace app
+
+#endif  // QUAVEL_APPS_CONDITION_H

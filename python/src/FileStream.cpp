@@ -1,0 +1,56 @@
+#include "FileStream.h"
+
+#include <cstring>
+#include <string>
+
+#include "Arguments.h"
+
+namespace binding {
+
+FileStream::FileStream(py::handle file)
+    : read_(py::getattr(file, "read", py::none())), seek_(py::getattr(file, "seek", py::none())) {
+  if (read_.is_none() || seek_.is_none()) {
+    throw py::type_error(std::string("file must be a binary file with read() and seek(), not ") +
+                         Py_TYPE(file.ptr())->tp_name);
+  }
+}
+
+std::int64_t FileStream::readBuffer(std::uint8_t* destination, std::size_t count) {
+  if (filePosition_ != position_) {
+    seek_(position_);
+    filePosition_ = position_;
+  }
+  // Unbuffered files deliver less than they have.
+  std::size_t total = 0;
+  while (total < count) {
+    std::size_t const delivered = readOnce(destination + total, count - total);
+    if (delivered == 0) {
+      break;
+    }
+    total += delivered;
+  }
+  position_ += static_cast<std::int64_t>(total);
+  filePosition_ = position_;
+  return static_cast<std::int64_t>(total);
+}
+
+std::size_t FileStream::readOnce(std::uint8_t* destination, std::size_t count) {
+  py::object const result = read_(count);
+  Bytes const bytes(result, "what file.read() returns");
+  if (bytes.size() > count) {
+    throw py::value_error("file.read(" + std::to_string(count) + ") returned " +
+                          std::to_string(bytes.size()) + " bytes");
+  }
+  std::memcpy(destination, bytes.data(), bytes.size());
+  return bytes.size();
+}
+
+void FileStream::setOffset(long const& offset) {
+  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
+                                                static_cast<std::uint64_t>(offset));
+  if (target >= 0) {
+    position_ = target;
+  }
+}
+
+}  // namespace binding

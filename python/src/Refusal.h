@@ -1,0 +1,36 @@
+#ifndef QUAVEL_PYTHON_REFUSAL_H
+#define QUAVEL_PYTHON_REFUSAL_H
+
+#include <pybind11/pybind11.h>
+#include <quavel/QVJournal.h>
+
+#include <cstdint>
+#include <string>
+
+namespace binding {
+
+namespace py = pybind11;
+
+/// Why there is no record.
+struct Refusal {
+  std::string reason;
+  std::string text;
+  std::int64_t position = -1;
+  int systemError = 0;
+};
+
+/// Of a read that gave no record.
+Refusal refusalOf(quavel::QVJournal const& journal);
+
+/// The exception `NoRecord`; `path` is None for what was not read by path.
+py::object noRecord(Refusal const& refusal, py::handle path);
+
+/// Throws it.
+[[noreturn]] void raiseNoRecord(quavel::QVJournal const& journal, py::handle path);
+
+/// The value, or None where it is the one that means absence.
+py::object orNone(std::int64_t value, std::int64_t absent);
+
+}  // namespace binding
+
+#endif  // QUAVEL_PYTHON_REFUSAL_H

@@ -1,0 +1,191 @@
+#include "Scanner.h"
+
+#include <unistd.h>
+
+#include <algorithm>
+#include <thread>
+#include <utility>
+
+#include "Arguments.h"
+
+namespace binding {
+
+namespace {
+
+constexpr std::size_t kLargestBatch = 64;
+// A batch is to be short enough for results to flow and long enough to be worth handing over.
+constexpr double kLongBatch = 0.002;
+// For files that are not cached: there 32 are several times as fast as 2, and more gain little.
+constexpr unsigned kUsualJobs = 32;
+// How long Ctrl-C may go unnoticed.
+constexpr std::chrono::milliseconds kPatience{50};
+
+std::unique_ptr<Pipeline> makePipeline(unsigned jobs) {
+  unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
+  return jobs != 0 ? std::make_unique<Pipeline>(jobs, jobs)
+                   : std::make_unique<Pipeline>(std::max(processors, kUsualJobs), processors);
+}
+
+/// A path of a folder's, as os.fsdecode gives it.
+py::object decoded(std::string const& path, bool isBytes) {
+  auto const size = static_cast<Py_ssize_t>(path.size());
+  auto* const object = isBytes ? PyBytes_FromStringAndSize(path.data(), size)
+                               : PyUnicode_DecodeFSDefaultAndSize(path.data(), size);
+  if (object == nullptr) {
+    throw py::error_already_set();
+  }
+  return py::reinterpret_steal<py::object>(object);
+}
+
+/// A named tuple, filled without a call of Python code: there is one for each photo.
+py::object makeResult(PyTypeObject* type, py::object path, py::object record, py::object error) {
+  auto const result = py::reinterpret_steal<py::object>(type->tp_alloc(type, 3));
+  if (!result) {
+    throw py::error_already_set();
+  }
+  PyTuple_SET_ITEM(result.ptr(), 0, path.release().ptr());
+  PyTuple_SET_ITEM(result.ptr(), 1, record.release().ptr());
+  PyTuple_SET_ITEM(result.ptr(), 2, error.release().ptr());
+  return result;
+}
+
+}  // namespace
+
+Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
+    : source_(std::move(source)), process_(::getpid()), pipeline_(makePipeline(jobs)) {
+  if (isFolder) {
+    isBytes_ = py::isinstance<py::bytes>(source_);
+    std::string folder = pathOf(source_, "paths_or_folder");
+    py::gil_scoped_release const release;
+    walk_.emplace(std::move(folder));
+  }
+}
+
+py::list Scanner::nextBatch() {
+  if (process_ != ::getpid()) {
+    throw std::runtime_error("a scan cannot go on in a forked process: its threads are not there");
+  }
+  if (!pipeline_) {
+    return py::list();
+  }
+  while (source_ && order_.size() < 2 * pipeline_->limit()) {
+    submitNext();
+  }
+  if (order_.empty()) {
+    if (failure_) {
+      throw std::exchange(failure_, std::nullopt).value();
+    }
+    return py::list();
+  }
+  waitForOldest();
+  auto const work = std::move(order_.front());
+  order_.pop_front();
+  batchSize_ = work->batch.seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
+                                                : std::min(batchSize_ * 2, kLargestBatch);
+  return resultsOf(*work);
+}
+
+void Scanner::submitNext() {
+  auto work = std::make_unique<Work>();
+  if (walk_) {
+    takeFound(*work);
+  } else {
+    takePaths(*work);
+  }
+  if (!work->batch.photos.empty()) {
+    order_.push_back(std::move(work));
+    pipeline_->submit(order_.back()->batch, order_.size());
+  }
+}
+
+void Scanner::takeFound(Work& work) {
+  bool isFound = true;
+  {
+    py::gil_scoped_release const release;
+    Photo photo;
+    while (work.batch.photos.size() < batchSize_ && (isFound = walk_->next(photo))) {
+      work.batch.photos.push_back(std::move(photo));
+    }
+  }
+  if (!isFound) {
+    source_ = py::object();
+  }
+}
+
+void Scanner::takePaths(Work& work) {
+  try {
+    while (work.batch.photos.size() < batchSize_) {
+      auto const path = py::reinterpret_steal<py::object>(PyIter_Next(source_.ptr()));
+      if (!path) {
+        source_ = py::object();
+        if (PyErr_Occurred() != nullptr) {
+          throw py::error_already_set();
+        }
+        return;
+      }
+      Photo photo;
+      try {
+        photo.path = pathOf(path, "a path of paths_or_folder");
+      } catch (py::error_already_set const& error) {
+        if (!error.matches(PyExc_ValueError)) {
+          throw;
+        }
+        photo.refusal = {"bad-path", "the path holds what no path can", -1, 0};
+      }
+      work.paths.append(path);
+      work.batch.photos.push_back(std::move(photo));
+    }
+  } catch (py::error_already_set& error) {
+    source_ = py::object();
+    if (!error.matches(PyExc_Exception)) {
+      throw;  // such as KeyboardInterrupt
+    }
+    failure_ = std::move(error);  // after the results of the paths before it
+  }
+}
+
+void Scanner::waitForOldest() {
+  Batch const& oldest = order_.front()->batch;
+  bool isDone = pipeline_->isDone(oldest);
+  while (!isDone) {
+    {
+      py::gil_scoped_release const release;
+      isDone = pipeline_->waitFor(oldest, kPatience);
+    }
+    if (PyErr_CheckSignals() != 0) {
+      throw py::error_already_set();
+    }
+  }
+}
+
+py::list Scanner::resultsOf(Work& work) {
+  auto const type = py::module_::import("quavel._types").attr("Result");
+  auto* const resultType = reinterpret_cast<PyTypeObject*>(type.ptr());
+  auto& photos = work.batch.photos;
+  py::list results(photos.size());
+  for (std::size_t i = 0; i < photos.size(); ++i) {
+    Photo& photo = photos[i];
+    py::object path = walk_ ? decoded(photo.path, isBytes_) : py::object(work.paths[i]);
+    py::object error = photo.record ? py::none() : noRecord(photo.refusal, path);
+    results[i] = makeResult(resultType, std::move(path), py::cast(std::move(photo.record)),
+                            std::move(error));
+  }
+  return results;
+}
+
+void Scanner::close() {
+  source_ = py::object();
+  if (process_ != ::getpid()) {
+    // The threads exist in the parent alone, and what they worked on may be half done.
+    static_cast<void>(pipeline_.release());
+    for (auto& work : order_) {
+      static_cast<void>(work.release());
+    }
+  } else {
+    py::gil_scoped_release const release;
+    pipeline_.reset();
+  }
+  order_.clear();
+}
+
+}  // namespace binding

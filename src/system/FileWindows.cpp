@@ -1,0 +1,100 @@
+#define WIN32_LEAN_AND_MEAN
+#define NOMINMAX
+#include <fcntl.h>
+#include <io.h>
+#include <sys/stat.h>
+#include <windows.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <climits>
+#include <cstdio>
+#include <vector>
+
+#include "system/File.h"
+
+namespace quavel::detail::file {
+
+namespace {
+
+/// Empty: it is not UTF-8.
+std::wstring widened(std::string const& path) {
+  int const size =
+      ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, nullptr, 0);
+  std::vector<wchar_t> wide(static_cast<std::size_t>(size) + 1);
+  ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, wide.data(), size);
+  return wide.data();
+}
+
+/// Paths of MAX_PATH characters and more are only taken whole, and so marked.
+std::wstring marked(std::wstring const& path) {
+  DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);
+  std::vector<wchar_t> whole(std::size_t{size} + 1);
+  if (size < MAX_PATH || ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
+    return path;
+  }
+  std::wstring const full = whole.data();
+  if (full.compare(0, 4, L"\\\\?\\") == 0) {
+    return full;
+  }
+  return full.compare(0, 2, L"\\\\") == 0 ? L"\\\\?\\UNC" + full.substr(1) : L"\\\\?\\" + full;
+}
+
+int errorNumber(DWORD error) {
+  switch (error) {
+    case ERROR_FILE_NOT_FOUND:
+    case ERROR_PATH_NOT_FOUND:
+    case ERROR_INVALID_NAME:
+    case ERROR_INVALID_DRIVE:
+    case ERROR_BAD_NETPATH:
+    case ERROR_BAD_NET_NAME:
+      return ENOENT;
+    case ERROR_TOO_MANY_OPEN_FILES:
+      return EMFILE;
+    case ERROR_NOT_READY:
+      return EIO;
+    default:
+      return EACCES;
+  }
+}
+
+}  // namespace
+
+int open(std::string const& path) {
+  std::wstring const wide = marked(widened(path));
+  // Others may go on reading, writing, renaming and deleting the file, as on other systems.
+  HANDLE const handle = ::CreateFileW(wide.c_str(), GENERIC_READ,
+                                      FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
+                                      nullptr, OPEN_EXISTING, FILE_ATTRIBUTE_NORMAL, nullptr);
+  if (handle == INVALID_HANDLE_VALUE) {
+    errno = errorNumber(::GetLastError());
+    return -1;
+  }
+  int const fd = ::_open_osfhandle(reinterpret_cast<std::intptr_t>(handle), _O_RDONLY | _O_BINARY);
+  if (fd == -1) {
+    ::CloseHandle(handle);
+  }
+  return fd;
+}
+
+void close(int fd) { ::_close(fd); }
+
+std::int64_t read(int fd, std::uint8_t* destination, std::size_t count) {
+  return ::_read(fd, destination, static_cast<unsigned>(std::min<std::size_t>(count, INT_MAX)));
+}
+
+std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::int64_t position) {
+  return seek(fd, position) == -1 ? -1 : read(fd, destination, count);
+}
+
+std::int64_t position(int fd) { return ::_telli64(fd); }
+
+std::int64_t seek(int fd, std::int64_t position) { return ::_lseeki64(fd, position, SEEK_SET); }
+
+std::int64_t size(int fd) {
+  struct _stat64 status = {};
+  bool const isRegular = ::_fstat64(fd, &status) == 0 && (status.st_mode & _S_IFMT) == _S_IFREG;
+  return isRegular ? status.st_size : -1;
+}
+
+}  // namespace quavel::detail::file
