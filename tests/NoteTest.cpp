@@ -178,7 +178,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
 
 TEST(Notes, SayNothingOfWhatExplainsNothing) {
   Bytes image = jpegFile(tiff(kII, jpegExif()));
-  image[30] = '\x7f';  // in the Exif structure: the opening is as it should be
+  image[24] = '\x7f';  // an entry's type: the opening is as it should be
   std::pair<std::string, Bytes> const rows[] = {
       {"tif", oneEntry(shorts(kOrientation, {1, 1}))},  // it looks like what it is read as
       {"raf", rafFile(image, "")},
