@@ -60,7 +60,8 @@ struct Segments : QVStream {
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
     Bytes const period("\xff\xd8\xff\xe2\xff\xfe\0\0", 8);
     bool const isThere = position < std::int64_t{1} << 32U;
-    period.copy(reinterpret_cast<char*>(destination), isThere ? count : 0, position % 8);
+    period.copy(reinterpret_cast<char*>(destination), isThere ? count : 0,
+                static_cast<std::size_t>(position % 8));
     position += isThere ? static_cast<std::int64_t>(count) : 0;
     return isThere ? static_cast<std::int64_t>(count) : 0;
   }

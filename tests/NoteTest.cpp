@@ -140,6 +140,7 @@ TEST(Notes, TellWhyAFieldIsAbsent) {
        "width not-in-file: IFD0 at 8 names 1 SubIFD (0x014a); the raw image is in number 2\n"},
       {"nef", oneSubIFD, "model not-in-format: given by CR3 files only\n"},
       {"nef", oneSubIFD, "dateTime not-in-format: never taken from NEF files\n"},
+      {"nef", tiff(kII, nef()), "dateTimeDigitized not-in-format: never taken from NEF files\n"},
       {"jpg", kSOI + sof0(0, 0),
        "width not-in-file: the SOF0 segment at 2 declares 0 x 0; no Exif IFD gives a size\n"},
       {"jpg", jpegWith({{longs(kWidth, {0xfffffff0}), longs(kLength, {600})}}),
@@ -178,7 +179,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
 
 TEST(Notes, SayNothingOfWhatExplainsNothing) {
   Bytes image = jpegFile(tiff(kII, jpegExif()));
-  image[30] = '\x7f';  // in the Exif structure: the opening is as it should be
+  image[24] = '\x7f';  // an entry's type: the opening is as it should be
   std::pair<std::string, Bytes> const rows[] = {
       {"tif", oneEntry(shorts(kOrientation, {1, 1}))},  // it looks like what it is read as
       {"raf", rafFile(image, "")},

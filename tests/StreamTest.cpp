@@ -244,7 +244,10 @@ TEST(ReadAheadStream, TakesNothingFromASourceThatBoastsOrThrows) {
   source->mostAtOnce = 1;
   QVReadAheadStream stream(source, 2, 2);
   EXPECT_EQ(next(stream, &QVStream::readLong), 0x12345678U);
-  source->onRead = [](auto*, std::size_t count) { return static_cast<std::int64_t>(count) + 1; };
+  source->mostAtOnce = SIZE_MAX;
+  source->onRead = [&](auto* destination, std::size_t count) {
+    return source->deliver(destination, count) + 1;
+  };
   EXPECT_TRUE(std::isnan(next(stream, &QVStream::readShort)));
   source->onRead = nullptr;
   EXPECT_EQ(next(stream, &QVStream::readShort), 0x9abc);
