@@ -390,7 +390,8 @@ class Inputs(CommandTest):
             self.put(name, photo())
         os.mkfifo(self.folder / "in/pipe.jpg")
         for link, target in (("up", ".."), ("self", "self"), ("far", "../other"),
-                             ("far2", "../other"), ("l.tif", "b.tif"), ("gone.tif", "nowhere.tif")):
+                             ("far2", "../other"), ("l.tif", "b.tif"), ("gone.tif", "nowhere.tif"),
+                             ("gone.txt", "nowhere.txt")):
             (self.folder / "in" / link).symlink_to(target)
         done = self.run_quavel("--jsonl", "in", status=1)
         found = [json.loads(line)["path"] for line in done.stdout.splitlines()]
@@ -660,6 +661,8 @@ class Endings(CommandTest):
         self.assertRegex(shown, r"\r\x1b\[K\d+ of 20000 files, \d+ files/s, \d+ s left\r\x1b\[K")
         self.assertRegex(shown, r"\r\x1b\[K\d{5} of 20000 files, …\r\x1b\[K")  # 23 of 24 cells
         self.assertRegex(shown, r"\r\x1b\[Kquavel: 20000 files, 20000 records, 0 without record, .* files/s\r\n$")
+        seconds, rate = re.search(r"(\d+\.\d+) s, (\d+) files/s\r\n$", shown).groups()
+        self.assertAlmostEqual(float(seconds) * int(rate), 20000, delta=200)
         self.assertEqual(self.on_terminal("--jsonl", "a.tif", stream="stderr"), "")
         self.assertNotIn("\x1b", self.on_terminal("--jsonl", ".", "a.tif", stream="stderr"))
 
