@@ -150,12 +150,17 @@ def test_worker_processes(method, cut):
 
 
 def test_ctrl_c():
-    code = ENDLESS + "print(next(scan).record.width, flush=True)\nfor _ in scan: pass"
+    # A test run in the background may have been told to ignore the signal.
+    heed = "import signal\nsignal.signal(signal.SIGINT, signal.default_int_handler)\n"
+    code = heed + ENDLESS + "print(next(scan).record.width, flush=True)\nfor _ in scan: pass"
     with subprocess.Popen([sys.executable, "-c", code], stdout=-1, stderr=-1, text=True) as process:
-        assert process.stdout.readline() == "6032\n"
-        time.sleep(0.1)
-        process.send_signal(signal.SIGINT)
-        assert "KeyboardInterrupt" in process.communicate(timeout=20)[1]
+        try:
+            assert process.stdout.readline() == "6032\n"
+            time.sleep(0.1)
+            process.send_signal(signal.SIGINT)
+            assert "KeyboardInterrupt" in process.communicate(timeout=60)[1]
+        finally:
+            process.kill()
     assert process.returncode == -signal.SIGINT
 
 
