@@ -14,7 +14,7 @@ from typing import TYPE_CHECKING, List, Optional, Union
 
 from . import _quavel
 
-_quavel.refuse_subinterpreter()  # a second interpreter is handed the module without its start
+_quavel.refuse_subinterpreter()  # a second interpreter gets the module without its init function
 
 from ._quavel import Record, __version__  # noqa: E402
 from ._types import NoRecord, Note, Path, Result  # noqa: E402

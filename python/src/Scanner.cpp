@@ -39,7 +39,7 @@ py::object decoded(std::string const& path, bool isBytes) {
 
 /// A named tuple, filled without a call of Python code: there is one for each photo.
 py::object makeResult(PyTypeObject* type, py::object path, py::object record, py::object error) {
-  auto const result = py::reinterpret_steal<py::object>(type->tp_alloc(type, 3));
+  auto result = py::reinterpret_steal<py::object>(type->tp_alloc(type, 3));
   if (!result) {
     throw py::error_already_set();
   }

@@ -5,7 +5,7 @@ import pytest
 
 ROOT = Path(__file__).resolve().parents[2]
 PHOTOS = ROOT / "examples" / "photos"
-FOLDERS = [PHOTOS] + [Path(p) for p in [os.environ.get("QUAVEL_SAMPLES")] if p]
+FOLDERS = [PHOTOS] + [ROOT / p for p in [os.environ.get("QUAVEL_SAMPLES")] if p]
 
 
 def threads():
