@@ -31,7 +31,8 @@ foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   string(TOUPPER ${component} upper)
   set(docs ${tree}/share/doc/${CPACK_DEBIAN_${upper}_PACKAGE_NAME})
 
-  configure_file(${CPACK_RESOURCE_FILE_LICENSE} ${docs}/copyright COPYONLY)
+  configure_file(${CPACK_RESOURCE_FILE_LICENSE} ${docs}/copyright
+    NO_SOURCE_PERMISSIONS COPYONLY)
   file(WRITE ${docs}/changelog.Debian
 "quavel (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
 
