@@ -48,6 +48,10 @@ std::vector<Row> rows() {
   };
 }
 
+bool isCutShort(QVJournal const& journal) {
+  return journal.refusal() != nullptr && journal.refusal()->reason == QVReason::CutShort;
+}
+
 TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
   for (Row const& row : rows()) {
     SCOPED_TRACE(row.name);
@@ -57,7 +61,7 @@ TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
     bool const isRead = kIsLongLong || row.isInReach;
     QVJournal journal;
     EXPECT_EQ(describe(journal.read(file.path)), isRead ? row.expected : "none");
-    EXPECT_TRUE(isRead || journal.refusal()->reason == QVReason::CutShort);
+    EXPECT_TRUE(isRead || isCutShort(journal));
 
     std::shared_ptr<QVStream> plain = std::make_shared<QVFStream>(file.path);
     EXPECT_EQ(describe(journal.read(plain, row.extension)), isRead ? row.expected : "none");
@@ -87,7 +91,7 @@ TEST(LargeFile, IsWalkedAsFarAsOffsetsReach) {
   QVJournal journal;
   bool const isRead = journal.read(std::make_shared<Segments>(), "jpg") != nullptr;
   EXPECT_EQ(isRead, kIsLongLong);
-  EXPECT_TRUE(isRead || journal.refusal()->reason == QVReason::CutShort);
+  EXPECT_TRUE(isRead || isCutShort(journal));
 }
 
 }  // namespace
