@@ -18,8 +18,8 @@ endforeach()
 # The time in the packages is that of the sources, so that the same sources make the same packages.
 if(NOT DEFINED ENV{SOURCE_DATE_EPOCH})
   execute_process(COMMAND git log -1 --format=%ct
-    WORKING_DIRECTORY ${CMAKE_CURRENT_LIST_DIR} OUTPUT_VARIABLE time OUTPUT_STRIP_TRAILING_WHITESPACE
-    ERROR_QUIET)
+    WORKING_DIRECTORY ${CMAKE_CURRENT_LIST_DIR} ERROR_QUIET
+    OUTPUT_VARIABLE time OUTPUT_STRIP_TRAILING_WHITESPACE)
   if(time)
     set(ENV{SOURCE_DATE_EPOCH} ${time})
   endif()
@@ -31,7 +31,8 @@ foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   string(TOUPPER ${component} upper)
   set(docs ${tree}/share/doc/${CPACK_DEBIAN_${upper}_PACKAGE_NAME})
 
-  configure_file(${CPACK_RESOURCE_FILE_LICENSE} ${docs}/copyright COPYONLY)
+  configure_file(${CPACK_RESOURCE_FILE_LICENSE} ${docs}/copyright
+    NO_SOURCE_PERMISSIONS COPYONLY)
   file(WRITE ${docs}/changelog.Debian
 "quavel (${CPACK_PACKAGE_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}) unstable; urgency=medium
 
