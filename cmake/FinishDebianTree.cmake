@@ -1,7 +1,28 @@
 # Run by cpack on the trees it is about to pack: gives each Debian package the documents that the
 # Debian policy asks of it, in the form it asks for.
+cmake_minimum_required(VERSION 3.23)
 if(NOT CPACK_GENERATOR STREQUAL "DEB")
   return()
+endif()
+
+# Without these, cpack makes packages that depend on nothing and says nothing of it.
+foreach(tool_and_package IN ITEMS "dpkg-shlibdeps;dpkg-dev" "file;file")
+  list(GET tool_and_package 0 tool)
+  list(GET tool_and_package 1 package)
+  find_program(found_${tool} ${tool})
+  if(NOT found_${tool})
+    message(FATAL_ERROR "Debian packages need ${tool}: install the package ${package}.")
+  endif()
+endforeach()
+
+# The time in the packages is that of the sources, so that the same sources make the same packages.
+if(NOT DEFINED ENV{SOURCE_DATE_EPOCH})
+  execute_process(COMMAND git log -1 --format=%ct
+    WORKING_DIRECTORY ${CMAKE_CURRENT_LIST_DIR} OUTPUT_VARIABLE time OUTPUT_STRIP_TRAILING_WHITESPACE
+    ERROR_QUIET)
+  if(time)
+    set(ENV{SOURCE_DATE_EPOCH} ${time})
+  endif()
 endif()
 
 string(TIMESTAMP date "%a, %d %b %Y %H:%M:%S +0000" UTC)

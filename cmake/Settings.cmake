@@ -30,6 +30,13 @@ function(quavel_link_option_if_accepted target option)
   endif()
 endfunction()
 
+if(QUAVEL_REPRODUCIBLE)
+  # Of two that fit, the later one counts.
+  target_compile_options(quavel_settings INTERFACE
+    -ffile-prefix-map=${PROJECT_SOURCE_DIR}/= -ffile-prefix-map=${PROJECT_BINARY_DIR}=.)
+  set(CMAKE_BUILD_RPATH_USE_ORIGIN ON)  # a path is cut out on installing, but leaves its length
+endif()
+
 # Files above 2 GB, and such sizes, are out of reach of 32-bit systems unless they are asked for.
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)
   target_compile_definitions(quavel_settings INTERFACE _FILE_OFFSET_BITS=64)

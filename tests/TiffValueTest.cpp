@@ -59,7 +59,7 @@ TEST(TiffValue, ConvertsEveryTypeToEveryOther) {
     Value value;
     value.type = row.type;
     ASSERT_TRUE(value.read(stream));
-    EXPECT_EQ(value.charValue(), row.s8);
+    EXPECT_EQ(static_cast<signed char>(value.charValue()), row.s8);
     EXPECT_EQ(value.sbyteValue(), row.s8);
     EXPECT_EQ(value.byteValue(), row.s8 & 0xff);
     EXPECT_EQ(value.sshortValue(), row.s16);

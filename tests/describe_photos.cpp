@@ -1,11 +1,10 @@
-// describe_photos FOLDER...: the records of all files there, and a digest of those that damaged
-// copies give. The same on every platform, for scripts/check-platforms to compare.
+// describe_photos OUTPUT FOLDER...: writes the records of all files there, and a digest of those
+// that damaged copies give. The same on every platform, for scripts/check-platforms to compare.
 
 #include <algorithm>
 #include <cmath>
 #include <filesystem>
 #include <fstream>
-#include <iostream>
 #include <iterator>
 
 #include "support/Fixtures.h"
@@ -46,25 +45,31 @@ std::uint64_t damagedDigest(Bytes bytes, std::string const& extension) {
   return digest;
 }
 
-void describeFile(std::filesystem::path const& path) {
+void describeFile(std::ostream& out, std::filesystem::path const& path) {
   std::ifstream file(path, std::ios::binary);
   Bytes const bytes{std::istreambuf_iterator<char>(file), {}};
   std::string const extension = QVReader("").getPathExtension(path.u8string());
   std::string const byPath = test::describe(QVReader(path.u8string()).metadata);
   std::string const byMemory = test::describe(read(bytes, extension));
-  std::cout << path.filename().u8string() << ": " << byPath << '\n'
-            << (byMemory == byPath ? "  the same from memory" : byMemory)
-            << "; damaged: " << std::hex << damagedDigest(bytes, extension) << '\n';
+  out << path.filename().u8string() << ": " << byPath << '\n'
+      << (byMemory == byPath ? "  the same from memory" : byMemory) << "; damaged: " << std::hex
+      << damagedDigest(bytes, extension) << '\n';
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
   std::vector<std::filesystem::path> paths;
-  for (int i = 1; i < argc; ++i) {
+  for (int i = 2; i < argc; ++i) {
     std::copy(std::filesystem::directory_iterator(argv[i]), {}, std::back_inserter(paths));
   }
   std::sort(paths.begin(), paths.end());
-  std::for_each(paths.begin(), paths.end(), describeFile);
-  return paths.empty() ? 1 : 0;
+  if (paths.empty()) {
+    return 1;
+  }
+  std::ofstream out(argv[1], std::ios::binary);
+  for (auto const& path : paths) {
+    describeFile(out, path);
+  }
+  return out.flush() ? 0 : 1;
 }

@@ -5,6 +5,7 @@
 
 #include "output/Forms.h"
 #include "photo/Reasons.h"
+#include "terminal/Text.h"
 
 namespace app {
 
@@ -74,6 +75,13 @@ void SortingWriter::end() {
   next_->end();
 }
 
+TextOf paths(bool isForTerminal) {
+  return [isForTerminal](Outcome const& outcome) {
+    std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
+    return outcome.record ? path + '\0' : std::string();
+  };
+}
+
 std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
   switch (form.kind) {
     case FormKind::Json:
@@ -86,9 +94,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
       output.add(csvHeader(form));
       return std::make_unique<TextWriter>(output, csvRows(form, output.isTerminal()), "", "");
     case FormKind::Paths:
-      return std::make_unique<TextWriter>(
-          output, [](Outcome const& outcome) { return outcome.record ? outcome.path + '\0' : ""; },
-          "", "");
+      return std::make_unique<TextWriter>(output, paths(output.isTerminal()), "", "");
     case FormKind::Card:
       return std::make_unique<TextWriter>(
           output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
