@@ -68,6 +68,23 @@ std::string describePath(TemporaryFile const& file) {
   return describe(QVReader(file.path).metadata);
 }
 
+std::ptrdiff_t openDescriptors() {
+  return std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator());
+}
+
+TEST_F(FileTest, IsOpenedReadOnlyAndClosedAgain) {
+  auto const before = openDescriptors();
+  Fixture const& fixture = fixtures().front();
+  TemporaryFile const good(fixture.bytes(kII), fixture.extension);
+  TemporaryFile const bad("II*", "tif");
+  for (TemporaryFile const* const file : {&good, &bad}) {
+    QVReader const reader(file->path);
+    EXPECT_EQ(describe(reader.metadata), file == &good ? fixture.expected : "none");
+    EXPECT_EQ(::fcntl(QVFStream(file->path).fd, F_GETFL) & O_ACCMODE, O_RDONLY);
+  }
+  EXPECT_EQ(openDescriptors(), before);
+}
+
 TEST_F(FileTest, IsReadInOneReadWithOneAdvice) {
   for (Fixture const& fixture : fixtures()) {
     SCOPED_TRACE(fixture.name);
@@ -197,23 +214,6 @@ TEST_F(FileTest, ThatIsAFolderCannotBeRead) {
   EXPECT_EQ(journal.refusal()->reason, QVReason::ReadError);
   EXPECT_EQ(journal.refusal()->systemError, EISDIR);
   EXPECT_NE(journal.refusal()->text.find("Is a directory"), std::string::npos);
-}
-
-std::ptrdiff_t openDescriptors() {
-  return std::distance(fs::directory_iterator("/proc/self/fd"), fs::directory_iterator());
-}
-
-TEST_F(FileTest, IsOpenedReadOnlyAndClosedAgain) {
-  auto const before = openDescriptors();
-  Fixture const& fixture = fixtures().front();
-  TemporaryFile const good(fixture.bytes(kII), fixture.extension);
-  TemporaryFile const bad("II*", "tif");
-  for (TemporaryFile const* const file : {&good, &bad}) {
-    QVReader const reader(file->path);
-    EXPECT_EQ(describe(reader.metadata), file == &good ? fixture.expected : "none");
-    EXPECT_EQ(::fcntl(QVFStream(file->path).fd, F_GETFL) & O_ACCMODE, O_RDONLY);
-  }
-  EXPECT_EQ(openDescriptors(), before);
 }
 
 TEST_F(FileTest, GivesNoRecordWhileThereAreNoDescriptors) {
