@@ -22,9 +22,9 @@ Field const* wantedField(std::string const& option, std::string const& name) {
 
 }  // namespace
 
-/// The parser's own lists pass over empty names.
+/// The parser's own lists skip empty names.
 void addFields(std::string const& list, Fields& fields) {
-  std::istringstream names(list + ',');  // each name is then ended, an empty last one too
+  std::istringstream names(list + ',');  // so that every name ends with one, even an empty last one
   for (std::string name; std::getline(names, name, ',');) {
     auto const* const field = wantedField("--fields", name);
     if (std::count(fields.begin(), fields.end(), field) > 0) {
@@ -64,14 +64,14 @@ bool choose(std::string const& option, std::string const& choice, char const* no
   return choice == yes;
 }
 
-/// The parser's own numbers may be in other notations.
+/// The parser itself would also accept other notations.
 unsigned jobsOf(std::string const& text) {
   unsigned jobs = 0;
   auto const* const end = text.data() + text.size();
   auto const result = std::from_chars(text.data(), end, jobs);
-  if (result.ec != std::errc() || result.ptr != end || jobs < 1 || jobs > kMostJobs) {
+  if (result.ec != std::errc() || result.ptr != end || jobs < 1 || jobs > kMaxJobs) {
     throw CLI::ValidationError("--jobs: '" + text + "' is not a number from 1 to " +
-                               std::to_string(kMostJobs));
+                               std::to_string(kMaxJobs));
   }
   return jobs;
 }

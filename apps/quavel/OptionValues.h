@@ -6,11 +6,11 @@
 
 #include "output/Form.h"
 
-/// What the options' arguments mean. Each refuses a wrong one with a CLI::ValidationError that
-/// names it.
+/// What the options' arguments mean. Each function refuses a wrong argument with a
+/// CLI::ValidationError that names it.
 namespace app::values {
 
-constexpr unsigned kMostJobs = 256;
+constexpr unsigned kMaxJobs = 256;
 
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);

@@ -12,7 +12,7 @@ namespace app {
 
 namespace {
 
-// For files that are not cached: there 32 are several times as fast as 2, and more gain little.
+// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
 constexpr unsigned kUsualJobs = 32;
 
 constexpr char kFooter[] =
@@ -25,7 +25,7 @@ constexpr char kFooter[] =
     "Fields are the record's names, such as model, or path, captureDate, reason: see quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
-/// Shows an option's argument and no more: what excludes what is told when it matters.
+/// Shows only an option's argument: which options exclude each other is said when it matters.
 class ShortFormatter : public CLI::Formatter {
  public:
   std::string make_option_opts(CLI::Option const* option) const override {
@@ -139,7 +139,7 @@ void check(Options& options) {
   }
 }
 
-/// The parser would take "--quiet=0" for a wish for noise, and "-q=0" for two options.
+/// The parser would take "--quiet=0" as a request for messages, and "-q=0" as two options.
 void refuseValuesOfFlags(CLI::App const& command, int argc, char const* const* argv) {
   for (int i = 1; i < argc && argv[i] != std::string_view("--"); ++i) {
     std::string const word = argv[i];
@@ -151,7 +151,7 @@ void refuseValuesOfFlags(CLI::App const& command, int argc, char const* const* a
   }
 }
 
-/// The parser parts some groups by two blank lines.
+/// The parser puts two blank lines between some groups.
 std::string helpOf(CLI::App const& command) {
   std::string help = command.help();
   for (auto at = help.find("\n\n\n"); at != std::string::npos; at = help.find("\n\n\n")) {
@@ -171,7 +171,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.footer(kFooter);
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
-  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMostJobs);
+  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
   options.jobs = std::max(options.cachedJobs, kUsualJobs);
   addInputs(command, options);
   addForms(command, options.form);

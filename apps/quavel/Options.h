@@ -23,10 +23,10 @@ struct Options {
   bool isQuiet = false;
 };
 
-/// What the arguments amount to.
+/// What the arguments ask for.
 struct ParsedOptions {
   Options options;
-  std::optional<int> status;  ///< Set: nothing is left to do but to end with it.
+  std::optional<int> status;  ///< When set, the command only has to end with it.
   std::string output;         ///< For standard output when `status` is set.
   std::string error;          ///< For standard error when `status` is set.
 };

@@ -17,7 +17,7 @@ namespace {
 
 #ifdef RUSAGE_THREAD
 constexpr bool kTellsWaits = true;
-/// How often the calling thread gave up the processor to wait for something, such as the disk.
+/// How often the calling thread has waited for something, such as the disk.
 long countWaits() {
   rusage usage = {};
   ::getrusage(RUSAGE_THREAD, &usage);
@@ -33,7 +33,7 @@ long countWaits() { return 0; }
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
     : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {
 #ifdef __GLIBC__
-  // Each arena takes 64 MB of addresses: one for each thread may exceed the user's limit.
+  // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
   ::mallopt(M_ARENA_MAX, 2);
 #endif
 }
@@ -53,8 +53,8 @@ Pipeline::~Pipeline() {
 void Pipeline::submit(std::unique_ptr<Batch> batch) {
   Batch* const work = batch.get();
   order_.push_back(std::move(batch));
-  // A single file is not worth threads: they start with the second batch, one for each batch that
-  // is under way.
+  // A single file is not worth a thread. Threads start with the second batch, one for each batch
+  // under way.
   if (jobs_ > 1 && hasBegun_ && threads_.size() < std::min<std::size_t>(limit(), order_.size())) {
     startThread();
   }
@@ -95,11 +95,11 @@ bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * li
 std::size_t Pipeline::limit() const { return isWaiting_ ? jobs_ : busyJobs_; }
 
 void Pipeline::startThread() {
-  interrupt::Shield const shield;
+  interrupt::BlockSignals const block;
   try {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
-    // The system grants no more: those that run do all the work, or the caller does.
+    // The system allows no more: the running threads do all the work, or else the caller does.
     jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
     busyJobs_ = std::min(busyJobs_, jobs_);
   }
@@ -113,7 +113,7 @@ void Pipeline::workOn(Batch& batch) {
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Cached files are read without waiting. Others wait for the disk once each, or more often.
+  // Reading a cached file does not wait. Other files wait for the disk at least once each.
   if (isTold) {
     isWaiting_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }

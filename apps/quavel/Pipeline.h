@@ -16,32 +16,33 @@
 
 namespace app {
 
-/// Some files that follow each other.
+/// Some consecutive files.
 struct Batch {
   std::vector<Input> inputs;
   std::vector<Outcome> outcomes;
-  double seconds = 0;     ///< That the work took.
-  std::size_t bytes = 0;  ///< Of the outcomes' texts.
+  double seconds = 0;     ///< How long the work took.
+  std::size_t bytes = 0;  ///< The size of the outcomes' texts.
   bool isDone = false;
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-/// Works on batches on some threads and hands them back in the order they came in. There are
-/// as many as `jobs` while the work waits for the disk, so that the disk never waits for the work,
-/// and as many as `busyJobs` while it keeps the processors busy.
+/// Works on batches on several threads and returns them in the order in which they were submitted.
+/// There are `jobs` threads while the work waits for the disk, so that the disk is never idle, and
+/// `busyJobs` while it keeps the processors busy.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
   /// With one job the work is done by the caller of `submit`.
   Pipeline(unsigned jobs, unsigned busyJobs, Work work);
-  /// Drops what has not begun and waits for what has.
+  /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
   Pipeline(Pipeline const&) = delete;
   Pipeline& operator=(Pipeline const&) = delete;
 
   void submit(std::unique_ptr<Batch> batch);
-  /// The oldest batch once it is done, null when there is none; or throws what its work threw.
+  /// Waits for the oldest batch and returns it, or throws what its work threw; null when the
+  /// pipeline is empty.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
   /// Enough batches are under way to keep the threads busy.
@@ -59,7 +60,7 @@ class Pipeline {
   std::atomic<bool> isWaiting_;
   Work work_;
   std::vector<std::thread> threads_;
-  std::deque<std::unique_ptr<Batch>> order_;  // of the caller's thread alone
+  std::deque<std::unique_ptr<Batch>> order_;  // used by the caller's thread only
   bool hasBegun_ = false;
   std::mutex mutex_;
   std::condition_variable hasWork_;

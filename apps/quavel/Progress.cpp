@@ -19,7 +19,7 @@ namespace {
 constexpr auto kQuietStart = std::chrono::milliseconds(500);
 constexpr auto kInterval = std::chrono::milliseconds(100);
 constexpr auto kCountingSpell = std::chrono::milliseconds(1);
-constexpr int kRests = 4;  // each as long as the spell
+constexpr int kRests = 4;  // each as long as a spell of counting
 
 double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
@@ -82,7 +82,7 @@ void Progress::startCounting() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::Shield const shield;
+  interrupt::BlockSignals const block;
   try {
     counter_ = std::thread([this] {
       try {
@@ -101,7 +101,7 @@ void Progress::countFiles() {
   auto start = Clock::now();
   while (source.next(input)) {
     ++count;
-    // The disk is the reading's: the counting keeps it busy for a fifth of the time at most.
+    // The reading comes first: counting keeps the disk busy for a fifth of the time at most.
     auto const spell = Clock::now() - start;
     if (spell >= kCountingSpell) {
       std::unique_lock<std::mutex> lock(mutex_);
@@ -141,10 +141,10 @@ void Progress::sumUp() {
   std::snprintf(time, sizeof time, "%.3f s", seconds);
   std::string const shown =
       options_.form.conditions.empty() ? "" : std::to_string(shown_) + " shown, ";
-  console_.say(std::to_string(files) + (files == 1 ? " file, " : " files, ") +
-               std::to_string(records_) + (records_ == 1 ? " record, " : " records, ") +
-               std::to_string(failures_) + " without record, " + shown + time + ", " +
-               rate(files, seconds) + " files/s");
+  console_.printMessage(std::to_string(files) + (files == 1 ? " file, " : " files, ") +
+                        std::to_string(records_) + (records_ == 1 ? " record, " : " records, ") +
+                        std::to_string(failures_) + " without record, " + shown + time + ", " +
+                        rate(files, seconds) + " files/s");
 }
 
 }  // namespace app

@@ -14,7 +14,7 @@ namespace app {
 
 class Console;
 
-/// Counts the files, shows how far the work is once it takes long enough, and sums it up.
+/// Counts the files, shows the progress once the work takes long enough, and sums it up at the end.
 class Progress {
  public:
   /// `options` must outlive this.
@@ -27,7 +27,7 @@ class Progress {
     ++(hasRecord ? records_ : failures_);
     shown_ += isShown ? 1 : 0;
   }
-  /// Shows the line when it is time to.
+  /// Updates the line when it is due.
   void tick();
   void sumUp();
 

@@ -17,8 +17,8 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kLargestBatch = 64;
-// A batch is to be short enough for the output to flow and long enough to be worth handing over.
+constexpr std::size_t kMaxBatch = 64;
+// A batch should be short enough for the output to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;
 constexpr std::size_t kWideBatch = std::size_t{1} << 20;
 
@@ -47,7 +47,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;
   std::size_t batchSize_ = 1;
-  bool lacksError_;  // and nobody was told
+  bool lacksError_;  // and the user has not been told
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -71,10 +71,11 @@ int Runner::run() {
   std::optional<Source> source;
   try {
     source.emplace(options_.inputs, [this](std::string const& path, std::string const& why) {
-      console_.sayOf(path, why);
+      console_.printFileMessage(path, why);
     });
   } catch (std::system_error const& error) {
-    console_.sayOf(options_.inputs.list, "the list cannot be opened: " + error.code().message());
+    console_.printFileMessage(options_.inputs.list,
+                              "the list cannot be opened: " + error.code().message());
     return kWrongUsage;
   }
   return runSource(*source);
@@ -149,7 +150,7 @@ void Runner::emitOldest() {
   progress_.tick();
   bool const isLarge = batch->seconds > kLongBatch || batch->bytes > kWideBatch;
   batchSize_ =
-      isLarge ? std::max<std::size_t>(batchSize_ / 2, 1) : std::min(batchSize_ * 2, kLargestBatch);
+      isLarge ? std::max<std::size_t>(batchSize_ / 2, 1) : std::min(batchSize_ * 2, kMaxBatch);
 }
 
 void Runner::emit(Outcome&& outcome) {
@@ -158,10 +159,11 @@ void Runner::emit(Outcome&& outcome) {
   bool const isTold =
       outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
   if (outcome.problem && !isTold) {
-    console_.sayOf(outcome.path, outcome.problem.text);
+    console_.printFileMessage(outcome.path, outcome.problem.text);
   }
   if (outcome.problem && outcome.isShown && std::exchange(lacksError_, false)) {
-    console_.say("the rows of files without a record do not say why: add error to --fields");
+    console_.printMessage(
+        "the rows of files without a record do not say why: add error to --fields");
   }
   if (outcome.isShown) {
     writer_->add(std::move(outcome));

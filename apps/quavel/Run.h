@@ -7,7 +7,7 @@
 
 namespace app {
 
-/// Reads what the options ask for and writes it. Gives the exit status. Throws OutputClosed, or
+/// Reads what the options ask for and writes it. Returns the exit status. Throws OutputClosed, or
 /// std::system_error when the output cannot be written.
 int run(Options const& options, Output& output, Console& console);
 

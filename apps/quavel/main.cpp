@@ -15,11 +15,11 @@
 
 namespace {
 
-/// Gives the closed ones of the standard streams a file that refuses, so that no photo is opened
-/// under their numbers.
+/// Opens standard streams that are closed as a file that refuses reads and writes, so that no photo
+/// is opened under their numbers.
 void holdStandardStreams() {
   if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
-    // Not for reading: empty input would pass for an empty list.
+    // Not for reading: an empty input would look like an empty list.
     static_cast<void>(::open("/dev/null", O_WRONLY | O_CLOEXEC));
   }
   int fd = -1;
@@ -38,7 +38,7 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
   output.add(parsed.output);
   output.flush();
   if (!parsed.error.empty()) {
-    console.say(parsed.error);
+    console.printMessage(parsed.error);
   }
   return *parsed.status;
 }
@@ -47,7 +47,7 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
 
 int main(int argc, char** argv) {
   holdStandardStreams();
-  ::signal(SIGPIPE, SIG_IGN);  // a write then tells
+  ::signal(SIGPIPE, SIG_IGN);  // the write then fails instead
   app::interrupt::install();
   app::Console console;
   app::Output output(console);
@@ -56,14 +56,14 @@ int main(int argc, char** argv) {
   } catch (app::OutputClosed const&) {
     return app::kSuccess;  // whoever read the output has seen enough
   } catch (std::system_error const& error) {
-    console.say("the output cannot be written: " + error.code().message() +
-                "; it ends early. Check the disk or where the output goes");
+    console.printMessage("the output cannot be written: " + error.code().message() +
+                         "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {
     output.giveUp();
-    console.say("not enough memory; leave out --sort, or name fewer files at a time");
+    console.printMessage("not enough memory; leave out --sort, or name fewer files at a time");
   } catch (std::exception const& error) {
     output.giveUp();
-    console.say(std::string("unexpected: ") + error.what());
+    console.printMessage(std::string("unexpected: ") + error.what());
   }
   return app::kSomeFailed;
 }

@@ -14,9 +14,9 @@ namespace app {
 namespace {
 
 constexpr std::size_t kStep = std::size_t{1} << 16;
-constexpr std::size_t kLongestPath = 4096;  // PATH_MAX of Linux: the system takes none longer
+constexpr std::size_t kMaxPathLength = 4096;  // Linux's PATH_MAX
 
-/// What the first read would say, before anything is put out. 0, or the system's error.
+/// Finds out, before anything is written, whether the file can be read: 0, or the system's error.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input entryOf(std::string const& path) {
@@ -24,11 +24,11 @@ Input entryOf(std::string const& path) {
   if (path.find('\0') != std::string::npos) {
     input.problem = {reason::kBadPath,
                      "the path holds a NUL; if the list is NUL-separated, add -0"};
-  } else if (path.size() > kLongestPath) {
+  } else if (path.size() > kMaxPathLength) {
     input.problem = {reason::kBadPath,
                      "longer than a path can be; if the list is not NUL-separated, leave out -0"};
   }
-  input.path = path.substr(0, kLongestPath);
+  input.path = path.substr(0, kMaxPathLength);
   return input;
 }
 
@@ -79,8 +79,8 @@ bool PathList::refill() {
   }
   buffer_.erase(0, start_);
   start_ = 0;
-  if (buffer_.size() > 2 * kLongestPath) {
-    buffer_.resize(kLongestPath + 1);  // refused anyhow: its rest need not be kept
+  if (buffer_.size() > 2 * kMaxPathLength) {
+    buffer_.resize(kMaxPathLength + 1);  // too long in any case: the rest is not needed
   }
   std::size_t const size = buffer_.size();
   buffer_.resize(size + kStep);

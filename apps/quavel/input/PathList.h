@@ -16,10 +16,10 @@ class PathList {
   PathList(PathList const&) = delete;
   PathList& operator=(PathList const&) = delete;
 
-  /// `next` will not have to wait for whoever writes the list.
+  /// `next` will not have to wait for the process that writes the list.
   bool isReady();
-  /// The next path that is not empty; false at the end, or when the list cannot be read on:
-  /// `error` is then the system's number.
+  /// The next path that is not empty. False at the end, or when the list cannot be read on; `error`
+  /// is then the system's number.
   bool next(Input& input);
 
   int error = 0;
@@ -30,7 +30,7 @@ class PathList {
   int fd_;
   char separator_;
   std::string buffer_;
-  std::size_t start_ = 0;  // of what is not yet handed out
+  std::size_t start_ = 0;  // of what has not been returned yet
   bool atEnd_ = false;
 };
 

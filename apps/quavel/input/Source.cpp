@@ -49,8 +49,8 @@ bool Source::nextOfPaths(Input& input) {
   return false;
 }
 
-/// Drops the CR that a list from another system leaves at the end of a path, unless it is truly
-/// the file's. True: nothing else was in the line.
+/// Drops the CR that a list from another system leaves at the end of a path, unless it belongs to
+/// the file's name. True: there was nothing else on the line.
 bool Source::dropCarriageReturn(std::string& path) {
   struct stat status = {};
   if (path.back() != '\r' || ::lstat(path.c_str(), &status) == 0) {

@@ -5,8 +5,8 @@
 #include <string>
 #include <vector>
 
+#include "input/FolderWalk.h"
 #include "input/PathList.h"
-#include "input/Walk.h"
 
 namespace app {
 
@@ -24,7 +24,7 @@ class Source {
   /// Throws std::system_error when the list cannot be opened. Keeps a reference to the inputs.
   Source(Inputs const& inputs, Report report);
 
-  /// `next` will not have to wait for whoever writes the list.
+  /// `next` will not have to wait for the process that writes the list.
   bool isReady();
   bool next(Input& input);
 
@@ -36,9 +36,9 @@ class Source {
   Inputs const& inputs_;
   Report report_;
   std::size_t nextPath_ = 0;
-  std::optional<Walk> walk_;
+  std::optional<FolderWalk> walk_;
   bool isWalkEmpty_ = true;
-  bool hasCrlf_ = false;  // the list's lines end so
+  bool hasCrlf_ = false;  // the lines of the list end with CR LF
   std::optional<PathList> list_;
 };
 

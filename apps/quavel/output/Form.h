@@ -19,13 +19,13 @@ struct Form {
   std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
   std::optional<bool> showAbsent;     ///< Not set: as the form does.
   bool hasNotes = false;              ///< The notes of the read are shown too.
-  bool hasIsoDates = false;           ///< Dates are written as ISO 8601 has them.
-  bool endsWithLf = false;            ///< CSV's lines do, instead of CRLF.
+  bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
+  bool endsWithLf = false;            ///< Lines of CSV do, instead of with CRLF.
 
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }
-  /// Words that say of each file why it gave no record.
+  /// Whether it explains in words why files give no record.
   bool isExplanation() const { return hasNotes && !isForMachines(); }
 };
 

@@ -9,15 +9,15 @@ namespace app {
 
 namespace {
 
-// Room for a usual record: growing the text step by step would cost more than filling it.
+// Enough for most records: growing the text step by step would cost more than filling it.
 constexpr std::size_t kUsualObject = 700;
 
 bool needsEscape(std::string const& text) {
   return !isPlain(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
 }
 
-/// Appends a value that is not absent. Nearly all texts stand as they are; the others are left to
-/// the JSON library. What would steer a terminal is written as \uNNNN when the text goes to one.
+/// Appends a value that is not absent. Nearly all texts need no escape; the others are left to the
+/// JSON library. What would steer a terminal is written as \uNNNN when the text goes to one.
 void append(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
@@ -85,8 +85,8 @@ class JsonObjects {
   Members members_;
   Members const errorMembers_ = membersOf(
       {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"), fieldNamed("position")});
-  Members const bytesOfErrors_ = membersOf({fieldNamed("pathBytes")});  // shown where needed
-  Members pathBytes_;  // the same, unless the fields name it or leave out the path
+  Members const bytesOfErrors_ = membersOf({fieldNamed("pathBytes")});  // shown only where needed
+  Members pathBytes_;  // the same; empty when the fields include it or lack the path
   bool showAbsent_;
   bool hasNotes_;
   bool endsLine_;

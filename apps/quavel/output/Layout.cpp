@@ -10,7 +10,8 @@ namespace {
 
 constexpr std::size_t kGap = 2;
 
-/// Shortens the widest columns first, each down to its least, until the line fits or none gives.
+/// Shortens the widest columns first, each down to its minimum, until the line fits or no column
+/// can be shortened further.
 void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t line) {
   while (lineWidth(widths) > line) {
     std::size_t widest = columns.size();
@@ -51,7 +52,7 @@ std::size_t lineWidth(Widths const& widths) {
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
   while (true) {
     Widths widths = natural;
-    // No column needs more than the whole line; the cut also bounds the shortening.
+    // No column needs more than the whole line; this also bounds the loop.
     for (auto& width : widths) {
       width = std::min(width, line);
     }

@@ -8,11 +8,11 @@
 
 namespace app {
 
-/// How a table's column gives way when the table is wider than the terminal.
+/// How a table's column is shortened when the table is wider than the terminal.
 struct Column {
   std::string label;
   std::size_t least;  ///< Cells that it can be shortened to.
-  int rank;           ///< The highest is left out first; 0: never.
+  int rank;           ///< The column with the highest one is left out first; 0: never.
   bool keepsEnd;      ///< Shortened at its start.
 };
 

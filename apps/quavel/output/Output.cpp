@@ -16,7 +16,7 @@ namespace app {
 
 namespace {
 
-/// Writes all of a piece, unless an interrupt comes before any of it is out.
+/// Writes the whole piece, unless an interrupt comes before any of it has been written.
 void write(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -57,8 +57,8 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes up to PIPE_BUF bytes whole or not at all: an interrupt then cuts no piece, not
-  // even while the reader makes us wait.
+  // A pipe takes up to PIPE_BUF bytes whole or not at all, so an interrupt never cuts a piece, even
+  // while the reader makes us wait.
   std::size_t const most = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::string_view const all = pending_;
   std::size_t begin = 0;

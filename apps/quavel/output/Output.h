@@ -9,7 +9,7 @@ namespace app {
 
 class Console;
 
-/// Thrown when whoever read the output has gone.
+/// Thrown when nobody reads the output any more.
 struct OutputClosed {};
 
 /// Standard output. What is added in one piece stays whole, even when the command is interrupted.
@@ -26,7 +26,7 @@ class Output {
   void enclose(std::string_view head, char const* tail);
   /// Flushes and writes the tail.
   void finish();
-  /// The same when the rest is lost already: nothing is thrown.
+  /// The same after a failure: throws nothing.
   void giveUp() noexcept;
 
   bool isTerminal() const { return isTerminal_; }
@@ -36,7 +36,7 @@ class Output {
   bool isTerminal_;
   bool isFile_;
   std::string pending_;
-  std::vector<std::size_t> ends_;  // of the pieces in it
+  std::vector<std::size_t> ends_;  // where the pieces end in it
   char const* tail_ = nullptr;
 };
 

@@ -7,9 +7,9 @@ namespace app::rows {
 
 namespace {
 
-constexpr std::size_t kLeastChosen = 3;
-constexpr std::size_t kLeastPath = 8;
-constexpr std::size_t kDateColumn = 1;  // of the default ones
+constexpr std::size_t kMinChosen = 3;
+constexpr std::size_t kMinPath = 8;
+constexpr std::size_t kDateColumn = 1;  // among the default columns
 constexpr std::size_t kDay = 10;        // "2018-02-21"
 constexpr std::size_t kMinute = 16;     // "2018-02-21 12:08"
 
@@ -27,7 +27,7 @@ bool isMinute(std::string const& date) {
   return date.size() == kMinute && date[4] == '-' && date[13] == ':';
 }
 
-/// Without the seconds, for which a table has no room.
+/// The date without its seconds, for which a table has no room.
 std::string minutes(std::string const& date) {
   bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
   return isWellMade ? date.substr(0, 16) : date;
@@ -55,7 +55,7 @@ std::vector<Column> columnsOf(Fields const& fields) {
   std::vector<Column> columns;
   for (auto const* field : fields) {
     bool const isPath = field->name == "path";
-    columns.push_back({field->label, isPath ? kLeastPath : kLeastChosen, 0, isPath});
+    columns.push_back({field->label, isPath ? kMinPath : kMinChosen, 0, isPath});
   }
   return columns;
 }

@@ -12,11 +12,11 @@ namespace app::rows {
 
 using Cells = std::vector<std::string>;
 
-/// The columns of the fields or, when there are none, those that a photographer looks for first.
+/// The columns of the fields; of none, those that a photographer looks for first.
 std::vector<Column> columnsOf(Fields const& fields);
 /// A row of them; an absent value is empty.
 Cells cellsOf(Fields const& fields, Outcome const& outcome);
-/// Leaves the day of the date in a row of the columns for no fields.
+/// Shortens the date in a row of default columns to the day.
 void dropTime(Cells& cells);
 
 }  // namespace app::rows

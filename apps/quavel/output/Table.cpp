@@ -16,8 +16,9 @@ namespace app {
 namespace {
 
 constexpr std::size_t kPage = 500;
-constexpr auto kPatience = std::chrono::milliseconds(200);
-constexpr auto kFirstPatience = std::chrono::milliseconds(12);  // then a user sees that it works
+constexpr auto kFlushInterval = std::chrono::milliseconds(200);
+constexpr auto kFirstFlushInterval =
+    std::chrono::milliseconds(12);  // soon enough to show that it works
 
 /// The folder that all paths of the rows are in, with a "/" at its end; empty when there is none.
 std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std::size_t column) {
@@ -29,7 +30,7 @@ std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std:
     folder.erase(std::mismatch(folder.begin(), limit, path.begin()).first, folder.end());
     folder.erase(folder.rfind('/') + 1);
   }
-  return folder.size() <= 2 ? "" : folder;  // "./" and "/" are not in the way
+  return folder.size() <= 2 ? "" : folder;  // "./" and "/" take no room
 }
 
 bool isWithin(Widths const& inner, Widths const& outer) {
@@ -60,10 +61,10 @@ class Table : public Writer {
   std::vector<std::vector<std::string>> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   std::size_t files_ = 0;
-  std::atomic<bool> isCardLikely_{true};  // no file has come yet: records are kept
+  std::atomic<bool> isCardLikely_{true};  // until a second file comes, records are kept
   Outcome first_;
   bool isTerminal_;
-  std::size_t pathColumn_ = 0;  // the number of columns when there is none
+  std::size_t pathColumn_ = 0;  // the number of columns: there is none
   std::size_t line_ = 0;
   std::string folder_;        // of all paths, when it stands above the table
   bool hasDaysOnly_ = false;  // dates are shown without the time
@@ -102,10 +103,10 @@ void Table::add(Outcome&& outcome) {
   if (!outcome.cells.empty()) {
     page_.push_back(std::move(outcome.cells));
   }
-  auto const patience = natural_.empty() ? kFirstPatience : kPatience;
-  // Sorted rows come all at once: no page of them needs to be short.
+  auto const interval = natural_.empty() ? kFirstFlushInterval : kFlushInterval;
+  // Sorted rows come all at once, so no page needs to be short.
   bool const isDue =
-      isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > patience;
+      isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > interval;
   if (page_.size() == kPage || isDue) {
     writePage(false);
   }
@@ -142,7 +143,7 @@ void Table::writePage(bool isLast) {
   page_.clear();
 }
 
-/// One header serves all pages, so while more may come there is a column for whatever they bring.
+/// One header serves all pages, so while more may come, every column stays for what they may bring.
 void Table::widen(bool isLast) {
   bool const isFirst = natural_.empty();
   Widths const natural = naturalWidths(!isFirst || !isLast);
@@ -155,7 +156,7 @@ void Table::widen(bool isLast) {
   }
 }
 
-/// Gives way in this order: what all paths begin with, cells, the time of day, columns.
+/// Saves width in this order: the common start of the paths, the cells, the time of day, columns.
 void Table::fitTerminal() {
   std::size_t const line = terminalWidth(STDOUT_FILENO);
   if (isInLayout(line)) {

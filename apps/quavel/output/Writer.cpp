@@ -62,7 +62,7 @@ void SortingWriter::end() {
     Value const left = form_.sort->value(a);
     Value const right = form_.sort->value(b);
     if (isAbsent(left) || isAbsent(right)) {
-      return !isAbsent(left) && isAbsent(right);  // what has no value comes last
+      return !isAbsent(left) && isAbsent(right);  // absent values come last
     }
     return form_.isDescending ? right < left : left < right;
   };

@@ -16,15 +16,15 @@ class Writer {
   Writer(Writer const&) = delete;
   Writer& operator=(Writer const&) = delete;
 
-  /// Does the form's own share of the work on one file, on any thread. Drops the record.
+  /// Does the form's part of the work on one file, on any thread. Drops the record.
   virtual void prepare(Outcome& outcome) const = 0;
-  /// The same, but what goes wrong becomes the error of the file and ends nothing.
+  /// The same, but a failure becomes the error of the file and ends nothing.
   void prepareSafely(Outcome& outcome) const;
   /// Takes the prepared outcomes in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
-  /// Hands on what was held back: nothing else may come for a while.
+  /// Writes what was held back: nothing else may come for a while.
   virtual void pause() {}
-  /// Nothing else comes.
+  /// Called at the end.
   virtual void end() {}
 };
 

@@ -11,12 +11,12 @@ namespace app {
 
 namespace {
 
-// As Relation has them; the longer ones come first. "=" serves those who mean "==".
+// In the order of Relation; the longer ones come first. "=" is accepted for "==".
 constexpr std::string_view kRelations[] = {">=", "<=", "!=", "==", ">", "<", "~"};
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// The whole text as a value of a field's type; absent when it is none.
+/// The text as a value of a field's type; absent when it is not one as a whole.
 struct Parsed {
   std::string_view text;
 

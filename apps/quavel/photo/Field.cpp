@@ -15,8 +15,8 @@ namespace {
 
 using quavel::QVMetadata;
 
-constexpr std::size_t kLongestCell = 200;
-constexpr std::size_t kMostBytes = 8 * kLongestCell;
+constexpr std::size_t kMaxCells = 200;
+constexpr std::size_t kMaxBytes = 8 * kMaxCells;
 
 template <class T>
 Value present(T value) {
@@ -152,7 +152,7 @@ Fields recordFields() {
 
 std::string inWords(Field const& field, Outcome const& outcome) {
   if (field.value == path) {
-    return escapedPath(outcome.path);  // here the bytes that are no UTF-8 can be shown
+    return escapedPath(outcome.path);  // shows bytes that are not UTF-8 too
   }
   Value const value = field.value(outcome);
   if (isAbsent(value)) {
@@ -160,7 +160,7 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   }
   std::string text = std::visit(Said{value}, field.words);
   text.erase(text.find_last_not_of(' ') + 1);  // cameras pad their texts
-  return keepStart(escaped(text), kLongestCell, kMostBytes);
+  return keepStart(escaped(text), kMaxCells, kMaxBytes);
 }
 
 bool isAbsent(Value const& value) {

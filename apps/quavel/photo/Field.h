@@ -14,12 +14,13 @@ namespace app {
 /// An exact value; the first alternative is absence. Texts are UTF-8.
 using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
-/// What says a value in words, by the value's type: the same alternatives, without absence.
+/// A function that puts a value into words, by the value's type: the same alternatives, without
+/// absence.
 using Words = std::variant<std::string (*)(bool), std::string (*)(std::int32_t),
                            std::string (*)(std::int64_t), std::string (*)(float),
                            std::string (*)(std::string const&)>;
 
-/// Something that can be told of a file.
+/// Something that can be shown about a file.
 struct Field {
   std::string_view name;  ///< As --fields and the machine forms call it.
   char const* label;      ///< As the card and the table call it.
@@ -42,7 +43,7 @@ Fields recordFields();
 /// (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
 
-/// There is no value, or a text of nothing but blanks and colons, as cameras without a clock write.
+/// There is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
 /// Appends the value for programs: text as it is, digits that read back to the same number,

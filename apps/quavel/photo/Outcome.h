@@ -16,28 +16,29 @@ struct Problem {
   explicit operator bool() const { return !reason.empty(); }
 
   std::string reason;          ///< For programs: the name of a QVReason, or a code of Reasons.h.
-  std::string text;            ///< For the photo's owner, as what follows "path: " in a message.
-  std::int64_t position = -1;  ///< In the file; -1: of no place in particular.
+  std::string text;            ///< For the photo's owner; follows "path: " in a message.
+  std::int64_t position = -1;  ///< In the file; -1: no particular place.
 };
 
 /// One file to read.
 struct Input {
   std::string path;
   bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
-  Problem problem;       ///< Why it cannot even be tried, if so.
+  Problem problem;       ///< Set when it cannot even be tried.
 };
 
 /// What became of one file.
 struct Outcome {
   std::string path;
-  std::shared_ptr<quavel::QVMetadata> record;  ///< Null when there is none, or no more needed.
-  Problem problem;                             ///< When there is no record.
-  char const* format = "";                     ///< As the journal has it.
-  std::vector<quavel::QVNote> notes;           ///< When they are wanted.
-  std::uint64_t furtherSteps = 0;              ///< Those that the notes leave out.
-  bool isShown = true;                         ///< It meets all conditions.
-  std::string text;                            ///< As the chosen form shows it, once prepared.
-  std::vector<std::string> cells;              ///< The same for the table.
+  std::shared_ptr<quavel::QVMetadata>
+      record;                         ///< Null when there is none, or it is no longer needed.
+  Problem problem;                    ///< When there is no record.
+  char const* format = "";            ///< As the journal gives it.
+  std::vector<quavel::QVNote> notes;  ///< When they are wanted.
+  std::uint64_t furtherSteps = 0;     ///< Those that the notes leave out.
+  bool isShown = true;                ///< It meets all conditions.
+  std::string text;                   ///< As the chosen form shows it, once prepared.
+  std::vector<std::string> cells;     ///< The same for the table.
 };
 
 }  // namespace app

@@ -21,7 +21,7 @@ namespace {
 using quavel::QVJournal;
 
 constexpr std::size_t kDateSize = 19;
-constexpr std::size_t kLargestInput = std::size_t{1} << 30;
+constexpr std::size_t kMaxInput = std::size_t{1} << 30;
 
 Problem irregular(mode_t mode) {
   if (S_ISDIR(mode)) {
@@ -32,7 +32,7 @@ Problem irregular(mode_t mode) {
           std::string("a ") + kind + ", not a regular file; give a photo, or use --stdin"};
 }
 
-/// Why the library is not to be given the path, if so.
+/// Why the library must not be given the path; no problem otherwise.
 Problem whyUnfit(std::string const& path) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
@@ -45,7 +45,7 @@ Problem whyUnfit(std::string const& path) {
 std::string readAll(Problem& problem) {
   constexpr std::size_t kStep = std::size_t{1} << 16;
   std::string bytes;
-  while (bytes.size() <= kLargestInput) {
+  while (bytes.size() <= kMaxInput) {
     std::size_t const size = bytes.size();
     bytes.resize(size + kStep);
     ssize_t const count = ::read(STDIN_FILENO, &bytes[size], kStep);
@@ -100,7 +100,7 @@ std::string extensionOf(std::string_view path) {
 
 bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");
-  // The library answers with a record, which costs too much for each name of a large folder.
+  // The library answers by making a record, too expensive for each name in a large folder.
   thread_local std::unordered_set<std::string> known;
   if (known.count(extension) != 0) {
     return true;

@@ -23,7 +23,7 @@ std::string whyUnknown(std::string const& extension);
 /// The outcome holds notes when all of them are wanted.
 Outcome readPhoto(Input input, Detail detail);
 
-/// Clears the dates that are blank. With `asIso`, those written as Exif asks become
+/// Clears blank dates. With `asIso`, well-formed Exif dates become
 /// "2018-02-21T12:08:56"; what is not a date stays as it is.
 void tidyDates(quavel::QVMetadata& record, bool asIso);
 

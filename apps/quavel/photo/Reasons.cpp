@@ -30,7 +30,7 @@ char const* advice(int error) {
   }
 }
 
-/// What a reason means, before the facts. Those that say it themselves have none.
+/// What a reason means, put before the facts; empty where the facts say it themselves.
 char const* leadOf(QVReason reason) {
   switch (reason) {
     case QVReason::ReadError:
@@ -83,7 +83,7 @@ Problem refusal(QVJournal const& journal) {
     }
   }
   char const* const end =
-      note.reason == QVReason::Empty ? "; copy it anew from its source" : advice(note.systemError);
+      note.reason == QVReason::Empty ? "; copy it again from its source" : advice(note.systemError);
   return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + end, note.position};
 }
 

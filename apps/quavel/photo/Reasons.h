@@ -11,7 +11,7 @@
 /// Why files give no record, in words that their owner can act on.
 namespace app::reason {
 
-// The codes of what the library is not even asked for.
+// The codes for what the library is not even asked to read.
 inline constexpr char kFolder[] = "folder";
 inline constexpr char kSpecialFile[] = "special-file";
 inline constexpr char kBadPath[] = "bad-path";
@@ -21,14 +21,14 @@ inline constexpr char kTooLong[] = "too-long";
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 
-/// The text of an error number of the system's.
+/// The system's text for an error number.
 std::string systemText(int error);
 
 Problem cannotOpen(int error);
 Problem cannotRead(int error);
-/// What was thrown on the way.
+/// For an exception thrown during the read.
 Problem failure(std::exception const& error);
-/// The library's refusal; one of what is plainly another kind of file says so first.
+/// The library's refusal. When the file is plainly of another kind, it says so first.
 Problem refusal(quavel::QVJournal const& journal);
 
 }  // namespace app::reason

@@ -10,7 +10,7 @@
 namespace app::words {
 
 std::string yesNo(bool value);
-/// "2020-07-06 15:32:17" of a date as Exif or ISO 8601 has it; any other text as it is.
+/// "2020-07-06 15:32:17" for a date in the format of Exif or ISO 8601; any other text unchanged.
 std::string date(std::string const& value);
 /// How to turn the stored image, by the TIFF Orientation.
 std::string orientation(std::int32_t value);

@@ -16,14 +16,14 @@ std::size_t terminalWidth(int fd) {
 
 Console::Console() : isTerminal_(::isatty(STDERR_FILENO) == 1) {}
 
-void Console::say(std::string const& message) {
+void Console::printMessage(std::string const& message) {
   hideProgress();
-  // What cannot be said on standard error cannot be said at all.
+  // When standard error fails, there is nowhere else to report it.
   interrupt::write(STDERR_FILENO, "quavel: " + message + "\n");
 }
 
-void Console::sayOf(std::string const& path, std::string const& problem) {
-  say((path.empty() ? "''" : escapedPath(path)) + ": " + escaped(problem));
+void Console::printFileMessage(std::string const& path, std::string const& problem) {
+  printMessage((path.empty() ? "''" : escapedPath(path)) + ": " + escaped(problem));
 }
 
 void Console::showProgress(std::string const& line) {

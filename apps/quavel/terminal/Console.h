@@ -6,7 +6,7 @@
 
 namespace app {
 
-/// Cells in a line of the terminal; 80 where it does not say.
+/// Cells in a line of the terminal; 80 when it is unknown.
 std::size_t terminalWidth(int fd);
 
 /// Standard error: messages, and a progress line below them.
@@ -15,9 +15,9 @@ class Console {
   Console();
 
   /// Prints "quavel: " and the message, which must be safe for a terminal.
-  void say(std::string const& message);
+  void printMessage(std::string const& message);
   /// The same about a file, whose name and problem are made safe.
-  void sayOf(std::string const& path, std::string const& problem);
+  void printFileMessage(std::string const& path, std::string const& problem);
 
   bool isTerminal() const { return isTerminal_; }
   void showProgress(std::string const& line);

@@ -9,15 +9,15 @@ namespace app::interrupt {
 
 namespace {
 
-// All that a signal handler may touch.
+// The state that the signal handler uses.
 std::atomic<char const*> tailToWrite{nullptr};
 std::atomic<bool> isProgressShown{false};
 std::atomic<bool> isWriting{false};
-std::atomic<int> askedBy{0};
+std::atomic<int> pendingSignal{0};
 
 /// Dies by the signal, so that a shell's loop around the command ends with it.
 [[noreturn]] void die() {
-  int const signal = askedBy;
+  int const signal = pendingSignal;
   sigset_t own;
   ::sigemptyset(&own);
   ::sigaddset(&own, signal);
@@ -28,7 +28,7 @@ std::atomic<int> askedBy{0};
 }
 
 [[noreturn]] void leave() {
-  ::alarm(1);  // should nobody read the tail
+  ::alarm(1);  // in case nobody reads the tail
   isWriting = true;
   if (isProgressShown) {
     write(STDERR_FILENO, kEraseLine);
@@ -40,13 +40,13 @@ std::atomic<int> askedBy{0};
 }
 
 void handle(int signal) {
-  if (askedBy != 0) {
+  if (pendingSignal != 0) {
     if (signal == SIGALRM) {
       die();
     }
-    return;  // the end is under way, and the alarm bounds it
+    return;  // already ending, and the alarm limits how long that takes
   }
-  askedBy = signal;
+  pendingSignal = signal;
   if (!isWriting) {
     leave();
   }
@@ -69,7 +69,7 @@ void write(int fd, std::string_view bytes) {
 void install() {
   struct sigaction action = {};
   action.sa_handler = handle;  // without SA_RESTART: a write that waits returns
-  // None cuts another's handling short but the alarm.
+  // No signal but the alarm interrupts the handling of another.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);
   ::sigaction(SIGALRM, &action, nullptr);
@@ -82,13 +82,13 @@ void install() {
   }
 }
 
-Shield::Shield() {
+BlockSignals::BlockSignals() {
   sigset_t all;
   ::sigfillset(&all);
   ::pthread_sigmask(SIG_SETMASK, &all, &previous_);
 }
 
-Shield::~Shield() { ::pthread_sigmask(SIG_SETMASK, &previous_, nullptr); }
+BlockSignals::~BlockSignals() { ::pthread_sigmask(SIG_SETMASK, &previous_, nullptr); }
 
 void setTail(char const* tail) { tailToWrite = tail; }
 
@@ -102,7 +102,7 @@ WriteScope::~WriteScope() {
 }
 
 void leaveIfAsked() {
-  if (askedBy != 0) {
+  if (pendingSignal != 0) {
     leave();
   }
 }

@@ -13,14 +13,14 @@ namespace {
 
 constexpr std::string_view kEllipsis = "…";
 
-/// One character, or one byte that begins none.
+/// One character, or one byte that is not part of a valid one.
 struct Character {
-  utf8proc_int32_t code;  // the byte's value when it is not valid
+  utf8proc_int32_t code;  // of the byte, when it is not valid
   std::string_view bytes;
   bool isValid;
 };
 
-/// Takes the first character off a text that is not empty.
+/// Removes the first character from a text that is not empty.
 Character takeCharacter(std::string_view& text) {
   auto const* const bytes = reinterpret_cast<utf8proc_uint8_t const*>(text.data());
   utf8proc_int32_t code = 0;
@@ -56,7 +56,7 @@ bool isHidden(Character const& character) {
     case UTF8PROC_CATEGORY_ZP:
       return true;
     case UTF8PROC_CATEGORY_CF:
-      // Scripts and emoji need the joiners; the Arabic signs that enclose a number are seen.
+      // Scripts and emoji need the joiners; the Arabic signs that enclose a number are visible.
       return character.code != kNonJoiner && character.code != kJoiner &&
              utf8proc_get_property(character.code)->boundclass != UTF8PROC_BOUNDCLASS_PREPEND;
     default:
@@ -86,8 +86,8 @@ bool isUtf8(std::string_view text) {
 }  // namespace
 
 bool isPlain(std::string_view text) {
-  // Eight characters at a time: taking away the space, or adding one, sets the top bit of a byte
-  // that is not visible ASCII, unless it was set already.
+  // Eight characters at a time: subtracting a space or adding one sets the top bit of any byte that
+  // is not visible ASCII, unless it is already set.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = kSpaces;
@@ -187,7 +187,7 @@ std::string keepEnd(std::string const& text, std::size_t width) {
   std::string_view kept = text;
   for (std::string_view rest = text; !rest.empty(); kept = rest) {
     std::size_t const taken = cellsOf(takeCharacter(rest));
-    if (left < width && taken > 0) {  // a mark would go to the ellipsis
+    if (left < width && taken > 0) {  // a combining mark would attach to the ellipsis
       break;
     }
     left -= taken;

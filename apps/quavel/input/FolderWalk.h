@@ -1,5 +1,5 @@
-#ifndef QUAVEL_APPS_WALK_H
-#define QUAVEL_APPS_WALK_H
+#ifndef QUAVEL_APPS_FOLDERWALK_H
+#define QUAVEL_APPS_FOLDERWALK_H
 
 #include <dirent.h>
 #include <sys/types.h>
@@ -20,19 +20,19 @@ namespace app {
 /// Takes a path that is skipped, and why.
 using Report = std::function<void(std::string const& path, std::string const& why)>;
 
-/// What a walk leaves out besides files that are no photos.
+/// What a walk leaves out, besides files that are not photos.
 struct Filter {
-  bool showsHidden = false;           ///< Not set: no "._" files, no folders that begin with ".".
+  bool showsHidden = false;  ///< Otherwise "._" files and folders that begin with "." are left out.
   std::vector<std::string> excluded;  ///< Globs of names or, with a "/" in them, of paths.
 };
 
 /// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
 /// are followed; one that leads back to a folder above it, or to where another link led before, is
-/// reported and skipped. Holds no more than the names of the folders it is inside of.
-class Walk {
+/// reported and skipped. Keeps only the names of the folders that it is in.
+class FolderWalk {
  public:
   /// The filter must outlive it.
-  Walk(std::string const& folder, Filter const& filter, Report report);
+  FolderWalk(std::string const& folder, Filter const& filter, Report report);
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
@@ -40,14 +40,14 @@ class Walk {
  private:
   using Identity = std::pair<dev_t, ino_t>;
   struct Entry {
-    std::size_t name;    // where it starts in the names
+    std::size_t name;    // where it starts in `names`
     unsigned char type;  // the system's, such as DT_REG
   };
   struct Level {
     std::string path;  // with a "/" at the end
     Identity identity;
     std::string names;           // each ends with a NUL
-    std::vector<Entry> entries;  // still to be visited, the last one first
+    std::vector<Entry> entries;  // still to be visited, from the last one
   };
 
   void enter(std::string const& path, bool isLink);
@@ -67,4 +67,4 @@ class Walk {
 
 }  // namespace app
 
-#endif  // QUAVEL_APPS_WALK_H
+#endif  // QUAVEL_APPS_FOLDERWALK_H

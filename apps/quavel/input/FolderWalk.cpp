@@ -1,4 +1,4 @@
-#include "input/Walk.h"
+#include "input/FolderWalk.h"
 
 #include <fnmatch.h>
 #include <sys/stat.h>
@@ -15,16 +15,16 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kUsualPath = 100;  // saves taking memory twice
+constexpr std::size_t kUsualPath = 100;  // so that most paths take memory only once
 
 }  // namespace
 
-Walk::Walk(std::string const& folder, Filter const& filter, Report report)
+FolderWalk::FolderWalk(std::string const& folder, Filter const& filter, Report report)
     : filter_(filter), report_(std::move(report)) {
   enter(folder, false);
 }
 
-bool Walk::next(Input& input) {
+bool FolderWalk::next(Input& input) {
   while (missed_ || !levels_.empty()) {
     if (missed_) {
       input = std::move(*missed_);
@@ -48,7 +48,7 @@ bool Walk::next(Input& input) {
   return false;
 }
 
-bool Walk::visit(unsigned char type, std::string path, Input& input) {
+bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
     case DT_REG:
       input = {std::move(path), true, {}};
@@ -57,7 +57,7 @@ bool Walk::visit(unsigned char type, std::string path, Input& input) {
       enter(path, false);
       return false;
     case DT_LNK:
-    case DT_UNKNOWN:  // not every file system says it here
+    case DT_UNKNOWN:  // not every file system gives the type here
       return visitUnknown(std::move(path), input);
     default:
       report_(path, "is not a regular file; skipped");
@@ -65,14 +65,14 @@ bool Walk::visit(unsigned char type, std::string path, Input& input) {
   }
 }
 
-bool Walk::visitUnknown(std::string path, Input& input) {
+bool FolderWalk::visitUnknown(std::string path, Input& input) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
     if (errno == ELOOP) {
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    input = {std::move(path), false, {}};  // reading it will tell what is wrong
+    input = {std::move(path), false, {}};  // reading it will show what is wrong
     return isPhotoExtension(extensionOf(input.path));
   }
   if (S_ISDIR(status.st_mode)) {
@@ -87,7 +87,7 @@ bool Walk::visitUnknown(std::string path, Input& input) {
   return visit(S_ISREG(status.st_mode) ? DT_REG : DT_CHR, std::move(path), input);
 }
 
-void Walk::enter(std::string const& path, bool isLink) {
+void FolderWalk::enter(std::string const& path, bool isLink) {
   std::unique_ptr<DIR, int (*)(DIR*)> const folder(::opendir(path.c_str()), ::closedir);
   struct stat status = {};
   if (!folder || ::fstat(::dirfd(folder.get()), &status) == -1) {
@@ -102,7 +102,7 @@ void Walk::enter(std::string const& path, bool isLink) {
   levels_.push_back(std::move(level));
 }
 
-bool Walk::isRepeated(std::string const& path, Identity const& identity, bool isLink) {
+bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool isLink) {
   bool const isInside = std::any_of(levels_.begin(), levels_.end(),
                                     [&](Level const& level) { return level.identity == identity; });
   if (isInside) {
@@ -116,8 +116,9 @@ bool Walk::isRepeated(std::string const& path, Identity const& identity, bool is
   return false;
 }
 
-bool Walk::isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const {
-  // macOS puts what other file systems cannot store of IMG.JPG into ._IMG.JPG, which is no photo.
+bool FolderWalk::isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const {
+  // On foreign file systems, macOS keeps some data about IMG.JPG in ._IMG.JPG, which is not a
+  // photo.
   if (!filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_")) {
     return true;
   }
@@ -128,7 +129,7 @@ bool Walk::isLeftOut(std::string const& folder, std::string_view name, bool isFo
   });
 }
 
-void Walk::readEntries(DIR* folder, Level& level) {
+void FolderWalk::readEntries(DIR* folder, Level& level) {
   errno = 0;
   while (dirent const* const entry = ::readdir(folder)) {
     std::string_view const name = entry->d_name;
@@ -150,7 +151,7 @@ void Walk::readEntries(DIR* folder, Level& level) {
   });
 }
 
-void Walk::miss(std::string const& path, int error) {
+void FolderWalk::miss(std::string const& path, int error) {
   missed_ = {path,
              false,
              {reason::kUnreadableFolder, "the folder cannot be read: " + reason::systemText(error) +
