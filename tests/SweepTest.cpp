@@ -47,7 +47,7 @@ void sweepChanges(Bytes const& bytes, std::string const& extension) {
       changed[i] = value;
       auto const record = read();
       EXPECT_EQ(brokenLaw(journal, record.get()), "") << i;
-      EXPECT_EQ(describe(QVReader(dataOf(changed), changed.size(), extension).metadata),
+      EXPECT_EQ(describe(QVReader(dataOf(changed), sizeOf(changed), extension).metadata),
                 describe(record));
       for (QVNote const& note : journal.notes()) {
         EXPECT_TRUE(note.reason != QVReason::NotInFormat || absent.count(note.field) == 1)

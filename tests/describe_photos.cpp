@@ -17,8 +17,7 @@ using test::Bytes;
 constexpr std::size_t kDamagedBytes = 4096;
 
 std::shared_ptr<QVMetadata> read(Bytes bytes, std::string const& extension) {
-  auto const size = static_cast<unsigned long>(bytes.size());
-  return QVReader(test::dataOf(bytes), size, extension).metadata;
+  return QVReader(test::dataOf(bytes), test::sizeOf(bytes), extension).metadata;
 }
 
 /// Without what a library of mathematics gives: its last digit is the platform's own.

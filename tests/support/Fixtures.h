@@ -78,6 +78,8 @@ std::string describe(std::shared_ptr<QVMetadata> const& record);
 inline unsigned char* dataOf(Bytes& bytes) {
   return reinterpret_cast<unsigned char*>(bytes.data());
 }
+/// As the library counts them: `unsigned long` is not as long everywhere.
+inline unsigned long sizeOf(Bytes const& bytes) { return static_cast<unsigned long>(bytes.size()); }
 
 /// The record that the bytes give, described.
 std::string readBuffer(Bytes bytes, std::string const& extension);

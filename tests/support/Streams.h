@@ -15,7 +15,7 @@ struct OwnBytes {
 /// A stream over bytes of its own that counts what it is asked for, and does otherwise if told to.
 struct TestStream : OwnBytes, QVMStream {
   explicit TestStream(Bytes const& content, ByteOrder order = kMM)
-      : OwnBytes{content}, QVMStream(dataOf(bytes), bytes.size()) {
+      : OwnBytes{content}, QVMStream(dataOf(bytes), sizeOf(bytes)) {
     byteOrder = order;
   }
 
