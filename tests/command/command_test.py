@@ -193,7 +193,7 @@ class Forms(CommandTest):
                               stdout=subprocess.PIPE, cwd=self.folder) as process:
             process.stdin.write(b"0001.tif\n0002.tif\n")
             process.stdin.flush()
-            time.sleep(0.3)  # a pause is no reason for another header
+            time.sleep(0.3)  # a pause brings no second header
             late, _ = process.communicate(b"later/x.cr3\n", 60)
         self.assertEqual(late, self.run_quavel("0001.tif", "0002.tif", "later/x.cr3").stdout)
 
@@ -214,7 +214,7 @@ class Forms(CommandTest):
         self.assertEqual("".join(name[2] for name in self.names("--sort", "-exposureTime", ".")),
                          "degabcf")
 
-    def test_sorting_keeps_equals_in_their_order(self):
+    def test_sorting_is_stable(self):
         names = [f"{i * 17 % 40:02}.tif" for i in range(40)]
         for i, name in enumerate(names):
             self.put(name, photo(width=100 + i % 2))
@@ -315,7 +315,7 @@ class Forms(CommandTest):
 
 
 class Names(CommandTest):
-    def test_any_name_comes_back(self):
+    def test_every_name_can_be_recovered(self):
         names = [b"sp ace.tif", b"new\nline.TIF", b"back\\slash\".tif", b"\xc2\x9b\x7f.tif", b'quo"te,.tif', b"-dash.tif",
                  b"caf\xe9.tif",
                  "é\u202e\x1b[2J.tif".encode()]
@@ -354,7 +354,7 @@ class Names(CommandTest):
         usage = self.run_quavel("--\x1b[31m", status=2)
         self.assertNotIn(b"\x1b", usage.stderr)
 
-    def test_columns_follow_the_script(self):
+    def test_columns_align_in_every_script(self):
         self.put("b.cr3", cr3(model=b"x" * 40))
         for model, shown, width in (
                 ("e\u0301\u20dd", "e\u0301\u20dd", 1), ("漢字", "漢字", 4), ("हिन्दी", "हिन्दी", 5),
@@ -381,7 +381,7 @@ class Names(CommandTest):
             self.assertEqual(second["model"], "\U0010ffff\ud7ff\u0800")
             os.remove(os.path.join(os.fsencode(self.folder), b"1" + bad + b".cr3"))
 
-    def test_texts_that_are_no_utf8_are_latin1(self):
+    def test_texts_that_are_not_utf8_are_latin1(self):
         self.put("a.cr3", cr3(model=b"Cam\xe9ra"))
         self.put("b.cr3", cr3(model="Caméra".encode()))
         self.assertEqual([r["model"] for r in self.objects(".")], ["Caméra"] * 2)
