@@ -41,8 +41,8 @@ install(FILES ${CMAKE_CURRENT_BINARY_DIR}/quavel.pc
 
 install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT license)
 
-# Programs installed beside the library find it wherever the tree is moved. This is no rule for the
-# library's own target, which exists already.
+# Programs installed beside the library find it wherever the tree is moved. This does not apply
+# to the library's own target, which exists already.
 if(PROJECT_IS_TOP_LEVEL AND NOT DEFINED CMAKE_INSTALL_RPATH)
   file(RELATIVE_PATH libdir_from_bindir
        /prefix/${CMAKE_INSTALL_BINDIR} /prefix/${CMAKE_INSTALL_LIBDIR})

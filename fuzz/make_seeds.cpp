@@ -2,6 +2,7 @@
 //
 //     make_seeds FOLDER
 
+#include <algorithm>
 #include <fstream>
 #include <iostream>
 
@@ -10,13 +11,10 @@
 
 namespace {
 
-char formatByte(std::string const& extension) {
+/// The first byte of an input; the size of the list when the extension is not in it.
+std::size_t formatByte(std::string const& extension) {
   auto const& all = quavel::fuzz::Input::kExtensions;
-  char index = 0;
-  while (extension != all[static_cast<std::size_t>(index)]) {
-    ++index;
-  }
-  return index;
+  return static_cast<std::size_t>(std::find(all.begin(), all.end(), extension) - all.begin());
 }
 
 }  // namespace
@@ -27,11 +25,16 @@ int main(int argc, char** argv) {
     return 2;
   }
   for (auto const& fixture : quavel::test::fixtures()) {
+    std::size_t const index = formatByte(fixture.extension);
+    if (index == quavel::fuzz::Input::kExtensions.size()) {
+      std::cerr << fixture.extension << ": not listed in Fuzzing.h\n";
+      return 1;
+    }
     for (quavel::ByteOrder const order : quavel::test::kOrders) {
       char const* const suffix = order == quavel::test::kII ? "-ii" : "-mm";
       std::string const path = std::string(argv[1]) + "/" + fixture.extension + suffix;
       std::ofstream file(path, std::ios::binary);
-      file << formatByte(fixture.extension) << fixture.bytes(order);
+      file << static_cast<char>(index) << fixture.bytes(order);
       if (!file) {
         std::cerr << path << ": cannot be written\n";
         return 1;

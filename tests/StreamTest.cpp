@@ -208,7 +208,7 @@ TEST(ReadAheadStream, DeliversTheSourcesBytesWhateverTheBlocks) {
   for (std::size_t i = 0; i < 25 * 100; ++i) {
     QVReadAheadStream stream(std::make_shared<TestStream>(bytes), kSizes[i % 5], kSizes[i / 5 % 5]);
     for (int step = 0; step < 6; ++step) {
-      bool const isFar = random() % 6 == 0;  // memory stops at its end, which is no refusal
+      bool const isFar = random() % 6 == 0;  // memory stops at its end and refuses nothing
       auto const offset = isFar ? kFar : static_cast<long>(random() % 310);
       auto const start = std::min(static_cast<std::size_t>(offset), bytes.size());
       Bytes read(random() % 20, '\0');
@@ -239,7 +239,7 @@ TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {
   EXPECT_EQ(stream.getOffset(), 8998);
 }
 
-TEST(ReadAheadStream, TakesNothingFromASourceThatBoastsOrThrows) {
+TEST(ReadAheadStream, TakesNothingFromASourceThatOverstatesOrThrows) {
   auto const source = std::make_shared<TestStream>("\x12\x34\x56\x78\x9a\xbc");
   source->mostAtOnce = 1;
   QVReadAheadStream stream(source, 2, 2);

@@ -91,7 +91,7 @@ TEST(TiffEntry, ReadsValuesInTheFieldAndElsewhere) {
   EXPECT_EQ(text, "AB");
 }
 
-TEST(TiffEntry, ReadsMoreThanOnePart) {
+TEST(TiffEntry, ReadsValuesInSeveralParts) {
   Bytes text = "\xe9";
   while (text.size() < 1300) {
     text += std::to_string(text.size()) + " ";
@@ -234,7 +234,7 @@ TEST(TiffDirectory, RefusesAnEntryThatIsCut) {
   }
 }
 
-TEST(TiffDirectory, TakesNoClaimBeyondWhatWasAskedFor) {
+TEST(TiffDirectory, RefusesACountAboveWhatWasAskedFor) {
   auto const odd = std::make_shared<TestStream>(tiff(kMM, plainTiff()));
   odd->onRead = [&](auto* destination, std::size_t count) {
     return odd->deliver(destination, count) + (count > 8 ? 1000 : 0);

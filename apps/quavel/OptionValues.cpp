@@ -24,7 +24,7 @@ Field const* wantedField(std::string const& option, std::string const& name) {
 
 /// The parser's own lists skip empty names.
 void addFields(std::string const& list, Fields& fields) {
-  std::istringstream names(list + ',');  // so that every name ends with one, even an empty last one
+  std::istringstream names(list + ',');  // ends the last name too, even an empty one
   for (std::string name; std::getline(names, name, ',');) {
     auto const* const field = wantedField("--fields", name);
     if (std::count(fields.begin(), fields.end(), field) > 0) {

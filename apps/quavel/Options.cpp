@@ -25,7 +25,7 @@ constexpr char kFooter[] =
     "Fields are the record's names, such as model, or path, captureDate, reason: see quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
-/// Shows only an option's argument: which options exclude each other is said when it matters.
+/// Shows only an option's argument, not the options that it excludes: an error message names those.
 class ShortFormatter : public CLI::Formatter {
  public:
   std::string make_option_opts(CLI::Option const* option) const override {
@@ -103,7 +103,7 @@ void addChoices(CLI::App& command, Options& options) {
   addMany("--fields", "A,B,..", "Show these fields, in this order", setFields);
   addMany("--where", "EXPR", "Only photos like this, such as 'iso>=3200'; repeatable",
           [&form](std::vector<std::string> const& texts) { values::addConditions(texts, form); });
-  add("--sort", "[-]FIELD", "Sort by a field (-: downwards), once all are read",
+  add("--sort", "[-]FIELD", "Sort by a field (-: descending), once all are read",
       [&form](std::string const& name) { values::setSort(form, name); });
   add("--absent", "skip|show", "Absent values: skip or show (CSV always shows)",
       [&form](std::string const& choice) {

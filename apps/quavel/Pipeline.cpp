@@ -99,7 +99,7 @@ void Pipeline::startThread() {
   try {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
-    // The system allows no more: the running threads do all the work, or else the caller does.
+    // No further thread can be started: those that run do the work or, without any, the caller.
     jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
     busyJobs_ = std::min(busyJobs_, jobs_);
   }

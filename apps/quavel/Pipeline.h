@@ -45,7 +45,7 @@ class Pipeline {
   /// pipeline is empty.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
-  /// Enough batches are under way to keep the threads busy.
+  /// Whether enough batches are under way to keep the threads busy.
   bool isFull() const;
   bool isOldestDone();
 

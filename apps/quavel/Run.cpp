@@ -47,7 +47,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;
   std::size_t batchSize_ = 1;
-  bool lacksError_;  // and the user has not been told
+  bool lacksError_;  // the output has no error column, and no message has said so
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)

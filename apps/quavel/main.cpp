@@ -15,8 +15,8 @@
 
 namespace {
 
-/// Opens standard streams that are closed as a file that refuses reads and writes, so that no photo
-/// is opened under their numbers.
+/// Opens /dev/null for each standard stream that is closed, so that no photo gets its descriptor,
+/// and in the mode in which using the stream fails.
 void holdStandardStreams() {
   if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
     // Not for reading: an empty input would look like an empty list.

@@ -6,7 +6,7 @@
 
 namespace quavel {
 
-/// An NRW file: a TIFF structure that holds a raw image. It is not read as a NEF file is.
+/// An NRW file: a TIFF structure that holds a raw image. It is read like a TIFF, not like a NEF.
 class QUAVEL_EXPORT QVNRWImage : public QVTiffImage {
  public:
   /// `isRaw` is true from the start.

@@ -24,7 +24,7 @@ std::string pathOf(py::handle path, char const* name) {
             std::string(name) + " must be str, bytes or os.PathLike, not " + typeName(path));
   }
   if (PyErr_ExceptionMatches(PyExc_ValueError) != 0) {
-    raiseOf(PyExc_ValueError, std::string(name) + " holds what no path can");
+    raiseOf(PyExc_ValueError, std::string(name) + " contains a character that no path can contain");
   }
   throw py::error_already_set();
 }
@@ -36,7 +36,7 @@ std::string extensionOf(py::handle extension) {
   Py_ssize_t size = 0;
   char const* const utf8 = PyUnicode_AsUTF8AndSize(extension.ptr(), &size);
   if (utf8 == nullptr) {
-    raiseOf(PyExc_ValueError, "extension holds what no extension can");
+    raiseOf(PyExc_ValueError, "extension contains a character that no extension can contain");
   }
   std::string text(utf8, static_cast<std::size_t>(size));
   if (!text.empty() && text.front() == '.') {

@@ -40,7 +40,7 @@ constexpr std::tuple kFields = {
     Field<std::string>{"date_time", "dateTime", &QVMetadata::dateTime,
                        "When the file was last changed: text, as date_time_original."},
     Field<bool>{"has_shooting_info", "hasShootingInfo", &QVMetadata::hasShootingInfo,
-                "The fields from model on were looked for; true for CR3 only."},
+                "The fields from lens_model on were looked for; true for CR3 only."},
     Field<std::string>{"model", "model", &QVMetadata::model, "Camera model."},
     Field<std::string>{"lens_model", "lensModel", &QVMetadata::lensModel, "Lens model."},
     Field<std::int32_t>{"iso", "iso", &QVMetadata::iso, "ISO speed."},
@@ -228,7 +228,7 @@ void addRecord(py::module_& module) {
       "What a file tells about its photo. An attribute is None where the file does not say.");
   record.def_property_readonly("captured", captured,
                                "capture_date as datetime, without a time zone; None for what is "
-                               "no date.");
+                               "not a date.");
   record.def_property_readonly(
       "capture_date", [](QVMetadata const& self) { return shown(self.captureDate()); },
       "The best date there is, as text: the original one, else the digitized one, else the "

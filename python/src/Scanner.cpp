@@ -130,7 +130,8 @@ void Scanner::takePaths(Work& work) {
         if (!error.matches(PyExc_ValueError)) {
           throw;
         }
-        photo.refusal = {"bad-path", "the path holds what no path can", -1, 0};
+        photo.refusal = {"bad-path", "the path contains a character that no path can contain", -1,
+                         0};
       }
       work.paths.append(path);
       work.batch.photos.push_back(std::move(photo));

@@ -15,7 +15,7 @@ namespace binding {
 
 /// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
 /// are followed, except those that lead back to a folder above or to where another link led.
-/// Holds no more than the names in the folders it is inside of.
+/// Keeps only the names of the folders that it is in.
 class Walk {
  public:
   explicit Walk(std::string folder) { enter(std::move(folder), false); }

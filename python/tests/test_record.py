@@ -73,7 +73,7 @@ def test_attributes(photos):
         (b"2021:05:01 10:00:00Z", None),
         (b"2021:05:01", None),
         (b"caf\xc3\xa9", None),
-        (b"caf\xe9", None),  # Latin-1 where it is no UTF-8
+        (b"caf\xe9", None),  # Latin-1 where it is not UTF-8
     ],
 )
 def test_dates(text, moment):

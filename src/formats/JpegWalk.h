@@ -27,7 +27,7 @@ namespace detail {
 /// Notes where the data ends, which may be before the end of the last segment.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes why the Exif size does not count, unless it does.
+/// Notes why the Exif size does not count, if it does not.
 void noteSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

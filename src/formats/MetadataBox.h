@@ -12,8 +12,8 @@
 
 namespace quavel::detail {
 
-/// Reads a metadata box of the given type by its `readExif`, which gets the stream with the
-/// payload's base. The stream's base and byte order are restored on success only.
+/// Reads a metadata box of the given type. Its `readExif` gets the stream at the start of the
+/// payload, with `baseOffset` there. `baseOffset` and `byteOrder` are restored on success only.
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {

@@ -27,7 +27,7 @@ constexpr unsigned short kAPP1 = 0xffe1;
 constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
-// Up to it, a side given by the Exif directory is taken for a thumbnail's.
+// A side of up to this many pixels in the Exif directory is taken for a thumbnail's.
 constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};

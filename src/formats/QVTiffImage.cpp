@@ -10,7 +10,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD that is marked as not reduced; null on failure, which includes that none is.
+/// The first SubIFD that is marked as not reduced; null when there is none, or on failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);
@@ -42,7 +42,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   return nullptr;
 }
 
-/// The directory of the full-size image; null on failure, which includes that there is none.
+/// The directory of the full-size image; null when there is none, or on failure.
 DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
                                     DirectoryPointer const& mainIFD) {
   ValuePointer type = nullptr;

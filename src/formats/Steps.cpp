@@ -131,7 +131,7 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   }
 }
 
-// Below, a directory without a row is a host's, and no notes are kept of those.
+// Below, a directory without a row is a host's, of which no notes are kept.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);

@@ -57,10 +57,10 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the tag's field stays absent because there is no entry for it.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same, because its entry, which the pattern names, does not hold a usable value.
+/// The same, because its entry holds no usable value; the pattern says what it holds.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
-/// Refuses an entry for what it holds; the directory must have it. Returns false.
+/// Refuses the tag's entry, which the directory must have, for its content. Returns false.
 bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char const* wanted);
 
 /// Whether NewSubfileType's bit 0 marks a reduced-resolution version of another image.
@@ -71,7 +71,7 @@ bool isReducedImage(ValuePointer newSubfileType);
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A reader's own directory, for notes. For a host's directory, which no notes are kept of, null.
+/// A directory as notes name it; null for a host's, of which no notes are kept.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};

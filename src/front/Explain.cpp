@@ -17,7 +17,7 @@ constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 /// A field that can be absent.
 struct FieldRow {
   char name[22];
-  std::uint8_t origin;    ///< How many rows below is the field that it is computed from, or 0.
+  std::uint8_t origin;    ///< Rows down to the field that it is computed from; 0: none.
   std::uint8_t families;  ///< The readers that fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };

@@ -35,13 +35,13 @@ Format const* formatOf(std::string_view extension);
 /// Notes why each absent field of the record is absent.
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
-/// Notes what a refused file, which begins at `start`, looks like when that is not the format.
+/// When the refused file, which begins at `start`, looks like another format, notes which one.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);
 
-/// The record of the file that the whole stream is, or null.
+/// The record of the file that the stream holds, or null.
 std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
                                        std::string const& extension, Journal* journal);
 

@@ -12,24 +12,24 @@
 namespace quavel::detail {
 
 /// Collects the notes of one read. The readers state theirs through the functions below. A null
-/// journal means that nobody listens; then no text is made.
+/// journal means that nobody asked for notes; no text is then composed.
 class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
 
-  /// Whether it takes more than the refusal.
+  /// Whether steps and absences are wanted, not only the refusal.
   bool wantsAll() const { return wantsAll_; }
 
   using Words = std::initializer_list<Word>;
 
   /// Only the first refusal counts: later ones follow from it.
   void refuse(QVReason reason, std::int64_t position, char const* pattern, Words words);
-  /// Refuses because `count` bytes at `position`, those of what the pattern names, are missing.
+  /// Refuses because the `count` bytes at `position` are missing; the pattern says what they are.
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
   /// Counts steps beyond the first few instead of keeping them.
   void passed(std::int64_t position, char const* pattern, Words words);
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
-  /// Says why a field stays absent, in case it does; the last reason counts.
+  /// The reason for a field's absence, should it be absent at the end; the last reason counts.
   void absent(char const* field, QVReason reason, char const* pattern, Words words);
 
   /// The reason given so far for a field's absence, or null.
@@ -59,7 +59,7 @@ class Journal {
   std::vector<QVNote> absences_;  // at most one for each field
 };
 
-/// Whether somebody listens who wants more than the refusal.
+/// Whether there is a journal that wants more than the refusal.
 inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
 
 /// States why the read ends. Always false, for the step to return at once.

@@ -34,7 +34,7 @@ class Reading {
     return done <= kMaxWork[static_cast<std::size_t>(work)] || refuseWork(work);
   }
 
-  Journal* journal = nullptr;  ///< Null: nobody listens.
+  Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
   /// The library made the record itself, so no class of the host's sees the directories.
   bool isOwnRecord = false;
@@ -82,14 +82,14 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Remembers, for a refusal that may follow, whether the last read failed, and with which error of
-/// the system, if that is known.
+/// Remembers whether the last read failed, and the system's error if it is known: a refusal that
+/// follows states them.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.
 inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }
 
-/// The same for a note; 0 when nobody listens.
+/// The same for a note; 0 without a journal.
 inline std::int64_t notedPosition(Journal const* journal, QVStream& stream) {
   return journal == nullptr ? 0 : positionOf(stream);
 }

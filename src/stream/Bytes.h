@@ -52,7 +52,7 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// Copies bytes. Most reads are of one number, which takes no call when its size is a constant.
+/// Copies bytes. Most reads are of one number: its constant size spares the call of memcpy.
 inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std::size_t count) {
   switch (count) {
     case 2:
@@ -75,11 +75,11 @@ inline constexpr bool kIsLongShort = sizeof(long) < sizeof(std::int64_t);
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLongShort ? 1L << 20U : 0);
 
-/// Stands for everything that has no offset.
+/// Stands for every position that has no offset.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLongShort ? 1 : 0);
 
-/// Moves the stream to an offset. False: that is out of reach. The stream then stays where it is,
-/// and nothing must be read from there.
+/// Moves the stream to an offset. False: the offset is out of reach. The stream has not moved then,
+/// and must not be read.
 inline bool seek(QVStream& stream, std::int64_t offset) {
   if (offset > kLastOffset || offset < std::numeric_limits<long>::min()) {
     return false;
@@ -108,7 +108,7 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
     std::int64_t const delivered = stream.readBuffer(destination + received, count - received);
     if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - received) {
       if (delivered != 0) {
-        noteReadResult(stream, -1, 0);  // more than asked for is not a count either
+        noteReadResult(stream, -1, 0);  // a count above what was asked for is a failure too
       }
       break;
     }

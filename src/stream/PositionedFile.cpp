@@ -61,7 +61,7 @@ std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t cou
   if (position_ != pipePosition_) {
     return -1;
   }
-  // Whole: what has arrived by now depends on the writer.
+  // A pipe delivers what its writer has written so far, so loop until all has arrived.
   std::size_t received = 0;
   std::int64_t delivered = 1;
   while (received < count && delivered > 0) {

@@ -8,13 +8,13 @@
 
 namespace quavel::detail {
 
-/// File systems may refuse positions beyond a limit of their own; none refuses one up to this.
+/// Each file system has its own limit for positions; every one accepts those up to this.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read names its position, so that a seek costs nothing,
 /// and the system is asked not to read ahead. A file that takes many reads is being walked to its
-/// end, so the system is then asked to fetch what follows. A pipe is
-/// read front to back; a read anywhere else fails.
+/// end, so the system is then asked to fetch what follows. A pipe is read front to back; a read
+/// anywhere else fails.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);
@@ -29,12 +29,12 @@ class PositionedFile : public QVFStream {
 
   std::int64_t position_ = 0;      // absolute
   std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
-  std::int64_t foreseenEnd_ = 0;   // where the system no longer expects reads
+  std::int64_t foreseenEnd_ = 0;   // of the range that the system was told to expect reads in
   int reads_ = 0;
 };
 
-/// The file at `path` as the readers by path get it, read ahead. `fd` is set to its descriptor,
-/// which stays the stream's; -1: the file cannot be opened, and `errno` says why.
+/// Opens the file at `path` as a stream that reads ahead. Sets `fd` to its descriptor, which the
+/// stream owns; -1: the file cannot be opened, and `errno` says why.
 std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
 
 }  // namespace quavel::detail

@@ -13,7 +13,7 @@ namespace quavel {
 
 namespace {
 
-/// Moves to where `long` does not reach, by the base. False: the stream is not there afterwards.
+/// Seeks to a position that does not fit a `long`, by way of `baseOffset`. False: the seek failed.
 bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = static_cast<std::int64_t>(static_cast<std::uint64_t>(base) +
@@ -63,7 +63,7 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  // A source that refuses the seek stays at 0. One that goes no further than its end accepts it.
+  // A source that refuses the seek stays at 0. One that stops at its end counts as accepting it.
   sourcePosition_ = -1;
   source_->setOffset(0);
   if (target == static_cast<long>(target)) {
@@ -100,12 +100,12 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[longest]);
   }
-  // Reads that continue where the source stands are likely to continue further.
+  // Sequential reads are likely to go on, so they get the larger block.
   fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // its bytes are overwritten, whatever happens
+  block.size = 0;  // even a read that fails may overwrite its bytes
   errno = 0;       // a host's stream need not say why it fails
   std::int64_t delivered = readSource(block, wanted);
   if (delivered < 0 && needed < wanted) {
@@ -128,7 +128,7 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
     }
   }
   std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
-  // A count beyond what was asked for is not one; nor is a position beyond the last there can be.
+  // Nor can more be delivered than was asked for, or anything past the largest position.
   if (delivered < 0 || static_cast<std::uint64_t>(delivered) > count ||
       delivered > std::numeric_limits<std::int64_t>::max() - position_) {
     return -1;

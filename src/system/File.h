@@ -39,7 +39,7 @@ inline std::int64_t read(int fd, std::uint8_t* destination, std::size_t count) {
   return ::read(fd, destination, count);
 }
 
-/// At a position, which a pipe does not have: ESPIPE.
+/// Reads at a position. A pipe has none: ESPIPE.
 inline std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count,
                            std::int64_t position) {
   return ::pread(fd, destination, count, position);
@@ -49,7 +49,7 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// Of a regular file; -1: it is none.
+/// The size of a regular file; -1 for anything else.
 inline std::int64_t size(int fd) {
   struct stat status = {};
   return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode) ? std::int64_t{status.st_size} : -1;

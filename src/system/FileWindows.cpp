@@ -17,7 +17,7 @@ namespace quavel::detail::file {
 
 namespace {
 
-/// Empty: it is not UTF-8.
+/// The path in UTF-16; empty when it is not UTF-8.
 std::wstring widened(std::string const& path) {
   int const size =
       ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, nullptr, 0);
@@ -26,7 +26,8 @@ std::wstring widened(std::string const& path) {
   return wide.data();
 }
 
-/// Paths of MAX_PATH characters and more are only taken whole, and so marked.
+/// Windows accepts a path of MAX_PATH characters or more only when it is absolute and has the
+/// prefix that is added here.
 std::wstring marked(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);
   std::vector<wchar_t> whole(std::size_t{size} + 1);

@@ -15,8 +15,8 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// A view of an entry's values, in a reader's directory or a host's, which must outlive it; or no
-/// entry.
+/// A view of an entry's values, which belong to a reader's directory or a host's and must outlive
+/// it. It may be empty: there is no such entry.
 class Entry {
  public:
   Entry() = default;

@@ -49,7 +49,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     if (!wanted.take(tag)) {
       continue;
     }
-    // To the end of the entry itself: a stream that refuses the seek to its values stays there.
+    // Seek past the entry first: a stream that refuses the seek to the values stays there.
     RawEntry entry;
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},

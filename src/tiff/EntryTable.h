@@ -22,8 +22,8 @@ namespace detail {
 
 class Journal;
 
-/// The wanted entries of a directory as they are read, their values side by side. The map that
-/// hosts get, whose every entry and value they may keep, is made from it.
+/// The wanted entries of a directory as they are read, their values side by side. A host gets a map
+/// made from it, of which it may keep any entry and any value.
 class EntryTable {
  public:
   struct Row {

@@ -37,7 +37,7 @@ class EntryWalk {
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
-  /// What follows the tag. False: the data ends before the type or the count does.
+  /// Reads what follows the tag. False: the data ends within the type or the count.
   bool readRest(RawEntry* entry) const {
     if (!isBuffered(kEntryFieldPosition)) {
       return false;

@@ -42,7 +42,7 @@ std::int32_t quotient(SRational const& fraction) {
   if (fraction.denominator == 0) {
     return 0;
   }
-  // 64 bits hold the one quotient that 32 bits cannot; truncated, it is the numerator again.
+  // INT32_MIN / -1 does not fit 32 bits: it is computed in 64 and cut back to INT32_MIN.
   return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
 }
 
@@ -108,7 +108,7 @@ std::uint32_t to32Bits(EntryValue const& value) {
   });
 }
 
-/// As the type has it: an x87 computes with more digits, and keeps them while it can.
+/// Rounds to the precision of `Float`: an x87 keeps more digits in its registers.
 template <class Float, class Number>
 Float rounded(Number number) {
   auto const result = static_cast<Float>(number);

@@ -9,7 +9,7 @@ namespace {
 
 using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
-// Bytes of values read at a time: whole values of any size.
+// Bytes read at a time; a multiple of the size of any value.
 constexpr std::size_t kPartSize = 512;
 
 template <class Number>
@@ -18,7 +18,7 @@ void storeNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* desti
   std::memcpy(destination, &number, sizeof(Number));
 }
 
-/// Takes one value, whose type is set, from the bytes of a file.
+/// Fills a value, whose type is already set, from its bytes in the file.
 void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, EntryValue& value) {
   switch (size) {
     case 1:

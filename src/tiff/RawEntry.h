@@ -18,8 +18,7 @@ inline constexpr std::size_t kEntryCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize =
-    2;  // of the directory's count of entries, before it
+inline constexpr std::int64_t kEntryCountSize = 2;  // the number of entries, which comes first
 
 inline constexpr std::uint16_t kUndefinedCode = 7;
 
@@ -49,7 +48,7 @@ inline bool isAllowed(RawEntry const& entry) {
          (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);
 }
 
-/// Bytes that the values of an entry of a known type take in the file; the bytes of UNDEFINED.
+/// Bytes that an entry's values, or UNDEFINED bytes, take in the file. The type must be known.
 inline std::uint64_t sizeOfValues(RawEntry const& entry) {
   auto const type = static_cast<std::size_t>(fieldTypeToValueType[entry.typeCode]);
   return std::uint64_t{entry.count} * (entry.typeCode == kUndefinedCode ? 1 : kValueSizes[type]);
@@ -63,13 +62,13 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
 /// Whether the data holds all the bytes of the field that the entry uses.
 inline bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
-/// The offset in the field of an entry that is whole.
+/// The offset that the field, which must be whole, holds.
 inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }
 
-/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: the data
-/// does not hold them all.
+/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: the data does not
+/// hold them all.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 

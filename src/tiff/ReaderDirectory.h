@@ -12,8 +12,8 @@ namespace quavel::detail {
 
 using DirectoryPointer = std::shared_ptr<QVTiffImageFileDirectory>;
 
-/// A directory that a reader reads for itself: its steps look entries up in the table. Hosts never
-/// see one; they get what `forHost` makes.
+/// A directory as the library's own readers use it: they look entries up in the table. A host never
+/// sees one; it gets what `forHost` makes.
 class ReaderDirectory final : public QVTiffImageFileDirectory {
  public:
   ReaderDirectory(DirectoryName const& name, std::int64_t position) : table(name, position) {
@@ -22,19 +22,19 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   ReaderDirectory(ReaderDirectory const&) = delete;
   ReaderDirectory& operator=(ReaderDirectory const&) = delete;
 
-  /// The directory as a reader's own; null when it is a host's.
+  /// The same directory as what it is; null when a host made it.
   static ReaderDirectory const* of(QVTiffImageFileDirectory const& directory) {
     return directory.ofReader;
   }
 
-  /// The same directory with `entries`; this one loses its values.
+  /// Moves the values into a directory with `entries`, which a host can use.
   DirectoryPointer forHost();
 
   EntryTable table;
 };
 
-/// `QVTiffHeader::read`, with the name that notes use for the structure, such as "the Exif
-/// segment"; null when it is the whole file.
+/// Does what `QVTiffHeader::read` does. `structure` is what notes call the TIFF structure, such as
+/// "the Exif segment"; null when it is the whole file.
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);
 

@@ -14,7 +14,7 @@ namespace quavel::detail {
 using TagList = std::initializer_list<unsigned short>;
 
 /// The tags that the reader of a directory still wants, each until it is met. An empty list wants
-/// all tags, again and again.
+/// every entry, repeated tags included.
 class WantedTags {
  public:
   WantedTags(unsigned short const* tags, std::size_t count) : wantsAll_(count == 0) {

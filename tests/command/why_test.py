@@ -245,7 +245,7 @@ class WhyTest(unittest.TestCase):
         self.write("x.txt", b"II*")
         for name, reason in (
                 ("none.nef", "No such file"), ("pipe.nef", "FIFO"),
-                ("x.txt", "tiff tif dng nef cr2 raf arw jpeg jpg nrw 3fr cr3"),
+                ("x.txt", "names no format; these do: tiff tif dng "),
                 ("empty.nef", "is empty")):
             with self.subTest(name):
                 status, text = self.why(self.folder / name)

@@ -5,7 +5,7 @@ set -g __quavel_fields path captureDate width height orientation isRaw dateTimeO
     shutterSpeedValue focalLength whiteBalance meteringMode exposureBiasValue \
     focalLengthIn35mmFilm exposureTime fNumber error reason position pathBytes
 
-set -l downwards -$__quavel_fields
+set -l descending -$__quavel_fields
 
 # The list typed so far with each field that it does not name yet.
 function __quavel_lists
@@ -33,7 +33,7 @@ complete -c quavel -l print0 -d 'The paths of the photos, NUL-ended'
 complete -c quavel -l lf -d 'End the lines of CSV with LF'
 complete -c quavel -l fields -x -d 'Show these fields' -a '(__quavel_lists)'
 complete -c quavel -l where -x -d 'Only photos like this' -a "$__quavel_fields"
-complete -c quavel -l sort -x -d 'Sort by a field' -a "$__quavel_fields $downwards"
+complete -c quavel -l sort -x -d 'Sort by a field' -a "$__quavel_fields $descending"
 complete -c quavel -l absent -x -d 'Absent values' -a 'skip show'
 complete -c quavel -l dates -x -d 'Dates in machine forms' -a 'exif iso'
 complete -c quavel -s j -l jobs -x -d 'Files read at a time'

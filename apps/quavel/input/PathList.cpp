@@ -13,10 +13,11 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kStep = std::size_t{1} << 16;
+constexpr std::size_t kReadSize = std::size_t{1} << 16;
 constexpr std::size_t kMaxPathLength = 4096;  // Linux's PATH_MAX
 
-/// Finds out, before anything is written, whether the file can be read: 0, or the system's error.
+/// The `errno` of reading nothing, which fails for a folder, say; 0 when the file can be read. An
+/// error is thus reported before anything is written.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input entryOf(std::string const& path) {
@@ -83,10 +84,10 @@ bool PathList::refill() {
     buffer_.resize(kMaxPathLength + 1);  // too long in any case: the rest is not needed
   }
   std::size_t const size = buffer_.size();
-  buffer_.resize(size + kStep);
+  buffer_.resize(size + kReadSize);
   ssize_t count = 0;
   do {
-    count = ::read(fd_, &buffer_[size], kStep);
+    count = ::read(fd_, &buffer_[size], kReadSize);
   } while (count == -1 && errno == EINTR);
   error = count == -1 ? errno : 0;
   atEnd_ = count <= 0;

@@ -7,7 +7,7 @@
 
 namespace app {
 
-/// The paths that a file or a pipe lists, one a line or, with `separator` NUL, one a string.
+/// The paths listed in a file or a pipe, each ended by `separator`: a line feed or a NUL.
 class PathList {
  public:
   /// Reads `name`, or standard input for "-". Throws std::system_error when it cannot be opened.
@@ -16,10 +16,10 @@ class PathList {
   PathList(PathList const&) = delete;
   PathList& operator=(PathList const&) = delete;
 
-  /// `next` will not have to wait for the process that writes the list.
+  /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
-  /// The next path that is not empty. False at the end, or when the list cannot be read on; `error`
-  /// is then the system's number.
+  /// The next path that is not empty. False: the list has ended, or a read failed; `error` is then
+  /// its `errno`, else 0.
   bool next(Input& input);
 
   int error = 0;
@@ -30,7 +30,7 @@ class PathList {
   int fd_;
   char separator_;
   std::string buffer_;
-  std::size_t start_ = 0;  // of what has not been returned yet
+  std::size_t start_ = 0;  // of the part not returned yet
   bool atEnd_ = false;
 };
 

@@ -24,7 +24,7 @@ class Source {
   /// Throws std::system_error when the list cannot be opened. Keeps a reference to the inputs.
   Source(Inputs const& inputs, Report report);
 
-  /// `next` will not have to wait for the process that writes the list.
+  /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
   bool next(Input& input);
 

@@ -15,12 +15,12 @@ struct Form {
   FormKind kind = FormKind::Automatic;
   Fields fields;                      ///< Empty: those of the form.
   Field const* sort = nullptr;        ///< Null: the order of the input.
-  bool isDescending = false;          ///< Sorted downwards.
+  bool isDescending = false;          ///< Sorted in descending order.
   std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
-  std::optional<bool> showAbsent;     ///< Not set: as the form does.
+  std::optional<bool> showAbsent;     ///< Not set: the form decides.
   bool hasNotes = false;              ///< The notes of the read are shown too.
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
-  bool endsWithLf = false;            ///< Lines of CSV do, instead of with CRLF.
+  bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;

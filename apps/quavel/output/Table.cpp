@@ -143,7 +143,7 @@ void Table::writePage(bool isLast) {
   page_.clear();
 }
 
-/// One header serves all pages, so while more may come, every column stays for what they may bring.
+/// One header serves all pages: while more may come, an empty column stays, since they may fill it.
 void Table::widen(bool isLast) {
   bool const isFirst = natural_.empty();
   Widths const natural = naturalWidths(!isFirst || !isLast);

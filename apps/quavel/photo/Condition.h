@@ -14,8 +14,8 @@ class Condition {
   /// What may begin the comparison after a field's name.
   static constexpr char kSigns[] = "<>=!~";
 
-  /// `comparison` is a relation and a value, such as ">=3200". Throws std::invalid_argument, with
-  /// the words that were wrong, when it is not or does not go with the field.
+  /// `comparison` is a relation and a value, such as ">=3200". Throws std::invalid_argument, which
+  /// quotes the wrong part, when it is malformed or does not suit the field.
   Condition(Field const& field, std::string_view comparison);
 
   /// Compares exact values. An absent value never meets it.

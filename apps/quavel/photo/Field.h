@@ -43,13 +43,13 @@ Fields recordFields();
 /// (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
 
-/// There is no value, or only blanks and colons, which cameras without a clock write.
+/// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
 /// Appends the value for programs: text as it is, digits that read back to the same number,
 /// "Infinity", "true". Nothing when absent.
 void appendExact(std::string& text, Value const& value);
-/// The same by itself.
+/// The same as a string of its own.
 std::string exact(Value const& value);
 
 }  // namespace app

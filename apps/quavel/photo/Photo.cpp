@@ -65,7 +65,7 @@ std::string readAll(Problem& problem) {
 bool isDate(std::string const& text) {
   std::tm time = {};
   char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
-  // Any number of blanks would do before a number.
+  // strptime accepts any number of blanks before a number.
   return text.size() == kDateSize && end == text.c_str() + kDateSize && text.find(' ') == 10 &&
          text.rfind(' ') == 10;
 }

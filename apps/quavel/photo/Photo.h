@@ -12,11 +12,11 @@ namespace app {
 
 using Detail = quavel::QVJournal::Detail;
 
-/// What follows the last ".", in lower case; empty when there is no ".".
+/// What follows the last ".", in lower case; empty without a ".".
 std::string extensionOf(std::string_view path);
 /// Whether an extension in lower case names a format.
 bool isPhotoExtension(std::string const& extension);
-/// Why an extension names none; empty when it does.
+/// Why an extension names no format; empty when it names one.
 std::string whyUnknown(std::string const& extension);
 
 /// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
