@@ -18,11 +18,11 @@ constexpr unsigned kUsualJobs = 32;
 constexpr char kFooter[] =
     "Examples:\n"
     "  quavel IMG_0001.CR3                           one photo, as a card\n"
-    "  quavel ~/Photos                               a folder and all in it, as a table\n"
+    "  quavel ~/Photos                               a folder and all in it, a table\n"
     "  quavel --csv --sort captureDate ~/Photos > photos.csv\n"
     "  quavel --jsonl --fields path,iso,fNumber ~/Photos | jq .iso\n"
     "  find . -mtime -7 -name '*.nef' -print0 | quavel -0 --files-from -\n"
-    "Fields are the record's names, such as model, or path, captureDate, reason: see quavel(1).\n"
+    "Fields, such as model, path, captureDate or reason, are listed in quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
 /// Shows only an option's argument, not the options that it excludes: an error message names those.
@@ -47,7 +47,7 @@ void addInputs(CLI::App& command, Options& options) {
                    "Walk hidden folders, and try files named ._*");
   command
       .add_option("--exclude", options.inputs.filter.excluded,
-                  "Leave these names, or paths, out of folders; repeatable")
+                  "Leave these names or paths out of folders; repeatable")
       ->allow_extra_args(false)
       ->type_name("GLOB");
   command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
@@ -92,7 +92,7 @@ void addChoices(CLI::App& command, Options& options) {
     }
   };
   auto const add = [&command](char const* name, char const* type, char const* text, auto set) {
-    command.add_option_function<std::string>(name, set, text)->type_name(type);
+    command.add_option_function<std::string>(name, set, text)->take_last()->type_name(type);
   };
   auto const addMany = [&command](char const* name, char const* type, char const* text, auto set) {
     command.add_option_function<std::vector<std::string>>(name, set, text)
@@ -139,14 +139,18 @@ void check(Options& options) {
   }
 }
 
-/// The parser would take "--quiet=0" as a request for messages, and "-q=0" as two options.
-void refuseValuesOfFlags(CLI::App const& command, int argc, char const* const* argv) {
+/// The parser would take "--quiet=0" as a request for messages, "-q=0" as two options, and after
+/// "--exclude=" the next word, such as a folder, for the missing value.
+void refuseOddValues(CLI::App const& command, int argc, char const* const* argv) {
   for (int i = 1; i < argc && argv[i] != std::string_view("--"); ++i) {
     std::string const word = argv[i];
     auto const* const option = command.get_option_no_throw(word.substr(0, word.find('=')));
     if (word.find('=') != std::string::npos && option != nullptr &&
         option->get_items_expected_max() == 0) {
       throw CLI::ValidationError("'" + word + "': this option takes no value");
+    }
+    if (word[0] == '-' && word.find('=') + 1 == word.size() && option != nullptr) {
+      throw CLI::ValidationError("'" + word + "': give a value after the =");
     }
   }
 }
@@ -177,7 +181,7 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   addForms(command, options.form);
   addChoices(command, options);
   try {
-    refuseValuesOfFlags(command, argc, argv);
+    refuseOddValues(command, argc, argv);
     command.parse(argc, argv);
     check(options);
   } catch (CLI::CallForHelp const&) {

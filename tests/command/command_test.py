@@ -183,7 +183,7 @@ class Forms(CommandTest):
         for i in range(1, 1100):
             os.link(first, self.folder / f"{i:04}.tif")
         self.put("later/x.cr3", cr3(model="写真機".encode()))
-        tables = {self.run_quavel("-j", jobs, ".").stdout for jobs in "1271"}
+        tables = {self.run_quavel("-j", jobs, ".").stdout for jobs in ("1", "2", "256", "1")}
         self.assertEqual(len(tables), 1)
         lines = tables.pop().decode().splitlines()
         self.assertRegex(lines[0], r"^File        Captured          Size       Orient. +Camera +Lens +Exposure$")
@@ -231,7 +231,8 @@ class Forms(CommandTest):
                 (["iso=400"], "b"), (["iso==400"], "b"), (["iso != 400"], "a"), (["model~EOS"], "ab"),
                 (["model~EOS", "iso > 400"], "a"), (["model~eos"], ""), (["model==EOS R6"], "a"),
                 (["fNumber==5.6"], "a"), (["isRaw=false"], "c"), (["reason==other-kind"], "d"),
-                (["captureDate<9"], "ab"), (["captureDate>="], None), (["position<9"], "d"),
+                (["captureDate<9"], "ab"), (["captureDate>=2021-01-02"], "ab"), (["captureDate>2021-01-03"], ""),
+                (["captureDate~2021:01"], "ab"), (["captureDate==2021-01-02T03:04:05"], "ab"), (["captureDate>="], None), (["position<9"], "d"),
                 (["exposureTime<Infinity"], "ab"), (["exposureBiasValue<-0.3"], "ab")):
             where = [word for condition in conditions for word in ("--where", condition)]
             done = self.run_quavel("--jsonl", *where, ".", status=1 if shown is not None else 2)
@@ -254,11 +255,11 @@ class Forms(CommandTest):
         blank = "    :  :     :  :  "
         for name, date in (("a", blank), ("b", "2018:02:21 12:08:56"), ("c", "2018:13:01 00:00:00"),
                            ("d", "2018: 2:21 12:08:56"), ("e", "2018:02:21 12: 8:56"), ("f", "0999:12:31 23:59:60"),
-                           ("g", "2018:02:21 12:08:56Z")):
+                           ("g", "2018:02:21 12:08:56Z"), ("h", "2021:02:29 00:00:00"), ("i", "2020:02:29 00:00:00")):
             self.put(name + ".tif", photo(date=date.encode()))
         dates = [row["dateTime"] for row in self.rows(".")]
         self.assertEqual((dates[0], dates[1]), (blank, "2018:02:21 12:08:56"))
-        iso = [None, "2018-02-21T12:08:56", dates[2], dates[3], dates[4], "0999-12-31T23:59:60", dates[6]]
+        iso = [None, "2018-02-21T12:08:56", dates[2], dates[3], dates[4], "0999-12-31T23:59:60", *dates[6:8], "2020-02-29T00:00:00"]
         self.assertEqual([r["captureDate"] for r in self.objects("--dates", "iso", ".")], iso)
         self.assertEqual(self.objects("--dates", "exif", "."), self.objects("."))
         self.assertEqual(self.names("--sort", "dateTime", "a.tif", "b.tif"), ["b.tif", "a.tif"])
@@ -270,6 +271,11 @@ class Forms(CommandTest):
         self.assertRegex(self.run_quavel("a.tif").stdout, rb"Captured +2021-01-02 03:04:05\n")
         self.assertEqual([self.objects("--dates", form, "a.tif")[0]["captureDate"] for form in ("exif", "iso")],
                          [blank, "2021-01-02T03:04:05"])
+        self.put("e.nef", b"")
+        self.assertEqual(self.run_quavel("--print0", "--where", "reason==empty", ".", status=1).stdout, b"./e.nef\0")
+        for form in (["--csv"], ["--print0"], ["--table"]):  # the same photos in every form
+            done = self.run_quavel(*form, "--where", "captureDate<2022", "a.tif")
+            self.assertIn(b"a.tif", done.stdout)
 
     def test_csv_says_once_what_it_leaves_out(self):
         self.put("a.nef", b"no")
@@ -317,7 +323,7 @@ class Forms(CommandTest):
 class Names(CommandTest):
     def test_every_name_can_be_recovered(self):
         names = [b"sp ace.tif", b"new\nline.TIF", b"back\\slash\".tif", b"\xc2\x9b\x7f.tif", b'quo"te,.tif', b"-dash.tif",
-                 b"caf\xe9.tif",
+                 b"caf\xe9.tif", b"-q=1.tif", b"lone\rcr.tif",
                  "é\u202e\x1b[2J.tif".encode()]
         for name in names:
             self.put(name, photo())
@@ -349,6 +355,10 @@ class Names(CommandTest):
                 self.assertEqual(json.loads(text), json.loads(self.run_quavel(*form, ".", status=1).stdout))
             piped = self.run_quavel(*form, ".", status=1).stdout.decode(errors="replace")
             self.assertEqual("\u202e" in piped, form != [], form)
+        self.put("é\\.tif", photo())
+        for form in ("--csv", "--print0", "--table", "--jsonl"):
+            self.assertIn(r"é\\.tif", self.on_terminal(form, "é\\.tif"), form)
+        self.assertIn(b"quavel: '': ", self.run_quavel("", status=1).stderr)
         self.put("back\\x1b.nef", b"")
         self.assertIn(rb"back\\x1b.nef: ", self.run_quavel("--csv", ".", status=1).stderr)
         usage = self.run_quavel("--\x1b[31m", status=2)
@@ -360,7 +370,7 @@ class Names(CommandTest):
                 ("e\u0301\u20dd", "e\u0301\u20dd", 1), ("漢字", "漢字", 4), ("हिन्दी", "हिन्दी", 5),
                 ("\u1112\u1161\u11ab", "\u1112\u1161\u11ab", 2),  # 한 as macOS stores it
                 ("❤\ufe0f\u200dن\u200c", "❤\ufe0f\u200dن\u200c", 2), ("\u06dd٠", "\u06dd٠", 2),
-                ("a\u00adb\u2028\ufeff\x85", r"a\u{00ad}b\u{2028}\u{feff}\u{0085}", 34),
+                ("a\u00adb\u2028\ufeff\x85", r"a\u{00ad}b\u{2028}\u{feff}\u{0085}", 34), ("\u2067", r"\u{2067}", 8),
                 ("\U000e0041\u061c", r"\u{e0041}\u{061c}", 17)):
             self.put("a.cr3", cr3(model=model.encode()))
             table = self.run_quavel("--fields", "model,iso", ".").stdout.decode().splitlines()
@@ -414,6 +424,8 @@ class Inputs(CommandTest):
                 (["--hidden"], "._a.tif .Trash-1/b.tif .h.tif .link/cache/d.tif a.tif cache/c.tif in/cache/d.tif"),
                 (["--exclude", "cache", "--exclude", ".?.*"], "a.tif"),
                 (["--exclude", "x/*/d.tif"], ".h.tif a.tif cache/c.tif"),
+                (["--exclude", "cache/"], ".h.tif a.tif"),
+                (["--exclude", "in/*"], ".h.tif a.tif cache/c.tif"),
                 (["--exclude=[!.]*"], ".h.tif"), (["--exclude", "x", "--exclude", "A*"], ".h.tif a.tif "
                                                   "cache/c.tif in/cache/d.tif")):
             names = self.names(*options, "x")
@@ -524,7 +536,10 @@ class Inputs(CommandTest):
                 ("--why --absent show x", "--absent"), ("--fields '' x", "''"), ("--fields iso, x", "''"),
                 ("--where iso x", "'iso' is not a comparison"), ("--where '' x", "''"), ("--where '>3' x", "''"),
                 ("--where 'hue>3' x", "'hue'"), ("--where 'iso>3k' x", "'3k' is not a whole number"),
-                ("--where iso>= x", "''"), ("--where iso=>3 x", "'>3'"), ("--where iso~3 x", "'~'"),
+                ("--where iso>= x", "'iso>=' lacks"), ("--where iso=>3 x", "'iso=>3'"),
+                ("--where model=~R6 x", "'model=~R6'"), ("--where 'model<>R6' x", "'model<>R6'"),
+                ("--exclude= x y", "'--exclude='"), ("--where= x", "'--where='"), ("--files-from= x", "'--files-from='"),
+                ("-j= x", "'-j='"), ("--where iso~3 x", "'~'"),
                 ("--where fNumber=nan x", "'nan' is not a number"), ("--where isRaw=yes x", "'yes'"),
                 ("--where iso!3 x", "'iso!3'"), ("--where fNumber<1,5 x", "'1,5'")):
             done = self.run_quavel(*shlex.split(line), status=2, preexec_fn=lambda: os.close(0))
@@ -658,6 +673,7 @@ class Endings(CommandTest):
                     fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
                 process.stdout.read(2000000)
                 time.sleep(0.15 if process.poll() is None else 0)
+            process.wait(60)
             shown = os.read(main, 65536).decode()
             os.close(main)
         self.assertRegex(shown, r"^\r\x1b\[K\d+ files, \d+ files/s\r")

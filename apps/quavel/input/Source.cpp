@@ -29,8 +29,10 @@ bool Source::nextOfPaths(Input& input) {
       walk_.reset();
       if (isWalkEmpty_) {
         std::string const extensions = whyUnknown({});
-        report_(inputs_.paths[nextPath_ - 1], "no photos found in it: no name ends in" +
-                                                  extensions.substr(extensions.rfind(':') + 1));
+        report_(inputs_.paths[nextPath_ - 1],
+                "no photos found in it; hidden and excluded names are "
+                "skipped, and others must end in" +
+                    extensions.substr(extensions.rfind(':') + 1));
       }
       continue;
     }

@@ -43,7 +43,8 @@ TextOf csvRows(Form const& form, bool isForTerminal) {
     std::string row;
     for (auto const* field : fields) {
       std::string const text = exact(field->value(outcome));
-      row += quoted(isForTerminal ? escaped(text) : text);
+      bool const isPath = field->name == "path";
+      row += quoted(!isForTerminal ? text : isPath ? escapedPath(outcome.path) : escaped(text));
       row += ',';
     }
     row.pop_back();

@@ -59,8 +59,8 @@ class SortingWriter : public Writer {
 
 void SortingWriter::end() {
   auto const isBefore = [this](Outcome const& a, Outcome const& b) {
-    Value const left = form_.sort->value(a);
-    Value const right = form_.sort->value(b);
+    Value const left = compared(*form_.sort, a);
+    Value const right = compared(*form_.sort, b);
     if (isAbsent(left) || isAbsent(right)) {
       return !isAbsent(left) && isAbsent(right);  // absent values come last
     }
@@ -75,10 +75,11 @@ void SortingWriter::end() {
   next_->end();
 }
 
-TextOf paths(bool isForTerminal) {
-  return [isForTerminal](Outcome const& outcome) {
+/// A file without a record is shown only where a condition chose it.
+TextOf paths(Form const& form, bool isForTerminal) {
+  return [isChosen = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
-    return outcome.record ? path + '\0' : std::string();
+    return outcome.record || isChosen ? path + '\0' : std::string();
   };
 }
 
@@ -94,7 +95,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
       output.add(csvHeader(form));
       return std::make_unique<TextWriter>(output, csvRows(form, output.isTerminal()), "", "");
     case FormKind::Paths:
-      return std::make_unique<TextWriter>(output, paths(output.isTerminal()), "", "");
+      return std::make_unique<TextWriter>(output, paths(form, output.isTerminal()), "", "");
     case FormKind::Card:
       return std::make_unique<TextWriter>(
           output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");

@@ -6,6 +6,9 @@
 #include <stdexcept>
 #include <system_error>
 #include <type_traits>
+#include <utility>
+
+#include "photo/Words.h"
 
 namespace app {
 
@@ -36,6 +39,18 @@ struct Parsed {
   }
 };
 
+/// Dates compare alike in every notation: as files have them, as people see them and in ISO 8601.
+Value comparable(Field const& field, Value value) {
+  auto* const text = std::get_if<std::string>(&value);
+  auto const* const words = std::get_if<std::string (*)(std::string const&)>(&field.words);
+  if (text != nullptr && words != nullptr && *words == words::date) {
+    for (char& c : *text) {
+      c = c == ':' ? '-' : c == 'T' ? ' ' : c;
+    }
+  }
+  return value;
+}
+
 [[noreturn]] void refuse(std::string_view text, std::string const& why) {
   throw std::invalid_argument("'" + std::string(text) + "' " + why);
 }
@@ -44,6 +59,7 @@ struct Parsed {
 
 Condition::Condition(Field const& field, std::string_view comparison)
     : field_(field), relation_(Relation::Equal) {
+  std::string_view const whole = comparison;
   std::size_t length = comparison.substr(0, 1) == "=" ? 1 : 0;
   for (std::size_t i = std::size(kRelations); i-- > 0;) {
     if (comparison.substr(0, kRelations[i].size()) == kRelations[i]) {
@@ -56,8 +72,16 @@ Condition::Condition(Field const& field, std::string_view comparison)
            "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
   }
   comparison.remove_prefix(length);
+  if (!comparison.empty() &&
+      std::string_view(kSigns).find(comparison.front()) != std::string::npos) {
+    refuse(std::string(field.name).append(whole),
+           "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
+  }
   comparison.remove_prefix(std::min(comparison.find_first_not_of(' '), comparison.size()));
-  value_ = std::visit(Parsed{comparison}, field.words);
+  if (comparison.empty()) {
+    refuse(std::string(field.name).append(whole), "lacks the value to compare with");
+  }
+  value_ = comparable(field, std::visit(Parsed{comparison}, field.words));
   if (std::holds_alternative<std::monostate>(value_)) {
     refuse(comparison, std::string("is not ") + kTypes[field.words.index()]);
   }
@@ -67,10 +91,11 @@ Condition::Condition(Field const& field, std::string_view comparison)
 }
 
 bool Condition::holds(Outcome const& outcome) const {
-  Value const value = field_.value(outcome);
-  if (isAbsent(value)) {
+  Value const exactValue = compared(field_, outcome);
+  if (isAbsent(exactValue)) {
     return false;
   }
+  Value const value = comparable(field_, exactValue);
   switch (relation_) {
     case Relation::AtLeast:
       return value >= value_;

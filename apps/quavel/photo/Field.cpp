@@ -40,6 +40,16 @@ Value captureDate(Outcome const& outcome) {
   return outcome.record ? present(outcome.record->captureDate()) : Value();
 }
 
+/// The same without blank dates, which a record keeps as the file has them.
+Value usableCaptureDate(QVMetadata const& record) {
+  for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
+    if (!isAbsent(*date)) {
+      return present(*date);
+    }
+  }
+  return {};
+}
+
 Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 
 template <auto member>
@@ -167,6 +177,11 @@ bool isAbsent(Value const& value) {
   auto const* const text = std::get_if<std::string>(&value);
   return text != nullptr ? text->find_first_not_of(" :") == std::string::npos
                          : std::holds_alternative<std::monostate>(value);
+}
+
+Value compared(Field const& field, Outcome const& outcome) {
+  bool const isCaptureDate = field.value == captureDate && outcome.record;
+  return isCaptureDate ? usableCaptureDate(*outcome.record) : field.value(outcome);
 }
 
 void appendExact(std::string& text, Value const& value) { std::visit(AppendExact{text}, value); }

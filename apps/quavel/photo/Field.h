@@ -46,6 +46,9 @@ std::string inWords(Field const& field, Outcome const& outcome);
 /// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
+/// The value that sorts and selects files, the same in every form.
+Value compared(Field const& field, Outcome const& outcome);
+
 /// Appends the value for programs: text as it is, digits that read back to the same number,
 /// "Infinity", "true". Nothing when absent.
 void appendExact(std::string& text, Value const& value);

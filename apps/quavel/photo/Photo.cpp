@@ -65,9 +65,14 @@ std::string readAll(Problem& problem) {
 bool isDate(std::string const& text) {
   std::tm time = {};
   char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
+  std::tm day = {};
+  day.tm_year = time.tm_year;
+  day.tm_mon = time.tm_mon;
+  day.tm_mday = time.tm_mday;
+  ::timegm(&day);  // makes 1 March of 30 February
   // strptime accepts any number of blanks before a number.
   return text.size() == kDateSize && end == text.c_str() + kDateSize && text.find(' ') == 10 &&
-         text.rfind(' ') == 10;
+         text.rfind(' ') == 10 && day.tm_mday == time.tm_mday && time.tm_sec <= 60;
 }
 
 /// Fills the outcome with what `read` gives, unless there is a problem already.
