@@ -148,8 +148,9 @@ class Forms(CommandTest):
                     self.assertEqual(row[key], "" if value is None else str(value))
 
     def test_infinity_is_told_from_absence(self):
-        self.put("a.cr3", cr3(exposure=(1, 0)))
+        self.put("a.cr3", cr3(exposure=(1, 0), exif=[(0x9204, SRATIONAL, (-1, 0))]))
         self.put("b.cr3", cr3(exposure=(0, 0)))
+        self.assertEqual(self.objects("a.cr3")[0]["exposureBiasValue"], "-Infinity")
         times = [r["exposureTime"] for r in self.objects(".")]
         self.assertEqual(times, ["Infinity", None])
         self.assertEqual(float(self.rows("a.cr3")[0]["exposureTime"]), math.inf)
@@ -172,6 +173,9 @@ class Forms(CommandTest):
         self.assertNotIn(b"Lens", card.stdout)
         self.assertEqual(card.stderr, b"")
         self.assertRegex(self.run_quavel("--absent", "show", "a.cr3").stdout, rb"Lens +-\n")
+        self.put("half.tif", tiff([(0x100, SHORT, 6000), (0x132, ASCII, b"2021:01:02 at noon!")]))
+        for words in (b" 2021:01:02 at noon! ", b" 6000x?"):
+            self.assertIn(words, self.run_quavel("--table", "half.tif").stdout)
         self.put("b.tif", photo())
         chosen = [["--fields", "iso,model", "b.tif"], ["--card", "--fields", "iso,model", "b.tif"]]
         for arguments in chosen:
@@ -323,7 +327,7 @@ class Forms(CommandTest):
 class Names(CommandTest):
     def test_every_name_can_be_recovered(self):
         names = [b"sp ace.tif", b"new\nline.TIF", b"back\\slash\".tif", b"\xc2\x9b\x7f.tif", b'quo"te,.tif', b"-dash.tif",
-                 b"caf\xe9.tif", b"-q=1.tif", b"lone\rcr.tif",
+                 b"caf\xe9.tif", b"-q=1.tif", b"lone\rcr.tif", b"only\\back.tif",
                  "é\u202e\x1b[2J.tif".encode()]
         for name in names:
             self.put(name, photo())
@@ -549,6 +553,19 @@ class Inputs(CommandTest):
 
 
 class Endings(CommandTest):
+    def test_a_full_pipe_that_does_not_block_is_waited_for(self):
+        first = self.put("0.tif", photo())
+        for i in range(1, 300):
+            os.link(first, self.folder / f"{i}.tif")
+        end, start = os.pipe()
+        os.set_blocking(start, False)
+        process = subprocess.Popen([COMMAND, "-q", "--jsonl", "."], stdout=start, cwd=self.folder)
+        os.close(start)
+        time.sleep(0.1)
+        with open(end, "rb") as pipe:
+            self.assertEqual(len(pipe.read().splitlines()), 300)
+        self.assertEqual(process.wait(60), 0)
+
     def many(self):
         self.put("a.tif", photo())
         return b"a.tif\0" * 20000
