@@ -5,7 +5,7 @@ if(NOT CPACK_GENERATOR STREQUAL "DEB")
   return()
 endif()
 
-# Without these, cpack makes packages that depend on nothing and says nothing of it.
+# Without these, cpack silently makes packages that have no dependencies.
 foreach(tool_and_package IN ITEMS "dpkg-shlibdeps;dpkg-dev" "file;file")
   list(GET tool_and_package 0 tool)
   list(GET tool_and_package 1 package)

@@ -1,4 +1,4 @@
-# What every target of the project is built with. Nobody who uses the library gets any of it.
+# What every target of the project is built with. None of it reaches users of the library.
 add_library(quavel_settings INTERFACE)
 if(MSVC)
   target_compile_options(quavel_settings INTERFACE
@@ -31,13 +31,13 @@ function(quavel_link_option_if_accepted target option)
 endfunction()
 
 if(QUAVEL_REPRODUCIBLE)
-  # Of two that fit, the later one counts.
+  # Where both prefixes match, the later option wins.
   target_compile_options(quavel_settings INTERFACE
     -ffile-prefix-map=${PROJECT_SOURCE_DIR}/= -ffile-prefix-map=${PROJECT_BINARY_DIR}=.)
   set(CMAKE_BUILD_RPATH_USE_ORIGIN ON)  # a path is cut out on installing, but leaves its length
 endif()
 
-# Files above 2 GB, and such sizes, are out of reach of 32-bit systems unless they are asked for.
+# Without this, 32-bit systems cannot open files above 2 GB.
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)
   target_compile_definitions(quavel_settings INTERFACE _FILE_OFFSET_BITS=64)
 endif()

@@ -1,7 +1,7 @@
 // Any bytes as a file of any format: what a record may hold, and that reading leaves no trace.
 
 #include "Fuzzing.h"
-#include "support/JournalLaw.h"
+#include "support/JournalInvariants.h"
 
 namespace quavel::fuzz {
 namespace {
@@ -55,7 +55,8 @@ int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size) {
   QVJournal journal;
   auto record = journal.read(input.bytes.data(), input.bytes.size(), input.extension);
   fuzz::require(fuzz::isSame(record, reader.metadata), "a journal changes no record");
-  fuzz::require(test::brokenLaw(journal, record.get()).empty(), "the journal keeps its law");
+  fuzz::require(test::brokenInvariant(journal, record.get()).empty(),
+                "the journal's invariants hold");
 
   record = reader.createMetadata(input.extension);
   fuzz::require((record == nullptr) == (input.extension == "txt"),

@@ -18,7 +18,7 @@ std::size_t peak = 0;           // bytes
 
 }  // namespace
 
-// Inlined, they would look to the compiler like malloc and free that do not belong together.
+// If they were inlined, the compiler would warn of pairs of malloc and free that do not match.
 [[gnu::noinline]] void* operator new(std::size_t size) {
   if (allocationsLeft == 0) {
     throw std::bad_alloc();

@@ -130,7 +130,7 @@ TEST(Cr3, FindsTheMetadataWhereverItIs) {
          filler + cr3File(filler + uuidBox(filler + cmt2Box() + empty + cmt1Box())),
          cr3File(foreign + uuidBox(cmt12) + filler), cr3File(uuidBox(filler) + uuidBox(cmt12)),
          cr3File(uuidBox(cmt12 + Bytes(8, '\0'))),  // after both boxes nothing is looked at
-         cr3File(uuidBox(noCmt1 + cmt12))}},  // of two of a kind before the other, the last counts
+         cr3File(uuidBox(noCmt1 + cmt12))}},        // of two before the other kind, the last counts
        {"orientation=1 isRaw", {cr3File(uuidBox(cmt1Box() + noCmt1))}},
        {kFromCmt1 + " model=Camera R", {cr3File(uuidBox(cmt1Box()))}},
        {"isRaw hasShootingInfo " + kFromCmt2, {cr3File(uuidBox(cmt2Box()))}},

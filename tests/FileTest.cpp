@@ -1,4 +1,4 @@
-// A program of its own: it puts itself between the library and the system's calls on files.
+// A program of its own: it replaces the system's calls on files.
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
@@ -200,7 +200,7 @@ TEST_F(FileTest, ThatIsAPipeIsReadFrontToBack) {
   EXPECT_EQ(readPipe(fixture.bytes(kII), fixture.extension), fixture.expected);
   EXPECT_EQ(readPipe("II*", "tif"),
             "the TIFF header at 0: 2 bytes wanted at 2, but the data ends before that");
-  // It cannot go on elsewhere: what comes next is a frame here that is not the file's.
+  // A pipe cannot seek. Were the seek ignored, the next bytes would give a frame of 13 x 13.
   Bytes const payload = Bytes(16378, 'x') + sof0(13, 13) + Bytes(9000, 'x');
   EXPECT_EQ(readPipe("\xff\xd8" + segment(0xffe2, payload) + sof0(), "jpg"), "");
 }

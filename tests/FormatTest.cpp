@@ -11,7 +11,7 @@ std::string const kDates = kOriginal + " " + kDigitized + kFileDate;
 
 Field unreadable(std::uint16_t tag) { return claim(tag, 99, 1, 0); }
 
-/// Entries that nobody wants, before the field of that index.
+/// Unwanted entries, inserted before the field of that index.
 Edit insert(std::size_t index, std::size_t count, Field const& field = shorts(0xfffe, {0})) {
   return [=](Directory& directory) {
     directory.fields.insert(directory.fields.begin() + static_cast<long>(index), count, field);

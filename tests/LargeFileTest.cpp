@@ -17,14 +17,15 @@ bool isCutShort(QVJournal const& journal) {
   return journal.refusal() != nullptr && journal.refusal()->reason == QVReason::CutShort;
 }
 
-/// Where a refused seek would leave the stream, each file holds what must not be taken.
+/// At the position where a refused seek leaves the stream, each file holds bytes that must not
+/// count.
 TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
   struct Row {
     char const* extension;
     Bytes opening;
     Bytes beyond;  // at `kFar`
     char const* expected;
-    bool isInReach = false;  // of a `long` of 32 bits: counted from a base that holds more
+    bool isInReach = false;  // of a 32-bit `long`: it is counted from a 64-bit base
   };
   Bytes const wrong = loose({{longs(kWidth, {13}), ascii(kDateTimeOriginal, "bad")}});
   Bytes const right = loose({{longs(kWidth, {42}), ascii(kDateTimeOriginal, "now")}});
@@ -59,7 +60,7 @@ TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
   }
 }
 
-/// SOI, then 4 GB of segments as long as they get.
+/// SOI, then 4 GB of segments of the greatest length.
 struct Segments : QVStream {
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
     Bytes const period("\xff\xd8\xff\xe2\xff\xfe\0\0", 8);

@@ -40,7 +40,7 @@ void check(std::vector<Row> const& rows) {
     QVJournal journal;
     auto const record = journal.read(dataOf(bytes), bytes.size(), row.extension);
     EXPECT_NE(all(journal).find("\n" + row.note), std::string::npos) << row.note << all(journal);
-    EXPECT_EQ(brokenLaw(journal, record.get()), "") << row.note;
+    EXPECT_EQ(brokenInvariant(journal, record.get()), "") << row.note;
   }
 }
 

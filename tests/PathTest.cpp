@@ -10,7 +10,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// The path as this program's own library takes it at any length.
+/// The path in the form that the C++ library accepts at any length.
 fs::path marked(fs::path const& path) {
 #ifdef _WIN32
   return LR"(\\?\)" + path.native();

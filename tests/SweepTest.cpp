@@ -31,8 +31,8 @@ TEST(Sweep, OfPrefixesGivesTheWholeRecordOnceAllNeededBytesAreThere) {
   }
 }
 
-/// Changes each of the first bytes in several ways. The journal keeps its law, and of no field that
-/// the file gives it says that the format never does.
+/// Changes each of the first bytes in several ways. The journal's invariants hold, and no field
+/// that the file gives is noted as one that the format never gives.
 void sweepChanges(Bytes const& bytes, std::string const& extension) {
   SCOPED_TRACE(extension);
   QVJournal journal;
@@ -42,11 +42,11 @@ void sweepChanges(Bytes const& bytes, std::string const& extension) {
   auto const absent = whole ? absentFields(*whole) : absentFields(QVTiffImage());
   for (std::size_t i = 0; i < std::min<std::size_t>(bytes.size(), 4096); ++i) {
     char const flipped = static_cast<char>(bytes[i] ^ 1 << i % 8);
-    // The last makes another tag of an entry's.
+    // The last turns the tag of an entry into another one.
     for (char const value : {'\0', '\xff', flipped, static_cast<char>(bytes[i] ^ 4)}) {
       changed[i] = value;
       auto const record = read();
-      EXPECT_EQ(brokenLaw(journal, record.get()), "") << i;
+      EXPECT_EQ(brokenInvariant(journal, record.get()), "") << i;
       EXPECT_EQ(describe(QVReader(dataOf(changed), sizeOf(changed), extension).metadata),
                 describe(record));
       for (QVNote const& note : journal.notes()) {
@@ -58,7 +58,7 @@ void sweepChanges(Bytes const& bytes, std::string const& extension) {
   }
 }
 
-TEST(Sweep, OfChangedBytesKeepsTheLawOfTheJournal) {
+TEST(Sweep, OfChangedBytesKeepsTheJournalsInvariants) {
   for (Fixture const& fixture : fixtures()) {
     sweepChanges(fixture.bytes(kMM), fixture.extension);
   }

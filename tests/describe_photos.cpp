@@ -20,7 +20,7 @@ std::shared_ptr<QVMetadata> read(Bytes bytes, std::string const& extension) {
   return QVReader(test::dataOf(bytes), test::sizeOf(bytes), extension).metadata;
 }
 
-/// Without what a library of mathematics gives: its last digit is the platform's own.
+/// Without the results of libm, whose last digits differ between platforms.
 std::string exact(std::shared_ptr<QVMetadata> const& record) {
   if (record) {
     record->apexFNumber = NAN;

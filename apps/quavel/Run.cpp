@@ -19,8 +19,8 @@ namespace {
 
 constexpr std::size_t kMaxBatch = 64;
 // A batch should be short enough for the output to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;
-constexpr std::size_t kWideBatch = std::size_t{1} << 20;
+constexpr double kLongBatch = 0.002;                      // seconds
+constexpr std::size_t kWideBatch = std::size_t{1} << 20;  // bytes of output
 
 /// One run over the files of a source.
 class Runner {

@@ -31,7 +31,7 @@ enum class QVReason : std::uint8_t {
   None,              ///< A step needs none.
   UnknownExtension,  ///< The extension names no format.
   CannotOpen,        ///< The system cannot open the file.
-  ReadError,         ///< The system or the stream cannot read on.
+  ReadError,         ///< The system or the stream fails to read.
   Empty,             ///< There is not a single byte at the path or in the buffer.
   CutShort,          ///< The data ends before a part that is needed.
   OtherKind,         ///< The data does not begin like a file or structure of this kind.
@@ -46,7 +46,7 @@ enum class QVReason : std::uint8_t {
   NoValue,           ///< A field is absent: what the file gives is not a value, such as 0/0.
   OtherContent,      ///< The content looks like another format than the extension names.
   NotBaseline,       ///< A JPEG frame that is not baseline, so its size is not read.
-  PictureData,       ///< A JPEG was read on through its picture data.
+  PictureData,       ///< A JPEG was walked through its picture data.
   OtherOpening,      ///< An embedded image does not begin as the format demands.
   PassedOver,        ///< A directory was examined and is not the one looked for.
 };
@@ -60,7 +60,7 @@ struct QVNote {
   /// Of an absence: the name of the record's member, such as "fNumber"; else empty.
   std::string field;
   /// What the file holds and where, then the rule, in English: at most 500 bytes, without a full
-  /// stop, printable ASCII except for a message of the system's own.
+  /// stop, printable ASCII except for the system's own messages.
   std::string text;
   int systemError = 0;  ///< The `errno` of CannotOpen and ReadError; else 0.
 };

@@ -690,7 +690,8 @@ class Endings(CommandTest):
                     fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
                 process.stdout.read(2000000)
                 time.sleep(0.15 if process.poll() is None else 0)
-            process.wait(60)
+            process.stdout.read()
+            process.wait(60)  # the summary comes last
             shown = os.read(main, 65536).decode()
             os.close(main)
         self.assertRegex(shown, r"^\r\x1b\[K\d+ files, \d+ files/s\r")

@@ -90,7 +90,7 @@ inline Field pointer(std::uint16_t tag, std::vector<Directory> subdirectories) {
   auto const count = static_cast<std::uint32_t>(subdirectories.size());
   return {tag, kLong, count, 4, {}, std::move(subdirectories)};
 }
-/// An entry that says what it likes of its values.
+/// An entry that claims any type and count, whatever its field holds.
 inline Field claim(std::uint16_t tag, std::uint16_t type, std::uint32_t count,
                    std::uint32_t valueField) {
   return {tag, type, count, 4, {}, {}, valueField};

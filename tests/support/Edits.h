@@ -3,24 +3,24 @@
 
 #include <gtest/gtest.h>
 
-#include "support/JournalLaw.h"
+#include "support/JournalInvariants.h"
 #include "support/Streams.h"
 
 namespace quavel::test {
 
-/// What a file gives its reader, as `readStream` describes it. Without a reader of one's own, and
-/// with a journal, the record is the same, and the journal keeps its law.
+/// What a file gives its reader, as `readStream` describes it. A `QVReader` and a journal must give
+/// the same record, and the journal's invariants must hold.
 inline std::string resultOf(Bytes bytes, std::string const& extension) {
   std::string const result = readStream(streamOf(bytes), extension);
   QVJournal journal;
   auto const record = journal.read(dataOf(bytes), bytes.size(), extension);
   EXPECT_EQ(describe(record), result[0] == '!' ? "none" : result);
   EXPECT_EQ(readBuffer(bytes, extension), describe(record));
-  EXPECT_EQ(brokenLaw(journal, record.get()), "");
+  EXPECT_EQ(brokenInvariant(journal, record.get()), "");
   return result;
 }
 
-/// A result, and edits of a well-made file of which each leads to it.
+/// A result, and edits of a well-made file, each of which leads to it.
 struct EditRow {
   std::string result;
   std::vector<Edit> edits;

@@ -7,7 +7,7 @@
 
 #include "quavel/quavel.h"
 
-// Of the library alone: the fuzz targets use it too.
+// Includes nothing but the library: the fuzz targets use it too.
 namespace quavel::test {
 
 /// Calls `take` with the name and the value of each field of the record, in their order.

@@ -12,7 +12,7 @@ struct OwnBytes {
   Bytes bytes;
 };
 
-/// A stream over bytes of its own that counts what it is asked for, and does otherwise if told to.
+/// A stream over bytes of its own that counts the calls and can be told to misbehave.
 struct TestStream : OwnBytes, QVMStream {
   explicit TestStream(Bytes const& content, ByteOrder order = kMM)
       : OwnBytes{content}, QVMStream(dataOf(bytes), sizeOf(bytes)) {
@@ -34,7 +34,7 @@ struct TestStream : OwnBytes, QVMStream {
   }
 
   std::function<std::int64_t(std::uint8_t*, std::size_t)> onRead;  ///< Instead of `deliver`.
-  std::function<bool(long)> onSeek;                                ///< Whether it is done.
+  std::function<bool(long)> onSeek;                                ///< False: the seek is refused.
   std::size_t mostAtOnce = SIZE_MAX;
   int reads = 0;
   int seeks = 0;

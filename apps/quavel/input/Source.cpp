@@ -60,7 +60,7 @@ bool Source::dropCarriageReturn(std::string& path) {
   }
   path.pop_back();
   if (!hasCrlf_) {
-    report_(inputs_.list, "its lines end with CRLF; each CR is taken for a part of the line end");
+    report_(inputs_.list, "its lines end with CRLF; each CR counts as part of the line end");
     hasCrlf_ = true;
   }
   return path.empty();
@@ -79,7 +79,7 @@ bool Source::nextOfList(Input& input) {
   list_.reset();
   input = {inputs_.list,
            false,
-           {reason::kUnreadableList, "the list cannot be read on: " + reason::systemText(error)}};
+           {reason::kUnreadableList, "reading the list fails: " + reason::systemText(error)}};
   return error != 0;
 }
 

@@ -61,10 +61,10 @@ class Table : public Writer {
   std::vector<std::vector<std::string>> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   std::size_t files_ = 0;
-  std::atomic<bool> isCardLikely_{true};  // until a second file comes, records are kept
+  std::atomic<bool> isCardLikely_{true};  // until a file is added, records are kept for it
   Outcome first_;
   bool isTerminal_;
-  std::size_t pathColumn_ = 0;  // the number of columns: there is none
+  std::size_t pathColumn_ = 0;  // columns_.size() when there is none
   std::size_t line_ = 0;
   std::string folder_;        // of all paths, when it stands above the table
   bool hasDaysOnly_ = false;  // dates are shown without the time

@@ -9,8 +9,8 @@ namespace app {
 
 /// Whether it is all visible ASCII. Nearly all texts are, and need no look at each character.
 bool isPlain(std::string_view text);
-/// A text out of a file as UTF-8. Files that are not UTF-8 are mostly Latin-1: when any byte is
-/// wrong, all from 0x80 on are taken as the characters of that number.
+/// A text from a file as UTF-8. Texts that are not UTF-8 are mostly Latin-1: when any byte is not
+/// valid UTF-8, the whole text is read as Latin-1.
 std::string textAsUtf8(std::string text);
 /// A file name as UTF-8: each byte that is not UTF-8, and each NUL, is replaced by U+FFFD.
 std::string pathAsUtf8(std::string const& path);

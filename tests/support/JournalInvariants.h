@@ -1,5 +1,5 @@
-#ifndef QUAVEL_TESTS_JOURNALLAW_H
-#define QUAVEL_TESTS_JOURNALLAW_H
+#ifndef QUAVEL_TESTS_JOURNALINVARIANTS_H
+#define QUAVEL_TESTS_JOURNALINVARIANTS_H
 
 #include <algorithm>
 #include <set>
@@ -7,7 +7,7 @@
 
 #include "support/Fields.h"
 
-// Of the library alone: the fuzz targets hold it too.
+// Includes nothing but the library: the fuzz targets check them too.
 namespace quavel::test {
 
 inline std::set<std::string> absentFields(QVMetadata const& record) {
@@ -25,10 +25,11 @@ inline bool isPrintable(std::string const& text) {
          std::all_of(text.begin(), text.end(), [](char c) { return c >= ' ' && c <= '~'; });
 }
 
-/// What a journal's notes break of their law after a read from memory that gave the record, or
-/// null; empty: nothing. A failure leaves one refusal or limit and a success none; after a success,
-/// each absent field has one absence, and no other field has; texts are short and printable.
-inline std::string brokenLaw(QVJournal const& journal, QVMetadata const* record) {
+/// The invariant that a journal's notes break after a read from memory that gave the record, or
+/// null; empty when they break none. A failure leaves one refusal or limit and a success none;
+/// after a success, each absent field has one absence, and no other field has; texts are short and
+/// printable.
+inline std::string brokenInvariant(QVJournal const& journal, QVMetadata const* record) {
   std::multiset<std::string> absences;
   int refusals = 0;
   for (QVNote const& note : journal.notes()) {
@@ -51,4 +52,4 @@ inline std::string brokenLaw(QVJournal const& journal, QVMetadata const* record)
 
 }  // namespace quavel::test
 
-#endif  // QUAVEL_TESTS_JOURNALLAW_H
+#endif  // QUAVEL_TESTS_JOURNALINVARIANTS_H
