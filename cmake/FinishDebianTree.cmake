@@ -43,3 +43,6 @@ foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   file(GLOB pages ${tree}/share/man/*/*)
   execute_process(COMMAND gzip -9nf ${docs}/changelog.Debian ${pages} COMMAND_ERROR_IS_FATAL ANY)
 endforeach()
+
+# Everybody may read what is installed, whatever umask this runs with.
+execute_process(COMMAND chmod -R u=rwX,go=rX ${CPACK_TEMPORARY_DIRECTORY} COMMAND_ERROR_IS_FATAL ANY)

@@ -34,6 +34,8 @@ from camera files (TIFF, DNG, NEF, CR2, RAF, ARW, JPEG, NRW, 3FR, CR3).")
 set(CPACK_DEBIAN_RUNTIME_PACKAGE_NAME ${runtime_package})
 set(CPACK_DEBIAN_RUNTIME_PACKAGE_SECTION libs)
 file(WRITE ${CMAKE_CURRENT_BINARY_DIR}/debian/triggers "activate-noawait ldconfig\n")
+file(CHMOD ${CMAKE_CURRENT_BINARY_DIR}/debian/triggers
+  PERMISSIONS OWNER_READ OWNER_WRITE GROUP_READ WORLD_READ)
 set(CPACK_DEBIAN_RUNTIME_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_BINARY_DIR}/debian/triggers)
 set(CPACK_COMPONENT_RUNTIME_DESCRIPTION
     "shooting metadata from camera files - shared library\n${common_description}")

@@ -1,11 +1,8 @@
 #include "formats/BoxWalk.h"
 
-#include <algorithm>
-
 #include "formats/BoxTypes.h"
 #include "quavel/QVCR3BoxHeader.h"
 #include "quavel/QVStream.h"
-#include "stream/Bytes.h"
 
 namespace quavel::detail {
 
@@ -31,7 +28,7 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
                   : header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)"
                                         : "");
   }
-  stream->setOffset(std::min(endOfBox(start, header), kOutOfReach));
+  leaveBox(*stream, endOfBox(start, header));
   return true;
 }
 

@@ -1,12 +1,14 @@
 #ifndef QUAVEL_SRC_FORMATS_BOXWALK_H
 #define QUAVEL_SRC_FORMATS_BOXWALK_H
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <string>
 
 #include "journal/Journal.h"
 #include "journal/Reading.h"
+#include "stream/Bytes.h"
 
 namespace quavel {
 
@@ -35,6 +37,10 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
 
 /// Where a box ends, or the last of all offsets when it ends beyond.
 long endOfBox(long start, QVCR3BoxHeader const& header);
+
+/// Moves to the end of a box. Where that is out of reach, the stream stays before the end of every
+/// box around it, so that the walk over them goes on and is refused there.
+inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail
 }  // namespace quavel

@@ -38,7 +38,7 @@ bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
   }
 
   stream->baseOffset = outerBase;
-  stream->setOffset(endOfBox(start, header));
+  leaveBox(*stream, endOfBox(start, header));
   stream->byteOrder = outerOrder;
   return true;
 }

@@ -25,7 +25,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   long const end = endOfBox(start, *boxHeader);
 
   bool const isRead = readChildren(stream, start, end);
-  stream->setOffset(end);
+  leaveBox(*stream, end);
   return isRead;
 }
 

@@ -48,7 +48,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   notePassed(journal, uuid.position, "{}: {}", uuid,
              isMetadata ? "the metadata" : "another identifier");
   bool const isRead = !isMetadata || readChildren(stream, end);
-  stream->setOffset(end);
+  leaveBox(*stream, end);
   return isRead;
 }
 

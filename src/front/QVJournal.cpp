@@ -39,7 +39,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
   detail::Journal journal = begin();
   journal.knownSize = static_cast<std::int64_t>(length);
   auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
-  if (sizeof(unsigned long) < sizeof(length)) {
+  if constexpr (sizeof(unsigned long) < sizeof(length)) {
     memory->length = length;
   }
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));

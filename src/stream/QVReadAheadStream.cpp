@@ -21,7 +21,8 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   source.setOffset(0);
   bool const isThere = source.getOffset() == 0;
   source.baseOffset = base;
-  return isThere;
+  // A source that ignores the base is at its start instead.
+  return isThere && source.getOffset() == static_cast<long>(target);
 }
 
 }  // namespace

@@ -25,6 +25,13 @@ bool refuseCount(Journal* journal, EntryTable const& table) {
                    PlacedDirectory{&table});
 }
 
+bool refuseNext(Journal* journal, EntryTable const& table, std::uint16_t entryCount) {
+  return refuseCut(
+      journal, table.position() + kEntryCountSize + std::int64_t{kEntrySize} * entryCount,
+      sizeof(std::uint32_t), "the offset of the next directory, after the {} entries of {}",
+      entryCount, PlacedDirectory{&table});
+}
+
 }  // namespace
 
 bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
@@ -62,7 +69,10 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   }
 
   // The entries may have left the stream anywhere.
-  return seek(stream, walk.end()) && reading.spend(Work::Entries, walk.number() - 1);
+  if (!seek(stream, walk.end())) {
+    return refuseNext(journal_, *this, entryCount_);
+  }
+  return reading.spend(Work::Entries, walk.number() - 1);
 }
 
 bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
@@ -93,10 +103,7 @@ bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList ta
     return false;
   }
   if (!stream.readLong(nextIFDOffset)) {
-    return refuseCut(journal_, position_ + kEntryCountSize + std::int64_t{kEntrySize} * entryCount_,
-                     sizeof(*nextIFDOffset),
-                     "the offset of the next directory, after the {} entries of {}", entryCount_,
-                     PlacedDirectory{this});
+    return refuseNext(journal_, *this, entryCount_);
   }
   notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
              static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
