@@ -62,6 +62,7 @@ def main():
     parser.add_argument("--workers", type=int, default=os.cpu_count(), help="[%(default)s]")
     parser.add_argument("--batch", type=int, default=500, help="photos in a task [%(default)s]")
     options = parser.parse_args()
+    sys.stdout.reconfigure(errors="surrogateescape")  # names that are not UTF-8 keep their bytes
 
     cluster = options.scheduler or LocalCluster(
         n_workers=options.workers, threads_per_worker=1, host="127.0.0.1", dashboard_address=None

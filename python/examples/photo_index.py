@@ -30,7 +30,7 @@ def main() -> None:
             sizes[size] += 1
             months[f"{record.captured:%Y-%m}" if record.captured else "no date"] += 1
 
-    print(f"{sizes.total()} photos, {problems.total()} without a record")
+    print(f"{sum(sizes.values())} photos, {sum(problems.values())} without a record")
     print_counts("Size in pixels", sizes)
     print_counts("Month", months)
     print_counts("No record", problems)

@@ -9,7 +9,7 @@
 from __future__ import annotations
 
 import os
-from collections.abc import Iterable, Iterator
+from collections.abc import Generator, Iterable
 from typing import TYPE_CHECKING, List, Optional, Union
 
 from . import _quavel
@@ -87,7 +87,7 @@ def explain(path: Path) -> List[Note]:
 
 def scan(
     paths_or_folder: Union[Path, Iterable[Path]], jobs: Optional[int] = None
-) -> Iterator[Result]:
+) -> Generator[Result, None, None]:
     """Read many photos on threads; give a Result for each, in order, whether it can be read or not.
 
     Of a folder, the photos in it and in the folders in it are read, in the order of their names.
@@ -114,7 +114,7 @@ def scan(
     return _results(_quavel.Scanner(iter(paths), False, jobs or 0))
 
 
-def _results(scanner: _quavel.Scanner) -> Iterator[Result]:
+def _results(scanner: _quavel.Scanner) -> Generator[Result, None, None]:
     try:
         while batch := scanner.next_batch():
             yield from batch

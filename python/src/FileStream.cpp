@@ -4,8 +4,26 @@
 #include <string>
 
 #include "Arguments.h"
+#include "Unlocked.h"
 
 namespace binding {
+
+namespace {
+
+py::object call(py::handle function, long long argument) {
+  PyObject* result = nullptr;
+  try {
+    result = PyObject_CallFunction(function.ptr(), "L", argument);
+  } catch (...) {
+    waitForTheEnd();
+  }
+  if (result == nullptr) {
+    throw py::error_already_set();
+  }
+  return py::reinterpret_steal<py::object>(result);
+}
+
+}  // namespace
 
 FileStream::FileStream(py::handle file)
     : read_(py::getattr(file, "read", py::none())), seek_(py::getattr(file, "seek", py::none())) {
@@ -17,7 +35,7 @@ FileStream::FileStream(py::handle file)
 
 std::int64_t FileStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   if (filePosition_ != position_) {
-    seek_(position_);
+    call(seek_, position_);
     filePosition_ = position_;
   }
   // Unbuffered files deliver less than they have.
@@ -35,7 +53,7 @@ std::int64_t FileStream::readBuffer(std::uint8_t* destination, std::size_t count
 }
 
 std::size_t FileStream::readOnce(std::uint8_t* destination, std::size_t count) {
-  py::object const result = read_(count);
+  py::object const result = call(read_, static_cast<long long>(count));
   Bytes const bytes(result, "what file.read() returns");
   if (bytes.size() > count) {
     throw py::value_error("file.read(" + std::to_string(count) + ") returned " +

@@ -13,6 +13,7 @@
 #include "Record.h"
 #include "Refusal.h"
 #include "Scanner.h"
+#include "Unlocked.h"
 
 namespace binding {
 
@@ -39,14 +40,14 @@ RecordPointer recordOf(py::handle path, Read read) {
 RecordPointer read(py::object const& path) {
   std::string const name = pathOf(path, "path");
   return recordOf(path, [&](QVJournal& journal) {
-    py::gil_scoped_release const release;
+    Unlocked const unlocked;
     return journal.read(name);
   });
 }
 
 RecordPointer get(py::object const& path) {
   std::string const name = pathOf(path, "path");
-  py::gil_scoped_release const release;
+  Unlocked const unlocked;
   return quavel::QVReader(name).metadata;
 }
 
@@ -54,7 +55,7 @@ RecordPointer readBytes(py::object const& buffer, py::object const& extension) {
   std::string const kind = extensionOf(extension);
   Bytes const bytes(buffer, "buffer");
   return recordOf(py::none(), [&](QVJournal& journal) {
-    py::gil_scoped_release const release;
+    Unlocked const unlocked;
     return journal.read(bytes.data(), bytes.size(), kind);
   });
 }
@@ -73,7 +74,7 @@ py::list explain(py::object const& path) {
   std::string const name = pathOf(path, "path");
   QVJournal journal;
   {
-    py::gil_scoped_release const release;
+    Unlocked const unlocked;
     journal.read(name);
   }
   auto const type = py::module_::import("quavel._types").attr("Note");
@@ -97,6 +98,28 @@ void refuseSubinterpreter() {
   }
 }
 
+bool isMade(PyObject* self) {
+  return reinterpret_cast<py::detail::instance*>(self)->get_value_and_holder().holder_constructed();
+}
+
+/// A scan and the iterable that it reads from may refer to each other.
+void collectScanners(PyHeapTypeObject* heapType) {
+  PyTypeObject& type = heapType->ht_type;
+  type.tp_flags |= Py_TPFLAGS_HAVE_GC;
+  type.tp_traverse = [](PyObject* self, visitproc visit, void* arg) {
+#if PY_VERSION_HEX >= 0x03090000
+    Py_VISIT(Py_TYPE(self));
+#endif
+    return isMade(self) ? py::cast<Scanner&>(py::handle(self)).traverse(visit, arg) : 0;
+  };
+  type.tp_clear = [](PyObject* self) {
+    if (isMade(self)) {
+      py::cast<Scanner&>(py::handle(self)).close();
+    }
+    return 0;
+  };
+}
+
 void addTo(py::module_& module) {
   module.attr("__version__") = std::to_string(QUAVEL_VERSION_MAJOR) + '.' +
                                std::to_string(QUAVEL_VERSION_MINOR) + '.' +
@@ -108,7 +131,7 @@ void addTo(py::module_& module) {
   module.def("read_file", readFile);
   module.def("explain", explain);
   module.def("refuse_subinterpreter", refuseSubinterpreter);
-  py::class_<Scanner>(module, "Scanner", py::module_local())
+  py::class_<Scanner>(module, "Scanner", py::module_local(), py::custom_type_setup(collectScanners))
       .def(py::init<py::object, bool, unsigned>())
       .def("next_batch", &Scanner::nextBatch)
       .def("close", &Scanner::close);

@@ -5,7 +5,6 @@
 #include <charconv>
 #include <cmath>
 #include <cstdint>
-#include <cstdlib>
 #include <iterator>
 #include <memory>
 #include <tuple>
@@ -80,7 +79,7 @@ void forEachField(Visit visit) {
 double shortest(float value) {
   char text[32] = {};
   std::to_chars(std::begin(text), std::end(text) - 1, value);
-  return std::strtod(text, nullptr);
+  return PyOS_string_to_double(text, nullptr, nullptr);  // strtod minds the locale's decimal comma
 }
 
 py::object shown(bool value) { return py::bool_(value); }
@@ -224,7 +223,7 @@ py::object attributeOf(std::string const& member) {
 void addRecord(py::module_& module) {
   PyDateTime_IMPORT;
   py::class_<QVMetadata, std::shared_ptr<QVMetadata>> record(
-      module, "Record", py::module_local(),
+      module, "Record", py::module_local(), py::is_final(),
       "What a file tells about its photo. An attribute is None where the file does not say.");
   record.def_property_readonly("captured", captured,
                                "capture_date as datetime, without a time zone; None for what is "
@@ -248,6 +247,8 @@ void addRecord(py::module_& module) {
                               py::make_tuple(stateOf(self.cast<QVMetadata const&>())));
       });
   record.attr("__module__") = "quavel";
+  // Record.__new__(Record) would give one that was never filled.
+  reinterpret_cast<PyTypeObject*>(record.ptr())->tp_new = nullptr;
   module.def("restore", restore);
 }
 

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "Arguments.h"
+#include "Unlocked.h"
 
 namespace binding {
 
@@ -49,6 +50,21 @@ py::object makeResult(PyTypeObject* type, py::object path, py::object record, py
   return result;
 }
 
+using Clock = std::chrono::steady_clock;
+
+bool isLong(Clock::time_point start) {
+  return std::chrono::duration<double>(Clock::now() - start).count() > kLongBatch;
+}
+
+/// Null at the end, and when an exception is set.
+py::object nextOf(py::handle iterator) {
+  try {
+    return py::reinterpret_steal<py::object>(PyIter_Next(iterator.ptr()));
+  } catch (...) {
+    waitForTheEnd();
+  }
+}
+
 }  // namespace
 
 Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
@@ -56,7 +72,7 @@ Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
   if (isFolder) {
     isBytes_ = py::isinstance<py::bytes>(source_);
     std::string folder = pathOf(source_, "paths_or_folder");
-    py::gil_scoped_release const release;
+    Unlocked const unlocked;
     walk_.emplace(std::move(folder));
   }
 }
@@ -68,8 +84,12 @@ py::list Scanner::nextBatch() {
   if (!pipeline_) {
     return py::list();
   }
+  auto const start = Clock::now();
   while (source_ && order_.size() < 2 * pipeline_->limit()) {
     submitNext();
+    if (isLong(start) && !order_.empty() && pipeline_->isDone(order_.front()->batch)) {
+      break;  // the caller need not wait for a slow iterable or folder
+    }
   }
   if (order_.empty()) {
     if (failure_) {
@@ -99,23 +119,33 @@ void Scanner::submitNext() {
 }
 
 void Scanner::takeFound(Work& work) {
-  bool isFound = true;
-  {
-    py::gil_scoped_release const release;
-    Photo photo;
-    while (work.batch.photos.size() < batchSize_ && (isFound = walk_->next(photo))) {
-      work.batch.photos.push_back(std::move(photo));
+  auto& photos = work.batch.photos;
+  while (photos.size() < batchSize_ && !walk_->isAtEnd()) {
+    {
+      Unlocked const unlocked;
+      auto const end = std::chrono::steady_clock::now() + kPatience;
+      Photo photo;
+      while (photos.size() < batchSize_ && !walk_->isAtEnd() &&
+             std::chrono::steady_clock::now() < end) {
+        if (walk_->step(photo)) {
+          photos.push_back(std::move(photo));
+        }
+      }
+    }
+    if (PyErr_CheckSignals() != 0) {
+      throw py::error_already_set();
     }
   }
-  if (!isFound) {
+  if (walk_->isAtEnd()) {
     source_ = py::object();
   }
 }
 
 void Scanner::takePaths(Work& work) {
   try {
-    while (work.batch.photos.size() < batchSize_) {
-      auto const path = py::reinterpret_steal<py::object>(PyIter_Next(source_.ptr()));
+    auto const start = Clock::now();
+    while (work.batch.photos.size() < batchSize_ && (work.batch.photos.empty() || !isLong(start))) {
+      auto const path = nextOf(source_);
       if (!path) {
         source_ = py::object();
         if (PyErr_Occurred() != nullptr) {
@@ -150,7 +180,7 @@ void Scanner::waitForOldest() {
   bool isDone = pipeline_->isDone(oldest);
   while (!isDone) {
     {
-      py::gil_scoped_release const release;
+      Unlocked const unlocked;
       isDone = pipeline_->waitFor(oldest, kPatience);
     }
     if (PyErr_CheckSignals() != 0) {
@@ -174,6 +204,16 @@ py::list Scanner::resultsOf(Work& work) {
   return results;
 }
 
+int Scanner::traverse(visitproc visit, void* arg) {
+  Py_VISIT(source_.ptr());
+  for (auto const& work : order_) {
+    if (work) {
+      Py_VISIT(work->paths.ptr());
+    }
+  }
+  return 0;
+}
+
 void Scanner::close() {
   source_ = py::object();
   if (process_ != ::getpid()) {
@@ -183,7 +223,7 @@ void Scanner::close() {
       static_cast<void>(work.release());
     }
   } else {
-    py::gil_scoped_release const release;
+    Unlocked const unlocked;
     pipeline_.reset();
   }
   order_.clear();

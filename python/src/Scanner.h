@@ -32,6 +32,8 @@ class Scanner {
   py::list nextBatch();
   /// Ends the threads. Nothing comes after it.
   void close();
+  /// For the garbage collector.
+  int traverse(visitproc visit, void* arg);
 
  private:
   struct Work {

@@ -11,16 +11,16 @@
 
 namespace binding {
 
-bool Walk::next(Photo& photo) {
-  while (found_.empty() && !levels_.empty()) {
+bool Walk::step(Photo& photo) {
+  if (found_.empty() && !levels_.empty()) {
     Level& level = levels_.back();
     if (level.entries.empty()) {
       levels_.pop_back();
-      continue;
+    } else {
+      Entry const entry = std::move(level.entries.back());
+      level.entries.pop_back();
+      visit(entry, level.path + entry.name);
     }
-    Entry const entry = std::move(level.entries.back());
-    level.entries.pop_back();
-    visit(entry, level.path + entry.name);
   }
   if (found_.empty()) {
     return false;
@@ -35,13 +35,15 @@ void Walk::visit(Entry const& entry, std::string path) {
     found_.push_back({std::move(path), true});
     return;
   }
+  // As the command does, leave out hidden folders, and what macOS keeps about IMG.JPG in ._IMG.JPG.
+  bool const isHidden = entry.name[0] == '.';
   if (entry.type == DT_DIR) {
-    return enter(std::move(path), false);
+    return isHidden ? void() : enter(std::move(path), false);
   }
   struct stat status = {};
   bool const exists = ::stat(path.c_str(), &status) == 0;
   if (exists && S_ISDIR(status.st_mode)) {
-    return enter(std::move(path), true);
+    return isHidden ? void() : enter(std::move(path), true);
   }
   // Of a link that leads nowhere, the read tells what is wrong.
   if (isPhoto(entry.name) && (exists ? S_ISREG(status.st_mode) : errno != ELOOP)) {
@@ -77,7 +79,8 @@ void Walk::readEntries(DIR* folder, Level& level) {
     // The system need not say the type; a link may lead to a folder.
     bool const mayBeFolder =
         entry->d_type == DT_DIR || entry->d_type == DT_LNK || entry->d_type == DT_UNKNOWN;
-    if ((mayBeFolder || isPhoto(name)) && name != "." && name != "..") {
+    bool const isLeftOut = name == "." || name == ".." || name.compare(0, 2, "._") == 0;
+    if ((mayBeFolder || isPhoto(name)) && !isLeftOut) {
       level.entries.push_back({std::move(name), entry->d_type});
     }
     errno = 0;

@@ -20,8 +20,10 @@ class Walk {
  public:
   explicit Walk(std::string folder) { enter(std::move(folder), false); }
 
-  /// The next photo, or a folder that cannot be read, with the refusal; false at the end.
-  bool next(Photo& photo);
+  bool isAtEnd() const { return found_.empty() && levels_.empty(); }
+  /// Goes on by a step: to a photo, to a folder that cannot be read, with the refusal, or (false)
+  /// to neither.
+  bool step(Photo& photo);
 
  private:
   using Identity = std::pair<dev_t, ino_t>;

@@ -1,6 +1,7 @@
 import copy
 import gc
 import json
+import locale
 import os
 import pickle
 import subprocess
@@ -95,8 +96,22 @@ def test_is_a_value(photos):
         with pytest.raises(AttributeError):
             setattr(record, name, 1)
     assert "f_number=5.6" in repr(record) and "f_number" not in repr(other)
+    for make in (quavel.Record, lambda: quavel.Record.__new__(quavel.Record)):
+        with pytest.raises(TypeError):
+            make()
     with pytest.raises(TypeError):
-        quavel.Record()
+        type("Mine", (quavel.Record,), {})
+
+
+def test_the_locale_changes_no_number(photos):
+    try:
+        locale.setlocale(locale.LC_NUMERIC, "de_DE.UTF-8")
+    except locale.Error:
+        pytest.skip("no locale with a decimal comma")
+    try:
+        assert quavel.read(photos / "river.cr3").f_number == 5.6
+    finally:
+        locale.setlocale(locale.LC_NUMERIC, "C")
 
 
 def test_odd_bytes_survive_pickling():

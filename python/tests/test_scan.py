@@ -42,7 +42,7 @@ def test_order(jobs, cut, photos):
 
 
 def test_folders(tmp_path):
-    names = ["b/z.nef", "b.nef", "B.NEF", "a/x/y.nef", "b/notes.txt"]
+    names = ["b/z.nef", "b.nef", "B.NEF", "a/x/y.nef", "b/notes.txt", "._b.nef", ".trash/t.nef"]
     for name in names:
         path = tmp_path / name
         path.parent.mkdir(parents=True, exist_ok=True)
@@ -78,8 +78,9 @@ def test_failures_of_the_iterable():
 
 def test_ends_its_threads():
     pulled = itertools.count()
-    for leave in ("close", "collect", "error"):
-        scan = quavel.scan((NIGHT for _ in pulled), 4)
+    for leave in ("close", "collect", "error", "cycle"):
+        holder = {}
+        scan = quavel.scan((NIGHT for _ in pulled if holder is not None), 4)
         assert next(scan).record.width == 6032
         assert sum(1 for _ in itertools.islice(scan, 1000)) == 1000
         assert 1 < threads() <= 5
@@ -88,10 +89,12 @@ def test_ends_its_threads():
         elif leave == "error":
             with pytest.raises(LookupError):
                 scan.throw(LookupError())
-        del scan
+        elif leave == "cycle":
+            holder["scan"] = scan  # which the iterable of the scan refers to
+        del scan, holder
         gc.collect()
         assert threads() == 1
-        assert list(itertools.islice(pulled, 1))[0] < 5000  # and has not run far ahead
+        assert list(itertools.islice(pulled, 1))[0] < 7000  # and has not run far ahead
 
 
 def test_constant_memory():
@@ -165,9 +168,15 @@ def test_ctrl_c():
     assert process.returncode == -signal.SIGINT
 
 
-def test_exit_with_a_scan_open():
-    code = ENDLESS + "next(scan)"
-    assert subprocess.run([sys.executable, "-c", code], timeout=20, check=False).returncode == 0
+def test_exit_with_a_scan_open_or_threads_reading():
+    reading = (
+        "import collections, itertools, quavel, threading, time\n"
+        f"for _ in range(4):\n    reads = map(quavel.get, itertools.repeat({NIGHT!r}))\n"
+        "    threading.Thread(target=collections.deque, args=(reads, 0), daemon=True).start()\n"
+        "time.sleep(0.1)\n"
+    )
+    for code in (ENDLESS + "next(scan)", reading, reading):
+        assert subprocess.run([sys.executable, "-c", code], timeout=20, check=False).returncode == 0
 
 
 @pytest.mark.parametrize("first", ["", "import quavel\n"])
