@@ -34,7 +34,7 @@ Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
     : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {
 #ifdef __GLIBC__
   // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
-  ::mallopt(M_ARENA_MAX, 2);
+  ::mallopt(M_ARENA_MAX, 4);
 #endif
 }
 
