@@ -60,6 +60,18 @@ TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
   }
 }
 
+// The walk over the boxes of a box must not take "out of reach" for its end.
+TEST(LargeFile, IsRefusedWhereBoxesWithinBoxesEndBeyondIt) {
+  Bytes cmt1 = box("CMT1", tiff(kII, {{shorts(kWidth, {42})}}));
+  cmt1.replace(0, 4, u32(kMM, 0x80000000));
+  Bytes uuid = uuidBox(cmt1);
+  uuid.replace(0, 4, u32(kMM, 0x90000000));
+  TemporaryFile const file(box("moov", uuid), "cr3");
+  QVJournal journal;
+  EXPECT_EQ(describe(journal.read(file.path)), "none");
+  EXPECT_TRUE(isCutShort(journal));
+}
+
 /// SOI, then 4 GB of segments of the greatest length.
 struct Segments : QVStream {
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
