@@ -188,8 +188,7 @@ std::string describe(std::shared_ptr<QVMetadata> const& record) {
 }
 
 std::string readBuffer(Bytes bytes, std::string const& extension) {
-  return describe(
-      QVReader(dataOf(bytes), sizeOf(bytes), extension).metadata);
+  return describe(QVReader(dataOf(bytes), sizeOf(bytes), extension).metadata);
 }
 
 std::string readStream(std::shared_ptr<QVStream> stream, std::string const& extension) {
