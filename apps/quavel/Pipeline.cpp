@@ -31,7 +31,7 @@ long countWaits() { return 0; }
 }  // namespace
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
-    : jobs_(jobs), busyJobs_(busyJobs), isWaiting_(!kTellsWaits), work_(std::move(work)) {
+    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kTellsWaits), work_(std::move(work)) {
 #ifdef __GLIBC__
   // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
   ::mallopt(M_ARENA_MAX, 4);
@@ -78,7 +78,7 @@ std::unique_ptr<Batch> Pipeline::take() {
   auto batch = std::move(order_.front());
   order_.pop_front();
   std::unique_lock<std::mutex> lock(mutex_);
-  hasDone_.wait(lock, [&batch] { return batch->isDone; });
+  batchDone_.wait(lock, [&batch] { return batch->isDone; });
   if (batch->failure) {
     std::rethrow_exception(batch->failure);
   }
@@ -92,7 +92,7 @@ bool Pipeline::isOldestDone() {
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * limit()); }
 
-std::size_t Pipeline::limit() const { return isWaiting_ ? jobs_ : busyJobs_; }
+std::size_t Pipeline::limit() const { return waitsForDisk_ ? jobs_ : busyJobs_; }
 
 void Pipeline::startThread() {
   interrupt::BlockSignals const block;
@@ -115,7 +115,7 @@ void Pipeline::workOn(Batch& batch) {
   }
   // Reading a cached file does not wait. Other files wait for the disk at least once each.
   if (isTold) {
-    isWaiting_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
+    waitsForDisk_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }
 }
 
@@ -132,7 +132,7 @@ void Pipeline::runThread() {
     workOn(*batch);
     lock.lock();
     batch->isDone = true;
-    hasDone_.notify_one();
+    batchDone_.notify_one();
   }
 }
 

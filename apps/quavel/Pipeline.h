@@ -27,13 +27,13 @@ struct Batch {
 };
 
 /// Works on batches on several threads and returns them in the order in which they were submitted.
-/// There are `jobs` threads while the work waits for the disk, so that the disk is never idle, and
-/// `busyJobs` while it keeps the processors busy.
+/// Up to `jobs` threads are started while the work waits for the disk, so that the disk is never
+/// idle, and up to `busyJobs` while it keeps the processors busy. None stops before the end.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
-  /// With one job the work is done by the caller of `submit`.
+  /// The first batch is worked on in `submit`, by its caller; with one job, every batch is.
   Pipeline(unsigned jobs, unsigned busyJobs, Work work);
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
@@ -57,14 +57,14 @@ class Pipeline {
 
   unsigned jobs_;
   unsigned busyJobs_;
-  std::atomic<bool> isWaiting_;
+  std::atomic<bool> waitsForDisk_;
   Work work_;
   std::vector<std::thread> threads_;
   std::deque<std::unique_ptr<Batch>> order_;  // used by the caller's thread only
   bool hasBegun_ = false;
   std::mutex mutex_;
   std::condition_variable hasWork_;
-  std::condition_variable hasDone_;
+  std::condition_variable batchDone_;
   std::deque<Batch*> waiting_;
   bool isEnding_ = false;
 };

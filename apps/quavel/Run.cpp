@@ -156,9 +156,11 @@ void Runner::emitOldest() {
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
   progress_.count(!outcome.problem, outcome.isShown);
-  bool const isTold =
+  // An explanation states the problem itself. So does a row or an object for programs, which is
+  // enough with --quiet.
+  bool const isOutputEnough =
       outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
-  if (outcome.problem && !isTold) {
+  if (outcome.problem && !isOutputEnough) {
     console_.printFileMessage(outcome.path, outcome.problem.text);
   }
   if (outcome.problem && outcome.isShown && std::exchange(lacksError_, false)) {

@@ -66,15 +66,16 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   std::int64_t const start = notedPosition(journal, *stream);
   unsigned short marker = 0;
   if (!stream->readShort(&marker)) {
-    return refuseCut(journal, start, sizeof(marker), "the marker SOI");
+    return refuseCut(journal, start, sizeof(marker), "the SOI marker");
   }
   if (marker != kSOI) {
     return refuse(journal, QVReason::OtherKind, start,
                   "the file begins with {}, not with ff d8 (SOI)", HexPair{marker});
   }
 
-  // In an ordinary file, the walk ends at the frame header. A file without a baseline frame or an
-  // APP1 segment is walked through its scan to the end of the data, which is not a failure.
+  // In an ordinary file, the walk ends at the frame header. When the baseline frame, the APP1
+  // segment or both are missing, it goes on through the scan to the end of the data. Reaching that
+  // end is not a failure.
   WalkState walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
@@ -121,7 +122,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
     walk.scan = walk.start;
     walk.missingAtScan = walk.sawAPP1 ? "SOF0" : walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
   }
-  // After the start of the scan, the same two bytes are image data.
+  // After the start of the scan, the same two bytes are not this image's frame header.
   if (marker == kSOF2 && walk.scan < 0) {
     walk.otherFrame = walk.start;
   }
@@ -143,7 +144,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
     unsigned short padding = 0;
     if (!stream->readShort(&padding)) {
       return refuseCut(journal, walk.start + kPayloadPosition + std::int64_t{identifier.size()},
-                       sizeof(padding), "the Exif identifier of the APP1 segment at {}",
+                       sizeof(padding), "the end of the Exif identifier of the APP1 segment at {}",
                        Offset{walk.start});
     }
     if (!readExifSegment(stream)) {
@@ -183,7 +184,8 @@ void QVJPEGImage::reconcileSizeWith(WalkState const& walk) {
     height = walk.frameHeight;
   }
 
-  // Exif may give the sides swapped. The frame's size counts unless a rotation is declared.
+  // Exif may give the sides swapped. The frame's size then counts, unless Orientation declares that
+  // the image is turned or mirrored.
   bool const isTurned = width == walk.frameHeight && height == walk.frameWidth;
   bool const isUpright = orientation == 1 || orientation == -1;
   if (isTurned && isUpright) {

@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 namespace {
 
-// A screenful of each, whatever the file holds.
+// Few enough for all notes to fit on a screen, whatever the file holds.
 constexpr std::size_t kMaxSteps = 8;
 constexpr std::size_t kMaxHints = 8;
 
@@ -32,8 +32,8 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
   isRefused_ = true;
   QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
   add(kind, reason, position, composed(pattern, words));
-  bool const isOfSystem = reason == QVReason::CannotOpen || reason == QVReason::ReadError;
-  notes.back().systemError = isOfSystem ? systemError : 0;
+  bool const isSystemFailure = reason == QVReason::CannotOpen || reason == QVReason::ReadError;
+  notes.back().systemError = isSystemFailure ? systemError : 0;
 }
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,

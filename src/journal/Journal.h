@@ -26,7 +26,7 @@ class Journal {
   void refuse(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// Refuses because the `count` bytes at `position` are missing; the pattern says what they are.
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
-  /// Counts steps beyond the first few instead of keeping them.
+  /// Notes a part that was read without trouble; after the first few, only counts it.
   void passed(std::int64_t position, char const* pattern, Words words);
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// The reason for a field's absence, should it be absent at the end; the last reason counts.
@@ -47,7 +47,7 @@ class Journal {
   int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
   bool hasReadFailed = false;   ///< The last read failed, other than by the end of the data.
-  int systemError = 0;          ///< The `errno` of the failure; 0: there was none.
+  int systemError = 0;          ///< The `errno` of that failure; 0: none is known.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);
@@ -62,7 +62,7 @@ class Journal {
 /// Whether there is a journal that wants more than the refusal.
 inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
 
-/// States why the read ends. Always false, for the step to return at once.
+/// States why the read ends. Always false, so that a step can `return refuse(...)`.
 template <class... Words>
 [[gnu::cold, gnu::noinline]] bool refuse(Journal* journal, QVReason reason, std::int64_t position,
                                          char const* pattern, Words... words) {

@@ -11,8 +11,8 @@
 #include <unistd.h>
 #endif
 
-// What the library asks of the system: files, by descriptors and with 64-bit positions. -1 is a
-// failure, and `errno` says why.
+// What the library asks of the system: reading files through descriptors, with 64-bit positions. A
+// result of -1 means failure; `errno` says why.
 namespace quavel::detail::file {
 
 #ifdef _WIN32
@@ -29,7 +29,7 @@ inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count
 
 #else
 
-static_assert(sizeof(off_t) == 8, "files above 2 GB want _FILE_OFFSET_BITS=64");
+static_assert(sizeof(off_t) == 8, "files above 2 GB need _FILE_OFFSET_BITS=64");
 
 inline int open(std::string const& path) { return ::open(path.c_str(), O_RDONLY, 0); }
 
@@ -49,14 +49,16 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// The size of a regular file; -1 for anything else.
+/// The size of a regular file; -1 for anything else, which sets no `errno`.
 inline std::int64_t size(int fd) {
   struct stat status = {};
   return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode) ? std::int64_t{status.st_size} : -1;
 }
 
 #ifdef POSIX_FADV_RANDOM
+/// Advises the system not to read ahead: reads will be few and far apart.
 inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
+/// Advises the system to fetch these bytes now: they will be read soon.
 inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
   ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
 }

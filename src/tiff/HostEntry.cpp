@@ -50,7 +50,7 @@ std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
     } else {
       entry->values = listOf(block, row.first, row.count);
     }
-    // Most directories are sorted by tag. Of a repeated one, the first entry stays.
+    // Most directories are sorted by tag. Of a repeated tag, the first entry stays.
     map->emplace_hint(map->end(), row.tag, std::move(entry));
   }
   return map;

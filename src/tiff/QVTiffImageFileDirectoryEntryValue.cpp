@@ -92,8 +92,8 @@ auto converted(EntryValue const& value, Convert const& convert) -> decltype(conv
   return 0;
 }
 
-/// The value's low 32 bits. Integers are widened by their own sign; floats saturate at the limits
-/// of `Integer`, which also has 32 bits.
+/// The value as 32 bits. Integers are sign- or zero-extended as their own type demands; floats
+/// saturate at the limits of `Integer`, which also has 32 bits; fractions are divided.
 template <class Integer>
 std::uint32_t to32Bits(EntryValue const& value) {
   return converted(value, [](auto number) {

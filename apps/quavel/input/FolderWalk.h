@@ -22,13 +22,15 @@ using Report = std::function<void(std::string const& path, std::string const& wh
 
 /// What a walk leaves out, besides files that are not photos.
 struct Filter {
-  bool showsHidden = false;  ///< Otherwise "._" files and folders that begin with "." are left out.
+  /// False: folders whose names begin with "." and files whose names begin with "._" are left out.
+  bool showsHidden = false;
   std::vector<std::string> excluded;  ///< Globs of names or, with a "/" in them, of paths.
 };
 
-/// The photos of a folder and the folders in it, in the order of their names' bytes. Symbolic links
-/// are followed; one that leads back to a folder above it, or to where another link led before, is
-/// reported and skipped. Keeps only the names of the folders that it is in.
+/// Finds the photos in a folder and its subfolders, in the order of their names' bytes. Symbolic
+/// links are followed; one that leads back to a folder above it, or to a folder that another link
+/// led to before, is reported and skipped. Of all entries, only those still to be visited in the
+/// current folder and the folders above it are kept in memory.
 class FolderWalk {
  public:
   /// The filter must outlive it.
@@ -47,7 +49,7 @@ class FolderWalk {
     std::string path;  // with a "/" at the end
     Identity identity;
     std::string names;           // each ends with a NUL
-    std::vector<Entry> entries;  // still to be visited, from the last one
+    std::vector<Entry> entries;  // still to be visited, the last one first
   };
 
   void enter(std::string const& path, bool isLink);
