@@ -57,6 +57,18 @@ void addConditions(std::vector<std::string> const& texts, Form& form) {
   }
 }
 
+void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded) {
+  for (std::string glob : globs) {
+    while (glob.size() > 1 && glob.back() == '/') {
+      glob.pop_back();  // completion adds one to the name of a folder
+    }
+    excluded.push_back(glob);
+    if (glob.find('/') != std::string::npos) {
+      excluded.push_back("*/" + glob);
+    }
+  }
+}
+
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes) {
   if (choice != no && choice != yes) {
     throw CLI::ValidationError(option + ": '" + choice + "': give " + no + " or " + yes);

@@ -15,6 +15,8 @@ constexpr unsigned kMaxJobs = 256;
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
+/// A glob with a slash in it, apart from its end, is also compared with the later parts of a path.
+void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
 /// Whether the choice is `yes`.
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);

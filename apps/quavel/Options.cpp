@@ -45,9 +45,12 @@ void addInputs(CLI::App& command, Options& options) {
   list->type_name("FILE")->check(values::refuseEmpty);
   command.add_flag("--hidden", options.inputs.filter.showsHidden,
                    "Walk hidden folders, and try files named ._*");
+  auto const addExcluded = [&options](std::vector<std::string> const& globs) {
+    values::addExcluded(globs, options.inputs.filter.excluded);
+  };
   command
-      .add_option("--exclude", options.inputs.filter.excluded,
-                  "Leave these names or paths out of folders; repeatable")
+      .add_option_function<std::vector<std::string>>(
+          "--exclude", addExcluded, "Leave these names or paths out of folders; repeatable")
       ->allow_extra_args(false)
       ->type_name("GLOB");
   command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")

@@ -13,8 +13,8 @@ class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
   /// False: another type of box, or a child that cannot be read.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  std::shared_ptr<QVCR3UUIDBox>
-      uuidBox;  ///< The last `uuid` child, whatever its identifier; or null.
+  /// The last `uuid` child, whatever its identifier; or null.
+  std::shared_ptr<QVCR3UUIDBox> uuidBox;
 
  private:
   QUAVEL_NO_EXPORT bool readChildren(std::shared_ptr<QVStream>& stream, long start, long end);

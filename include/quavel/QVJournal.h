@@ -26,7 +26,7 @@ enum class QVNoteKind : std::uint8_t {
   Hint,     ///< Something else that may explain the outcome.
 };
 
-/// The reason behind a note, for programs to switch on. Later versions may add reasons at the end.
+/// The reason for a note, for programs to switch on. Later versions may add reasons at the end.
 enum class QVReason : std::uint8_t {
   None,              ///< A step needs none.
   UnknownExtension,  ///< The extension names no format.

@@ -29,8 +29,8 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
 
   /// All values in file order; null for an UNDEFINED entry and before a `read`.
   std::shared_ptr<std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>> values;
-  std::shared_ptr<std::vector<std::uint8_t>>
-      bytes;  ///< Of an UNDEFINED entry of up to 4 bytes; else null.
+  /// The bytes of an UNDEFINED entry of up to 4; else null.
+  std::shared_ptr<std::vector<std::uint8_t>> bytes;
   /// Where the bytes of a longer UNDEFINED entry lie, counted from the TIFF header; else 0.
   std::uint32_t dataOffset = 0;
   std::uint32_t dataCount = 0;  ///< How many bytes a longer UNDEFINED entry has; else 0.

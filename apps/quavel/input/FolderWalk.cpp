@@ -123,14 +123,9 @@ bool FolderWalk::isLeftOut(std::string const& folder, std::string_view name, boo
     return true;
   }
   return std::any_of(filter_.excluded.begin(), filter_.excluded.end(), [&](auto const& glob) {
-    std::string pattern = glob;
-    while (pattern.size() > 1 && pattern.back() == '/') {
-      pattern.pop_back();  // "build/" is what completion makes of a folder's name
-    }
-    bool const isOfPath = pattern.find('/') != std::string::npos;
+    bool const isOfPath = glob.find('/') != std::string::npos;
     std::string const whole = (isOfPath ? folder : std::string()) + std::string(name);
-    return ::fnmatch(pattern.c_str(), whole.c_str(), 0) == 0 ||
-           (isOfPath && ::fnmatch(("*/" + pattern).c_str(), whole.c_str(), 0) == 0);
+    return ::fnmatch(glob.c_str(), whole.c_str(), 0) == 0;
   });
 }
 

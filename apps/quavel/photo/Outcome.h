@@ -30,8 +30,8 @@ struct Input {
 /// What became of one file.
 struct Outcome {
   std::string path;
-  std::shared_ptr<quavel::QVMetadata>
-      record;                         ///< Null when there is none, or it is no longer needed.
+  /// Null when there is none, or it is no longer needed.
+  std::shared_ptr<quavel::QVMetadata> record;
   Problem problem;                    ///< When there is no record.
   char const* format = "";            ///< As the journal gives it.
   std::vector<quavel::QVNote> notes;  ///< When they are wanted.
