@@ -1,6 +1,8 @@
 #include "stream/PositionedFile.h"
 
+#include <atomic>
 #include <cerrno>
+#include <chrono>
 
 #include "quavel/QVReadAheadStream.h"
 #include "system/File.h"
@@ -18,6 +20,12 @@ constexpr std::int64_t kForeseen = std::int64_t{4} << 20;
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
+// The advice against reading ahead costs a system call and helps only with files that are not
+// cached. So it is given while the files read lately took as long as a disk does.
+constexpr auto kSlowRead = std::chrono::microseconds(40);  // a cached block takes about 3
+constexpr int kFilesAdvised = 64;                          // from the last slow read on
+std::atomic<int> filesToAdvise{1};
+
 /// Both streams in one allocation.
 struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
@@ -32,24 +40,36 @@ struct ReadAheadFile {
 
 PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
-void PositionedFile::advise() {
-  ++reads_;
+std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t count) {
+  int const left = filesToAdvise.load(std::memory_order_relaxed);
   // By default, a system fetches several times what is asked for at the start of a file.
-  if (reads_ == 1) {
+  if (left > 0) {
     file::expectFewReads(fd);
   }
+  auto const start = std::chrono::steady_clock::now();
+  std::int64_t const delivered = file::readAt(fd, destination, count, position_);
+  bool const isSlow = std::chrono::steady_clock::now() - start > kSlowRead;
+  if (isSlow || left > 0) {
+    filesToAdvise.store(isSlow ? kFilesAdvised : left - 1, std::memory_order_relaxed);
+  }
+  return delivered;
+}
+
+std::int64_t PositionedFile::readFurther(std::uint8_t* destination, std::size_t count) {
   if (reads_ >= kReadsOfAWalk && position_ >= foreseenEnd_) {
     file::expectReads(fd, position_, kForeseen);
     foreseenEnd_ = position_ + kForeseen;
   }
+  return file::readAt(fd, destination, count, position_);
 }
 
 std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t count) {
   if (fd == -1) {
     return 0;
   }
-  advise();
-  std::int64_t delivered = file::readAt(fd, destination, count, position_);
+  ++reads_;
+  std::int64_t delivered =
+      reads_ == 1 ? readFirst(destination, count) : readFurther(destination, count);
   if (delivered == -1 && errno == ESPIPE) {
     delivered = readPipe(destination, count);
   }

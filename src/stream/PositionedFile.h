@@ -12,8 +12,9 @@ namespace quavel::detail {
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read names its position, so that a seek costs nothing,
-/// and the system is asked not to read ahead. A file that takes many reads is being walked to its
-/// end, so the system is then asked to fetch what follows. A pipe is read front to back; a read
+/// and the system is asked not to read ahead while files come from the disk rather than from its
+/// cache. A file that takes many reads is being walked to its end, so the system is then asked to
+/// fetch what follows. A pipe is read front to back; a read
 /// anywhere else fails.
 class PositionedFile : public QVFStream {
  public:
@@ -24,7 +25,8 @@ class PositionedFile : public QVFStream {
   void setOffset(long const& offset) override;
 
  private:
-  void advise();
+  std::int64_t readFirst(std::uint8_t* destination, std::size_t count);
+  std::int64_t readFurther(std::uint8_t* destination, std::size_t count);
   std::int64_t readPipe(std::uint8_t* destination, std::size_t count);
 
   std::int64_t position_ = 0;      // absolute
