@@ -38,6 +38,16 @@ class ShortFormatter : public CLI::Formatter {
   std::string make_positionals(CLI::App const* /*app*/) const override { return {}; }
 };
 
+/// An option that takes one value each time it is given.
+template <class Set>
+void addRepeatable(CLI::App& command, char const* name, char const* type, char const* text,
+                   Set set) {
+  command.add_option_function<std::vector<std::string>>(name, set, text)
+      ->expected(1, CLI::detail::expected_max_vector_size)
+      ->allow_extra_args(false)
+      ->type_name(type);
+}
+
 void addInputs(CLI::App& command, Options& options) {
   command.add_option("PATH", options.inputs.paths, "Photos and folders of photos")->type_name("");
   auto* const list = command.add_option("--files-from", options.inputs.list,
@@ -45,14 +55,11 @@ void addInputs(CLI::App& command, Options& options) {
   list->type_name("FILE")->check(values::refuseEmpty);
   command.add_flag("--hidden", options.inputs.filter.showsHidden,
                    "Walk hidden folders, and try files named ._*");
-  auto const addExcluded = [&options](std::vector<std::string> const& globs) {
-    values::addExcluded(globs, options.inputs.filter.excluded);
-  };
-  command
-      .add_option_function<std::vector<std::string>>(
-          "--exclude", addExcluded, "Leave these names or paths out of folders; repeatable")
-      ->allow_extra_args(false)
-      ->type_name("GLOB");
+  addRepeatable(command, "--exclude", "GLOB",
+                "Leave these names or paths out of folders; repeatable",
+                [&options](std::vector<std::string> const& globs) {
+                  values::addExcluded(globs, options.inputs.filter.excluded);
+                });
   command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
       ->needs(list);
   auto* const standardInput =
@@ -97,15 +104,10 @@ void addChoices(CLI::App& command, Options& options) {
   auto const add = [&command](char const* name, char const* type, char const* text, auto set) {
     command.add_option_function<std::string>(name, set, text)->take_last()->type_name(type);
   };
-  auto const addMany = [&command](char const* name, char const* type, char const* text, auto set) {
-    command.add_option_function<std::vector<std::string>>(name, set, text)
-        ->expected(1, CLI::detail::expected_max_vector_size)
-        ->allow_extra_args(false)
-        ->type_name(type);
-  };
-  addMany("--fields", "A,B,..", "Show these fields, in this order", setFields);
-  addMany("--where", "EXPR", "Only photos like this, such as 'iso>=3200'; repeatable",
-          [&form](std::vector<std::string> const& texts) { values::addConditions(texts, form); });
+  addRepeatable(command, "--fields", "A,B,..", "Show these fields, in this order", setFields);
+  addRepeatable(
+      command, "--where", "EXPR", "Only photos like this, such as 'iso>=3200'; repeatable",
+      [&form](std::vector<std::string> const& texts) { values::addConditions(texts, form); });
   add("--sort", "[-]FIELD", "Sort by a field (-: descending), once all are read",
       [&form](std::string const& name) { values::setSort(form, name); });
   add("--absent", "skip|show", "Absent values: skip or show (CSV always shows)",

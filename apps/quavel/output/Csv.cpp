@@ -42,7 +42,8 @@ TextOf csvRows(Form const& form, bool isForTerminal) {
   return [fields = columnsOf(form), isForTerminal, end = lineEnd(form)](Outcome const& outcome) {
     std::string row;
     for (auto const* field : fields) {
-      std::string const text = exact(field->value(outcome));
+      std::string text;
+      appendExact(text, field->value(outcome));
       bool const isPath = field->name == "path";
       row += quoted(!isForTerminal ? text : isPath ? escapedPath(outcome.path) : escaped(text));
       row += ',';

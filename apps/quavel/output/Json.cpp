@@ -75,66 +75,40 @@ Members membersOf(Fields const& fields) {
   return members;
 }
 
-class JsonObjects {
- public:
-  JsonObjects(Form const& form, bool isForTerminal);
-
-  std::string operator()(Outcome const& outcome) const;
-
- private:
-  Members members_;
-  Members const errorMembers_ = membersOf(
-      {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"), fieldNamed("position")});
-  Members const bytesOfErrors_ = membersOf({fieldNamed("pathBytes")});  // shown only where needed
-  Members pathBytes_;  // the same; empty when the fields include it or lack the path
-  bool showAbsent_;
-  bool hasNotes_;
-  bool endsLine_;
-  bool isForTerminal_;
-};
-
-JsonObjects::JsonObjects(Form const& form, bool isForTerminal)
-    : showAbsent_(form.showAbsent.value_or(true)),
-      hasNotes_(form.hasNotes),
-      endsLine_(form.kind == FormKind::Jsonl),
-      isForTerminal_(isForTerminal) {
-  Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  members_ = membersOf(fields);
-  if (contains(fields, "path") && !contains(fields, "pathBytes")) {
-    pathBytes_ = bytesOfErrors_;
-  }
-}
-
-std::string JsonObjects::operator()(Outcome const& outcome) const {
-  std::string object;
-  object.reserve(kUsualObject);
-  auto const add = [&](Members const& members, bool showAbsent) {
-    for (auto const& member : members) {
-      Value const value = member.field->value(outcome);
-      if (!std::holds_alternative<std::monostate>(value)) {
-        object += member.name;
-        append(object, value, isForTerminal_);
-      } else if (showAbsent) {
-        object += member.absent;
-      }
+void append(std::string& json, Members const& members, Outcome const& outcome, bool showAbsent,
+            bool isForTerminal) {
+  for (auto const& member : members) {
+    Value const value = member.field->value(outcome);
+    if (!std::holds_alternative<std::monostate>(value)) {
+      json += member.name;
+      append(json, value, isForTerminal);
+    } else if (showAbsent) {
+      json += member.absent;
     }
-  };
-  add(outcome.record ? members_ : errorMembers_, showAbsent_);
-  add(outcome.record ? pathBytes_ : bytesOfErrors_, false);
-  if (hasNotes_) {
-    object += notesOf(outcome, isForTerminal_);
   }
-  object.resize(std::max<std::size_t>(object.size(), 1));
-  object.front() = '{';  // in place of the first comma
-  object += '}';
-  object += endsLine_ ? "\n" : "";
-  return object;
 }
 
 }  // namespace
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
-  return JsonObjects(form, isForTerminal);
+  Fields const fields = form.fields.empty() ? recordFields() : form.fields;
+  bool const mayAddBytes = contains(fields, "path") && !contains(fields, "pathBytes");
+  return [&form, isForTerminal, mayAddBytes, ofRecord = membersOf(fields),
+          ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
+                                 fieldNamed("position")}),
+          pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
+    std::string object;
+    object.reserve(kUsualObject);
+    append(object, outcome.record ? ofRecord : ofProblem, outcome, form.showAbsent.value_or(true),
+           isForTerminal);
+    if (mayAddBytes || !outcome.record) {
+      append(object, pathBytes, outcome, false, isForTerminal);
+    }
+    object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
+    object.resize(std::max<std::size_t>(object.size(), 1));
+    object.front() = '{';  // in place of the first comma
+    return object += form.kind == FormKind::Jsonl ? "}\n" : "}";
+  };
 }
 
 }  // namespace app

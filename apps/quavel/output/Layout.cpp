@@ -31,10 +31,12 @@ void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t lin
 /// The shown column of the highest rank, or the number of columns.
 std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& widths) {
   std::size_t found = columns.size();
+  int highest = 0;
   for (std::size_t i = 0; i < columns.size(); ++i) {
-    bool const isBetter =
-        widths[i] > 0 && columns[i].rank > (found == columns.size() ? 0 : columns[found].rank);
-    found = isBetter ? i : found;
+    if (widths[i] > 0 && columns[i].rank > highest) {
+      found = i;
+      highest = columns[i].rank;
+    }
   }
   return found;
 }

@@ -23,10 +23,6 @@ std::string word(std::string_view name, Outcome const& outcome) {
   return inWords(*fieldNamed(name), outcome);
 }
 
-bool isMinute(std::string const& date) {
-  return date.size() == kMinute && date[4] == '-' && date[13] == ':';
-}
-
 /// The date without its seconds, for which a table has no room.
 std::string minutes(std::string const& date) {
   bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
@@ -72,8 +68,9 @@ Cells cellsOf(Fields const& fields, Outcome const& outcome) {
 }
 
 void dropTime(Cells& cells) {
-  if (isMinute(cells[kDateColumn])) {
-    cells[kDateColumn].resize(kDay);
+  std::string& date = cells[kDateColumn];
+  if (date.size() == kMinute && date[4] == '-' && date[13] == ':') {
+    date.resize(kDay);
   }
 }
 

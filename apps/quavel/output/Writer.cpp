@@ -84,23 +84,25 @@ TextOf paths(Form const& form, bool isForTerminal) {
 }
 
 std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
+  bool const isTerminal = output.isTerminal();
+  auto const writer = [&output](TextOf textOf, char const* start, char const* separator) {
+    return std::make_unique<TextWriter>(output, std::move(textOf), start, separator);
+  };
   switch (form.kind) {
     case FormKind::Json:
       output.enclose("[", "\n]\n");
-      return std::make_unique<TextWriter>(output, jsonObjects(form, output.isTerminal()), "\n",
-                                          ",\n");
+      return writer(jsonObjects(form, isTerminal), "\n", ",\n");
     case FormKind::Jsonl:
-      return std::make_unique<TextWriter>(output, jsonObjects(form, output.isTerminal()), "", "");
+      return writer(jsonObjects(form, isTerminal), "", "");
     case FormKind::Csv:
       output.add(csvHeader(form));
-      return std::make_unique<TextWriter>(output, csvRows(form, output.isTerminal()), "", "");
+      return writer(csvRows(form, isTerminal), "", "");
     case FormKind::Paths:
-      return std::make_unique<TextWriter>(output, paths(form, output.isTerminal()), "", "");
+      return writer(paths(form, isTerminal), "", "");
     case FormKind::Card:
-      return std::make_unique<TextWriter>(
-          output, [&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
+      return writer([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
     default:
-      return std::make_unique<TextWriter>(output, explanationOf, "", "\n");
+      return writer(explanationOf, "", "\n");
   }
 }
 

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <functional>
 #include <iterator>
 #include <stdexcept>
 #include <system_error>
@@ -14,8 +15,26 @@ namespace app {
 
 namespace {
 
-// In the order of Relation; the longer ones come first. "=" is accepted for "==".
-constexpr std::string_view kRelations[] = {">=", "<=", "!=", "==", ">", "<", "~"};
+template <class Compare>
+bool meets(Value const& value, Value const& wanted) {
+  return Compare()(value, wanted);
+}
+
+bool containsText(Value const& text, Value const& part) {
+  return std::get<std::string>(text).find(std::get<std::string>(part)) != std::string::npos;
+}
+
+struct Relation {
+  std::string_view sign;
+  bool (*isMet)(Value const& value, Value const& wanted);
+};
+
+// The first that fits counts, so the longer ones come first.
+constexpr Relation kRelations[] = {
+    {">=", meets<std::greater_equal<>>}, {"<=", meets<std::less_equal<>>},
+    {"!=", meets<std::not_equal_to<>>},  {"==", meets<std::equal_to<>>},
+    {"=", meets<std::equal_to<>>},       {">", meets<std::greater<>>},
+    {"<", meets<std::less<>>},           {"~", containsText}};
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
@@ -57,61 +76,34 @@ Value comparable(Field const& field, Value value) {
 
 }  // namespace
 
-Condition::Condition(Field const& field, std::string_view comparison)
-    : field_(field), relation_(Relation::Equal) {
-  std::string_view const whole = comparison;
-  std::size_t length = comparison.substr(0, 1) == "=" ? 1 : 0;
-  for (std::size_t i = std::size(kRelations); i-- > 0;) {
-    if (comparison.substr(0, kRelations[i].size()) == kRelations[i]) {
-      relation_ = static_cast<Relation>(i);
-      length = kRelations[i].size();
-    }
+Condition::Condition(Field const& field, std::string_view comparison) : field_(field) {
+  std::string const whole = std::string(field.name).append(comparison);
+  auto const* const relation =
+      std::find_if(std::begin(kRelations), std::end(kRelations), [&](Relation const& candidate) {
+        return comparison.substr(0, candidate.sign.size()) == candidate.sign;
+      });
+  bool const isKnown = relation != std::end(kRelations);
+  std::string_view text = comparison.substr(isKnown ? relation->sign.size() : 0);
+  if (!isKnown || text.find_first_of(kSigns) == 0) {
+    refuse(whole, "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
   }
-  if (length == 0) {
-    refuse(std::string(field.name).append(comparison),
-           "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
+  text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));
+  if (text.empty()) {
+    refuse(whole, "lacks the value to compare with");
   }
-  comparison.remove_prefix(length);
-  if (!comparison.empty() &&
-      std::string_view(kSigns).find(comparison.front()) != std::string::npos) {
-    refuse(std::string(field.name).append(whole),
-           "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
+  isMet_ = relation->isMet;
+  wanted_ = comparable(field, std::visit(Parsed{text}, field.words));
+  if (std::holds_alternative<std::monostate>(wanted_)) {
+    refuse(text, std::string("is not ") + kTypes[field.words.index()]);
   }
-  comparison.remove_prefix(std::min(comparison.find_first_not_of(' '), comparison.size()));
-  if (comparison.empty()) {
-    refuse(std::string(field.name).append(whole), "lacks the value to compare with");
-  }
-  value_ = comparable(field, std::visit(Parsed{comparison}, field.words));
-  if (std::holds_alternative<std::monostate>(value_)) {
-    refuse(comparison, std::string("is not ") + kTypes[field.words.index()]);
-  }
-  if (relation_ == Relation::Contains && !std::holds_alternative<std::string>(value_)) {
+  if (isMet_ == containsText && !std::holds_alternative<std::string>(wanted_)) {
     refuse("~", "looks into texts; " + std::string(field.name) + " is not one");
   }
 }
 
 bool Condition::holds(Outcome const& outcome) const {
-  Value const exactValue = compared(field_, outcome);
-  if (isAbsent(exactValue)) {
-    return false;
-  }
-  Value const value = comparable(field_, exactValue);
-  switch (relation_) {
-    case Relation::AtLeast:
-      return value >= value_;
-    case Relation::AtMost:
-      return value <= value_;
-    case Relation::Unequal:
-      return value != value_;
-    case Relation::Equal:
-      return value == value_;
-    case Relation::More:
-      return value > value_;
-    case Relation::Less:
-      return value < value_;
-    default:
-      return std::get<std::string>(value).find(std::get<std::string>(value_)) != std::string::npos;
-  }
+  Value const value = compared(field_, outcome);
+  return !isAbsent(value) && isMet_(comparable(field_, value), wanted_);
 }
 
 }  // namespace app

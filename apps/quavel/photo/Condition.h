@@ -22,11 +22,9 @@ class Condition {
   bool holds(Outcome const& outcome) const;
 
  private:
-  enum class Relation { AtLeast, AtMost, Unequal, Equal, More, Less, Contains };
-
   Field const& field_;
-  Relation relation_;
-  Value value_;
+  bool (*isMet_)(Value const& value, Value const& wanted) = nullptr;
+  Value wanted_;
 };
 
 }  // namespace app

@@ -186,10 +186,4 @@ Value compared(Field const& field, Outcome const& outcome) {
 
 void appendExact(std::string& text, Value const& value) { std::visit(AppendExact{text}, value); }
 
-std::string exact(Value const& value) {
-  std::string text;
-  appendExact(text, value);
-  return text;
-}
-
 }  // namespace app

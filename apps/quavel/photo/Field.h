@@ -52,8 +52,6 @@ Value compared(Field const& field, Outcome const& outcome);
 /// Appends the value for programs: text as it is, digits that read back to the same number,
 /// "Infinity", "true". Nothing when absent.
 void appendExact(std::string& text, Value const& value);
-/// The same as a string of its own.
-std::string exact(Value const& value);
 
 }  // namespace app
 

@@ -75,21 +75,25 @@ bool isDate(std::string const& text) {
          text.rfind(' ') == 10 && day.tm_mday == time.tm_mday && time.tm_sec <= 60;
 }
 
-/// Fills the outcome with what `read` gives, unless there is a problem already.
+/// Fills the outcome with what `read` gives, unless there is a problem already or `read` sets one.
 template <class Read>
 void fill(Outcome& outcome, Detail detail, Read read) {
   if (outcome.problem) {
     return;
   }
-  QVJournal journal(detail);
-  outcome.record = read(journal);
-  if (!outcome.record) {
-    outcome.problem = reason::refusal(journal);
-  }
-  outcome.format = journal.format();
-  if (detail == Detail::All) {
-    outcome.notes = journal.notes();
-    outcome.furtherSteps = journal.furtherSteps();
+  try {
+    QVJournal journal(detail);
+    outcome.record = read(journal);
+    if (!outcome.record && !outcome.problem) {
+      outcome.problem = reason::refusal(journal);
+    }
+    outcome.format = journal.format();
+    if (detail == Detail::All) {
+      outcome.notes = journal.notes();
+      outcome.furtherSteps = journal.furtherSteps();
+    }
+  } catch (std::exception const& error) {
+    outcome.problem = reason::failure(error);
   }
 }
 
@@ -107,14 +111,8 @@ bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");
   // The library answers by making a record, too expensive for each name in a large folder.
   thread_local std::unordered_set<std::string> known;
-  if (known.count(extension) != 0) {
-    return true;
-  }
-  bool const isKnown = library.createMetadata(extension) != nullptr;
-  if (isKnown) {
-    known.insert(extension);
-  }
-  return isKnown;
+  return known.count(extension) != 0 ||
+         (library.createMetadata(extension) != nullptr && known.insert(extension).second);
 }
 
 std::string whyUnknown(std::string const& extension) {
@@ -133,11 +131,7 @@ Outcome readPhoto(Input input, Detail detail) {
   if (!input.isPhoto && !outcome.problem) {
     outcome.problem = whyUnfit(outcome.path);
   }
-  try {
-    fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });
-  } catch (std::exception const& error) {
-    outcome.problem = reason::failure(error);
-  }
+  fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });
   return outcome;
 }
 
@@ -155,14 +149,11 @@ void tidyDates(quavel::QVMetadata& record, bool asIso) {
 Outcome readStandardInput(std::string const& extension, Detail detail) {
   Outcome outcome;
   outcome.path = "-";
-  try {
+  fill(outcome, detail, [&](QVJournal& journal) {
     std::string bytes = readAll(outcome.problem);
     auto* const buffer = reinterpret_cast<unsigned char*>(bytes.data());
-    fill(outcome, detail,
-         [&](QVJournal& journal) { return journal.read(buffer, bytes.size(), extension); });
-  } catch (std::exception const& error) {
-    outcome.problem = reason::failure(error);
-  }
+    return outcome.problem ? nullptr : journal.read(buffer, bytes.size(), extension);
+  });
   return outcome;
 }
 

@@ -36,13 +36,6 @@ std::string named(char const* const (&names)[count], std::int32_t value, std::in
   return names[value - first];
 }
 
-void append(std::string& text, std::string const& part) {
-  if (!text.empty() && !part.empty()) {
-    text += ' ';
-  }
-  text += part;
-}
-
 }  // namespace
 
 std::string yesNo(bool value) { return value ? "yes" : "no"; }
@@ -104,18 +97,14 @@ std::string size(quavel::QVMetadata const& record) {
 }
 
 std::string exposure(quavel::QVMetadata const& record) {
+  std::string const parts[] = {
+      std::isnan(record.exposureTime) ? "" : exposureTime(record.exposureTime),
+      std::isnan(record.fNumber) ? "" : fNumber(record.fNumber),
+      record.iso == -1 ? "" : "ISO " + std::to_string(record.iso),
+      std::isnan(record.focalLength) ? "" : focalLength(record.focalLength)};
   std::string text;
-  if (!std::isnan(record.exposureTime)) {
-    append(text, exposureTime(record.exposureTime));
-  }
-  if (!std::isnan(record.fNumber)) {
-    append(text, fNumber(record.fNumber));
-  }
-  if (record.iso != -1) {
-    append(text, "ISO " + std::to_string(record.iso));
-  }
-  if (!std::isnan(record.focalLength)) {
-    append(text, focalLength(record.focalLength));
+  for (auto const& part : parts) {
+    text.append(text.empty() || part.empty() ? "" : " ").append(part);
   }
   return text;
 }
