@@ -8,8 +8,8 @@
 
 namespace quavel {
 
-/// A file, read through its descriptor: one system call for each operation, and no buffer. A seek
-/// past the end succeeds, and reads there deliver nothing; one to before the start is refused and
+/// A file, read through its descriptor without a buffer: each operation is one system call. A seek
+/// past the end succeeds, and reads there deliver nothing. A seek to before the start fails and
 /// leaves the position as it was.
 class QUAVEL_EXPORT QVFStream : public QVStream {
  public:

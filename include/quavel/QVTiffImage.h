@@ -12,9 +12,9 @@ class QUAVEL_EXPORT QVTiffImage : public QVMetadata {
  public:
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Orientation and date of the first directory. False: one of them is malformed.
+  /// Stores orientation and date of the first directory. False: one of them is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// Size of the full-size image. False: a side is malformed.
+  /// Stores the size of the full-size image. False: a side is malformed.
   bool storeInfoFromFullImageIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 
