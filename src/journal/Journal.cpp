@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 namespace {
 
-// Few enough for all notes to fit on a screen, whatever the file holds.
+// So few that all notes of any file fit on a screen.
 constexpr std::size_t kMaxSteps = 8;
 constexpr std::size_t kMaxHints = 8;
 
