@@ -14,8 +14,7 @@ namespace quavel {
 class QUAVEL_EXPORT QVCR3CMT1Box : public QVCR3Box {
  public:
   /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False: the
-  /// box is unreadable, malformed or of another type; the stream may then stand anywhere in it, its
-  /// `baseOffset` and `byteOrder` changed.
+  /// box is unreadable, malformed or of another type; the stream's state is then unspecified.
   bool read(std::shared_ptr<QVStream>& stream) override;
   /// Reads the payload. The stream's position and `baseOffset` must be at the payload's start.
   bool readExif(std::shared_ptr<QVStream>& stream);

@@ -14,9 +14,7 @@ namespace quavel {
 /// The box whose payload is a TIFF structure with the Exif directory.
 class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
  public:
-  /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False: the
-  /// box is unreadable, malformed or of another type; the stream may then stand anywhere in it, its
-  /// `baseOffset` and `byteOrder` changed.
+  /// Leaves the stream like `QVCR3CMT1Box::read`, and fails in the same cases.
   bool read(std::shared_ptr<QVStream>& stream) override;
   /// Reads the payload. The stream's position and `baseOffset` must be at the payload's start.
   bool readExif(std::shared_ptr<QVStream>& stream);

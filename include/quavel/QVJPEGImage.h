@@ -18,8 +18,8 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  public:
   /// Data that ends between two segments is not a failure: a truncated file gives what it has.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Takes the dates as the base class does, and the size if both sides exceed 500 pixels. False: a
-  /// date or a side is malformed.
+  /// Takes the dates, and the size if both sides exceed 500 pixels. False: one of them is
+  /// malformed.
   bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override;
 
   /// Reads the TIFF structure at the stream's position. That position becomes the stream's

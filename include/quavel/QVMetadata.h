@@ -36,9 +36,8 @@ class QUAVEL_EXPORT QVMetadata {
   std::int32_t height = -1;  ///< Of the full-size image, in pixels.
   /// TIFF Orientation as stored, even outside 1 to 8; 1 when a CR3's main directory has none.
   std::int32_t orientation = -1;
-  bool isRaw = false;  ///< The format is a camera's raw format.
-  /// When the photo was taken. Like all dates, the file's own text: by Exif, "YYYY:MM:DD HH:MM:SS".
-  std::string dateTimeOriginal;
+  bool isRaw = false;                 ///< The format is a camera's raw format.
+  std::string dateTimeOriginal;       ///< When it was taken. Exif dates are "YYYY:MM:DD HH:MM:SS".
   std::string dateTimeDigitized;      ///< When it was stored as digital data.
   std::string dateTime;               ///< When the file was last changed.
   bool hasShootingInfo = false;       ///< The fields from `lensModel` on were read, from a CR3.

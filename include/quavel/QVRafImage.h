@@ -6,9 +6,8 @@
 
 namespace quavel {
 
-/// Reads a RAF file: a fixed header, an embedded JPEG and a raw section. The JPEG's Exif segment
-/// and the raw section are TIFF structures. Gives the raw image's size, the orientation and the
-/// original date.
+/// Reads a RAF file, which holds a JPEG with an Exif segment and a raw section that is a TIFF
+/// structure. Gives the raw image's size, the orientation and the original date.
 class QUAVEL_EXPORT QVRafImage : public QVMetadata {
  public:
   /// Always sets `isRaw`. The stream's `baseOffset` must be 0, and is changed.

@@ -11,8 +11,8 @@
 namespace quavel {
 
 /// Wraps a stream on which each read is expensive, and reads it a block at a time. Most reads are
-/// then served from the first block, which is kept, or from the latest one. It seeks as in a file:
-/// past the end succeeds, to before the start fails and leaves the position as it was.
+/// then served from the first block, which is kept, or from the latest one. It seeks like a file:
+/// a seek past the end succeeds, one to before the start fails and does not move it.
 class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
  public:
   /// `source` must not be null, must be able to seek, and must not be used by anyone else from then

@@ -23,8 +23,7 @@ class QUAVEL_EXPORT QVReader {
   /// The text after the path's last ".", its case unchanged; empty when the path has no ".".
   std::string getPathExtension(std::string const& path) const;
 
-  /// A new record, to be filled by its `read`, for an extension in lower case; null when the
-  /// extension names no format.
+  /// A new record, without content yet, for an extension in lower case; null for an unknown one.
   std::shared_ptr<QVMetadata> createMetadata(std::string const& extension) const;
 
   /// The record; null: the extension names no format, or the data cannot be read as that format.

@@ -20,8 +20,7 @@ enum class ByteOrder : std::uint8_t {
 };
 
 /// A source of bytes with a current position. Offsets are counted from `baseOffset`, so that a
-/// structure inside a larger file can be read by the offsets it stores. Only one thread at a time
-/// may use a stream.
+/// structure inside a larger file can be read by the offsets it stores. Not thread-safe.
 class QUAVEL_EXPORT QVStream {
  public:
   /// Sets `hostOrder` to the machine's order, `byteOrder` to big-endian, `baseOffset` to 0.
@@ -57,8 +56,7 @@ class QUAVEL_EXPORT QVStream {
   /// @name Byte reversal in place
   /// @{
 
-  /// `swapS`, `swapL` and `swapLL` always reverse; the others do unless `hostOrder` is the order in
-  /// their name.
+  /// The first three always reverse; the others do unless `hostOrder` is the order in their name.
   void swapS(unsigned short* value) const;
   void swapL(unsigned int* value) const;
   void swapLL(unsigned long long* value) const;

@@ -9,8 +9,7 @@
 
 namespace quavel {
 
-/// The 8 bytes that open every TIFF structure (TIFF 6.0). They set the byte order of what
-/// follows.
+/// The first 8 bytes of a TIFF structure (TIFF 6.0), which state the byte order of all of it.
 class QUAVEL_EXPORT QVTiffHeader {
  public:
   QVTiffHeader();

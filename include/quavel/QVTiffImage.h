@@ -6,8 +6,7 @@
 
 namespace quavel {
 
-/// Reads a file that is a TIFF structure from its first byte. Gives the size, the orientation and
-/// the three dates.
+/// Reads a file that is a TIFF structure. Gives the size, the orientation and the three dates.
 class QUAVEL_EXPORT QVTiffImage : public QVMetadata {
  public:
   bool read(std::shared_ptr<QVStream>& stream) override;
