@@ -18,8 +18,7 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  public:
   /// Data that ends between two segments is not a failure: a truncated file gives what it has.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Takes the dates, and the size if both sides exceed 500 pixels. False: one of them is
-  /// malformed.
+  /// Takes the dates, and the size if both sides exceed 500 pixels. False: one is malformed.
   bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override;
 
   /// Reads the TIFF structure at the stream's position. That position becomes the stream's
@@ -27,7 +26,7 @@ class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
   bool readExifSegment(std::shared_ptr<QVStream>& stream);
   /// Stores the orientation of the first directory. False: it is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// @name Size by the Exif directory
+  /// @name Size from the Exif directory
   /// @{
 
   /// Stores the side, in pixels, from its TIFF tag or, without one, from its Exif tag; without

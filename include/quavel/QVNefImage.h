@@ -13,7 +13,7 @@ class QUAVEL_EXPORT QVNefImage : public QVMetadata {
   /// Always sets `isRaw`.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Stores the first directory's orientation. False: it is malformed, or the size not 160 x 120.
+  /// Stores the directory's orientation. False: it is malformed, or the size is not 160 x 120.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
   /// Stores the size of the raw image. False: a side or NewSubfileType is absent or malformed, or
   /// the directory describes a reduced image.

@@ -10,7 +10,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD whose NewSubfileType marks no reduced image; null if none does, or on failure.
+/// The first SubIFD that has NewSubfileType and is not reduced; null without one, or on failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);

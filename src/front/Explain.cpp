@@ -12,7 +12,7 @@ namespace quavel::detail {
 
 namespace {
 
-constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
+constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
 /// A field that can be absent.
 struct FieldRow {
@@ -24,10 +24,10 @@ struct FieldRow {
 
 using M = QVMetadata;
 constexpr FieldRow kFields[] = {
-    {"width", 0, kAll, &M::width},
-    {"height", 0, kAll, &M::height},
-    {"orientation", 0, kAll, &M::orientation},
-    {"dateTimeOriginal", 0, kAll & ~kCr3, &M::dateTimeOriginal},
+    {"width", 0, kAllFamilies, &M::width},
+    {"height", 0, kAllFamilies, &M::height},
+    {"orientation", 0, kAllFamilies, &M::orientation},
+    {"dateTimeOriginal", 0, kAllFamilies & ~kCr3, &M::dateTimeOriginal},
     {"dateTimeDigitized", 0, kTiff, &M::dateTimeDigitized},
     {"dateTime", 0, kTiff | kCr3, &M::dateTime},
     {"model", 0, kCr3, &M::model},
