@@ -14,12 +14,13 @@ namespace app {
 
 namespace {
 
-// In the order of Relation; the longer ones come first. "=" is accepted for "==".
+// In the order of Relation. "=" is accepted for "==".
 constexpr std::string_view kRelations[] = {">=", "<=", "!=", "==", ">", "<", "~"};
+// By the index of the type in Words.
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// The text as a value of a field's type; absent when it is not one as a whole.
+/// The whole text as a value of a field's type; absent when it is not such a value.
 struct Parsed {
   std::string_view text;
 
@@ -34,7 +35,7 @@ struct Parsed {
       auto const* const end = text.data() + text.size();
       auto const result = std::from_chars(text.data(), end, value);
       bool const isWhole = result.ec == std::errc() && result.ptr == end;
-      return isWhole && value == value ? Value(value) : Value();  // NaN equals nothing
+      return isWhole && value == value ? Value(value) : Value();  // NaN is not equal to itself
     }
   }
 };
@@ -44,9 +45,8 @@ Value comparable(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
   auto const* const words = std::get_if<std::string (*)(std::string const&)>(&field.words);
   if (text != nullptr && words != nullptr && *words == words::date) {
-    for (char& c : *text) {
-      c = c == ':' ? '-' : c == 'T' ? ' ' : c;
-    }
+    std::replace(text->begin(), text->end(), ':', '-');
+    std::replace(text->begin(), text->end(), 'T', ' ');
   }
   return value;
 }
@@ -61,6 +61,7 @@ Condition::Condition(Field const& field, std::string_view comparison)
     : field_(field), relation_(Relation::Equal) {
   std::string_view const whole = comparison;
   std::size_t length = comparison.substr(0, 1) == "=" ? 1 : 0;
+  // From the last to the first, so that ">=" replaces ">" when both match.
   for (std::size_t i = std::size(kRelations); i-- > 0;) {
     if (comparison.substr(0, kRelations[i].size()) == kRelations[i]) {
       relation_ = static_cast<Relation>(i);
@@ -109,7 +110,7 @@ bool Condition::holds(Outcome const& outcome) const {
       return value > value_;
     case Relation::Less:
       return value < value_;
-    default:
+    default:  // Contains
       return std::get<std::string>(value).find(std::get<std::string>(value_)) != std::string::npos;
   }
 }
