@@ -24,7 +24,7 @@ std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::i
 std::int64_t position(int fd);
 std::int64_t seek(int fd, std::int64_t position);
 std::int64_t size(int fd);
-inline void expectFewReads(int /*fd*/) {}
+inline void expectFewReads(int /*fd*/) {}  // Windows takes no such advice
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 
 #else

@@ -57,7 +57,7 @@ class EntryWalk {
   std::int64_t end() const { return offset() + kStep * left_; }
 
  private:
-  static constexpr std::int64_t kStep = kEntrySize;
+  static constexpr std::int64_t kStep = kEntrySize;  // signed, as offsets are
 
   std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
