@@ -56,12 +56,10 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // Go to the next entry first: if the stream refuses the seek to the values, they are read
-    // there.
+    // Go to the next entry first: a stream that refuses the seek to the values then reads there.
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
-                       // The text needs no more of the row than its tag and position.
                        PlacedEntry{*this, Row{tag, 0, 0, walk.position(), 0, 0}});
     }
     if (!readEntry(stream, tag, walk.position(), entry)) {

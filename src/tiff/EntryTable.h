@@ -105,7 +105,7 @@ struct PlacedDirectory {
 };
 void append(std::string& out, PlacedDirectory directory);
 
-/// An entry in a note: "0x0132 DateTime at 0xe6 (230) in IFD0".
+/// An entry in a note, by the row's tag and position: "0x0132 DateTime at 0xe6 (230) in IFD0".
 struct PlacedEntry {
   EntryTable const& table;
   EntryTable::Row row;
