@@ -108,6 +108,7 @@ void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
 }
 
 bool Reading::refuseWork(Work work) const {
+  // In the order of the enumerators.
   static constexpr char const* kPatterns[] = {
       "the file makes the reader open more than {} directories",
       "the file makes the reader walk over more than {} directory entries",

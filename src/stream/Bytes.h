@@ -52,8 +52,7 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// The sum and the difference of positions. Out of range, they wrap around instead of being
-/// undefined.
+/// The sum and the difference of positions, which wrap around where signed ones are undefined.
 inline std::int64_t wrappingSum(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
 }

@@ -46,6 +46,7 @@ std::int32_t quotient(SRational const& fraction) {
   return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
 }
 
+/// The number truncated toward zero; saturates at the limits of the type, 0 for NaN.
 template <class Integer>
 Integer truncated(double number) {
   if (std::isnan(number)) {
@@ -131,7 +132,7 @@ Float toFloat(EntryValue const& value) {
   });
 }
 
-/// For all integer accessors but `longValue`.
+/// The value for all integer accessors but `longValue`: its floats saturate at other limits.
 std::uint32_t bitsOf(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace

@@ -47,7 +47,8 @@ void append(std::string& out, DirectoryName const& directory) {
 
 char const* fieldOf(unsigned short tag) {
   auto const* const row = known(tag);
-  return row == nullptr || row->field[0] == '\0' ? nullptr : row->field;
+  bool const hasField = row != nullptr && row->field[0] != '\0';
+  return hasField ? row->field : nullptr;
 }
 
 }  // namespace quavel::detail
