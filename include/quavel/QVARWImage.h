@@ -9,13 +9,13 @@ namespace quavel {
 /// Reads an ARW file. Gives the raw image's size, the orientation and the original date.
 class QUAVEL_EXPORT QVARWImage : public QVMetadata {
  public:
-  /// Sets `isRaw` whatever the outcome.
+  /// Always sets `isRaw`.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Orientation of the first directory. False: it is malformed.
+  /// Stores the orientation of the first directory. False: it is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// Size of the raw image. False: a side is absent or malformed, or the directory describes a
-  /// reduced image.
+  /// Stores the size of the raw image. False: a side or NewSubfileType is absent or malformed, or
+  /// the directory describes a reduced image.
   bool storeInfoFromSubIFD0(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 

@@ -12,7 +12,8 @@ namespace quavel {
 /// The compact header of an ISO base media file's box (ISO/IEC 14496-12).
 class QUAVEL_EXPORT QVCR3BoxHeader {
  public:
-  /// Reads the 8 bytes at the stream's position. False: the data ends within them.
+  /// Reads the 8 bytes at the stream's position in its `byteOrder`, which must be big-endian.
+  /// False: the data ends within them; `boxSize` may already have changed.
   bool read(std::shared_ptr<QVStream>& stream);
 
   unsigned int size() const;  ///< `boxSize`

@@ -13,20 +13,20 @@ namespace quavel {
 /// The box whose payload is a TIFF structure with the image's main directory.
 class QUAVEL_EXPORT QVCR3CMT1Box : public QVCR3Box {
  public:
-  /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False:
-  /// another type of box, or a malformed payload; the stream is then left within it.
+  /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False: the
+  /// box is unreadable, malformed or of another type; the stream's state is then unspecified.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Reads the payload with the stream at its TIFF header and `baseOffset` there.
+  /// Reads the payload. The stream's position and `baseOffset` must be at the payload's start.
   bool readExif(std::shared_ptr<QVStream>& stream);
-  /// Fills the orientation, the date, the size and the model, up to the first malformed one.
+  /// Stores orientation, date, size and model. False: one is malformed; those after it stay unset.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
   std::int32_t width = -1;        ///< Pixels.
   std::int32_t height = -1;       ///< Pixels.
-  std::int32_t orientation = 1;   ///< Upright when the file does not say.
-  std::string dateTimeOriginal;   ///< Always empty: the main directory has none.
-  std::string dateTimeDigitized;  ///< Always empty: the main directory has none.
-  std::string dateTime;           ///< When the file was changed last.
+  std::int32_t orientation = 1;   ///< 1 (upright) when the file gives none.
+  std::string dateTimeOriginal;   ///< Always empty: not in the main directory.
+  std::string dateTimeDigitized;  ///< Always empty: not in the main directory.
+  std::string dateTime;           ///< When the file was last changed.
   std::string model;              ///< Of the camera.
 };
 

@@ -11,22 +11,20 @@
 
 namespace quavel {
 
-/// The box whose payload is a TIFF structure with the Exif directory. Units and absence are those
-/// of the record's fields of the same names.
+/// The box whose payload is a TIFF structure with the Exif directory.
 class QUAVEL_EXPORT QVCR3CMT2Box : public QVCR3Box {
  public:
-  /// True: the stream stands after the box, its `baseOffset` and `byteOrder` as before. False:
-  /// another type of box, or a malformed payload; the stream is then left within it.
+  /// Leaves the stream like `QVCR3CMT1Box::read`, and fails in the same cases.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Reads the payload with the stream at its TIFF header and `baseOffset` there.
+  /// Reads the payload. The stream's position and `baseOffset` must be at the payload's start.
   bool readExif(std::shared_ptr<QVStream>& stream);
-  /// Fills the fields below from the lens to the f-number, up to the first malformed one.
+  /// Stores the fields below. False: one of them is malformed; others may be stored already.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
   /// @name The record's fields of the same names
   /// @{
 
-  /// Unit and absence as in QVMetadata.
+  /// In the units of QVMetadata; the value that means absence is the same too.
   std::int32_t iso = -1;
   std::string lensModel;
   float apexFNumber = std::nanf("");

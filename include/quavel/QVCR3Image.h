@@ -11,7 +11,7 @@ namespace quavel {
 /// camera, the lens and the exposure.
 class QUAVEL_EXPORT QVCR3Image : public QVMetadata {
  public:
-  /// Sets `isRaw` whatever the outcome; all other fields only when the whole read succeeds.
+  /// Always sets `isRaw`; sets the other fields only when the whole read succeeds.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
  private:

@@ -7,10 +7,10 @@
 
 namespace quavel {
 
-/// The `moov` box, walked for its `uuid` children.
+/// The `moov` box, of which the `uuid` children are read.
 class QUAVEL_EXPORT QVCR3MoovBox : public QVCR3Box {
  public:
-  /// False: another type of box, or a child that cannot be read.
+  /// False: the box is of another type, or its header or a child cannot be read.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
   /// The last `uuid` child, whatever its identifier; or null.

@@ -8,9 +8,8 @@
 
 namespace quavel {
 
-/// A file, read through its descriptor: one system call for each operation, and no buffer. A seek
-/// past the end succeeds, and reads there deliver nothing; one to before the start is refused and
-/// leaves the position as it was.
+/// A file, read through its descriptor without a buffer: each operation is one system call. Reads
+/// past the end deliver nothing; a seek to before the start fails and does not move it.
 class QUAVEL_EXPORT QVFStream : public QVStream {
  public:
   /// Opens the file read-only. When that fails, the stream is empty and `errno` says why.

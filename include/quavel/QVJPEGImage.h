@@ -16,26 +16,26 @@ class Journal;
 /// size, the orientation and the original date.
 class QUAVEL_EXPORT QVJPEGImage : public QVMetadata {
  public:
-  /// Running out of data between two segments is not a failure: a cut file gives what came before.
+  /// Data that ends between two segments is not a failure: a truncated file gives what it has.
   bool read(std::shared_ptr<QVStream>& stream) override;
-  /// Takes the dates as the base does, and the size when both sides exceed 500 pixels.
+  /// Takes the dates, and the size if both sides exceed 500 pixels. False: one is malformed.
   bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) override;
 
-  /// Reads the TIFF structure that begins at the stream's position, which becomes the stream's
-  /// `baseOffset`; its byte order becomes the stream's.
+  /// Reads the TIFF structure at the stream's position. That position becomes the stream's
+  /// `baseOffset`, and the structure's byte order its `byteOrder`; both stay so.
   bool readExifSegment(std::shared_ptr<QVStream>& stream);
-  /// Orientation of the first directory. False: it is malformed.
+  /// Stores the orientation of the first directory. False: it is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// @name Size by the Exif directory
+  /// @name Size from the Exif directory
   /// @{
 
-  /// The side in pixels by its TIFF tag, else by its Exif tag; unchanged when both are absent.
-  /// False: the tag that counts is malformed.
+  /// Stores the side, in pixels, from its TIFF tag or, without one, from its Exif tag; without
+  /// either, `side` is unchanged. False: that entry is malformed.
   bool readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side);
   bool readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side);
   /// @}
 
-  /// Markers after which the walk goes on without reading a length: how many bytes further.
+  /// Markers after which no length is read, each with the number of bytes to skip after it.
   static std::map<std::uint16_t, std::uint16_t> const markerSkipLengths;
 
  private:

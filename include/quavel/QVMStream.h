@@ -6,11 +6,11 @@
 
 namespace quavel {
 
-/// Memory that the caller owns, read in place. A seek to anywhere outside ends at `length`, where
-/// reads deliver nothing.
+/// Memory that the caller owns, read in place. A seek to before its start or past its end goes to
+/// the end, where reads deliver nothing.
 class QUAVEL_EXPORT QVMStream : public QVStream {
  public:
-  /// Reads `count` bytes at `bytes`, which it borrows.
+  /// A stream of the `count` bytes at `bytes`, which it borrows.
   QVMStream(unsigned char* bytes, unsigned long const& count);
 
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;

@@ -12,40 +12,40 @@
 
 namespace quavel {
 
-/// What a file tells about its image, and the base of the format readers that fill it. A field
-/// that the file does not give keeps its initial value: -1, NaN, the empty string or false. Texts
-/// are the file's own bytes up to the first NUL; tags are those of TIFF 6.0 and Exif.
+/// The metadata of one image file, and the base class of the format readers, which fill it in. A
+/// field that the file does not give keeps its initial value: -1, NaN, the empty string or false.
+/// Texts are the file's own bytes up to the first NUL. Tags are those of TIFF 6.0 and Exif.
 class QUAVEL_EXPORT QVMetadata {
  public:
   QVMetadata();
   virtual ~QVMetadata();
 
-  /// Fills the record from a file, or a structure laid out like one, that begins at the stream's
-  /// position. Meant to be called once. False: the data is not a whole file of the format; fields
-  /// stored by then keep their values.
+  /// Fills the record from the file, or the structure laid out like one, that begins at offset 0 of
+  /// the stream, where the stream must stand. Meant to be called once. False: the data cannot be
+  /// read as this format; fields that were filled before the failure keep their values.
   virtual bool read(std::shared_ptr<QVStream>& stream) = 0;
 
-  /// Takes the dates from an Exif directory, which an override may keep, whole or in part. False: a
-  /// date is present but is not ASCII text.
+  /// Takes the dates from an Exif directory. An override may keep the directory or any part of it.
+  /// False: a date is present but is not ASCII text.
   virtual bool storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 
-  /// The best date known: the original one, else the digitized one, else the file's.
+  /// The best date known: the original one, else the digitized one, else the file's; or empty.
   std::string captureDate() const;
 
   std::int32_t width = -1;   ///< Of the full-size image, in pixels.
   std::int32_t height = -1;  ///< Of the full-size image, in pixels.
-  /// TIFF Orientation, unchecked; a CR3's main directory without one gives 1.
+  /// TIFF Orientation as stored, even outside 1 to 8; 1 when a CR3's main directory has none.
   std::int32_t orientation = -1;
   bool isRaw = false;                 ///< The format is a camera's raw format.
-  std::string dateTimeOriginal;       ///< "YYYY:MM:DD HH:MM:SS" in well-made files, like all dates.
-  std::string dateTimeDigitized;      ///< When the image was stored.
-  std::string dateTime;               ///< When the file was changed last.
-  bool hasShootingInfo = false;       ///< The fields from `lensModel` on were looked for: CR3 only.
+  std::string dateTimeOriginal;       ///< When it was taken. Exif dates are "YYYY:MM:DD HH:MM:SS".
+  std::string dateTimeDigitized;      ///< When it was stored as digital data.
+  std::string dateTime;               ///< When the file was last changed.
+  bool hasShootingInfo = false;       ///< The fields from `lensModel` on were read, from a CR3.
   std::string model;                  ///< Of the camera.
   std::string lensModel;              ///< Exif LensModel.
-  std::int32_t iso = -1;              ///< ISOSpeedRatings
-  float apexFNumber = std::nanf("");  ///< The f-number equal to ApertureValue.
-  float apexExposureTime = std::nanf("");   ///< Seconds, equal to ShutterSpeedValue.
+  std::int32_t iso = -1;              ///< Exif ISOSpeedRatings.
+  float apexFNumber = std::nanf("");  ///< F-number computed from `apertureValue`.
+  float apexExposureTime = std::nanf("");   ///< Seconds, computed from `shutterSpeedValue`.
   float apertureValue = std::nanf("");      ///< APEX units.
   float shutterSpeedValue = std::nanf("");  ///< APEX units.
   float focalLength = std::nanf("");        ///< Millimetres.

@@ -6,17 +6,17 @@
 
 namespace quavel {
 
-/// Reads a NEF file, known by its 160 x 120 thumbnail. Gives the raw image's size, the orientation
-/// and the original date.
+/// Reads a NEF file, recognised by its 160 x 120 thumbnail. Gives the raw image's size, the
+/// orientation and the original date.
 class QUAVEL_EXPORT QVNefImage : public QVMetadata {
  public:
-  /// Sets `isRaw` whatever the outcome.
+  /// Always sets `isRaw`.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Orientation of the first directory. False: it is malformed, or the size is not 160 x 120.
+  /// Stores the directory's orientation. False: it is malformed, or the size is not 160 x 120.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// Size of the raw image. False: a side is absent or malformed, or the directory describes a
-  /// reduced image.
+  /// Stores the size of the raw image. False: a side or NewSubfileType is absent or malformed, or
+  /// the directory describes a reduced image.
   bool storeInfoFromSubIFD1(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 

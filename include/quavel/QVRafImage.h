@@ -6,21 +6,20 @@
 
 namespace quavel {
 
-/// Reads a RAF file: a fixed header, a JPEG image with its Exif segment, and a raw section, each
-/// of the last two with a TIFF structure of its own. Gives the raw image's size, the orientation
-/// and the original date.
+/// Reads a RAF file, which holds a JPEG with an Exif segment and a raw section that is a TIFF
+/// structure. Gives the raw image's size, the orientation and the original date.
 class QUAVEL_EXPORT QVRafImage : public QVMetadata {
  public:
-  /// Sets `isRaw` whatever the outcome.
+  /// Always sets `isRaw`. The stream's `baseOffset` must be 0, and is changed.
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Reads the JPEG image's TIFF structure, with the stream at its header and `baseOffset` there.
+  /// Reads the JPEG's TIFF structure. The stream's position and `baseOffset` must be at its start.
   bool readMainIFD(std::shared_ptr<QVStream>& stream);
-  /// Reads the raw section's TIFF structure, with the stream at its header and `baseOffset` there.
+  /// Reads the raw section. The stream's position and `baseOffset` must be at its start.
   bool readFujiIFD(std::shared_ptr<QVStream>& stream);
-  /// Size and orientation, where the directory holds them. False: one of them is malformed.
+  /// Stores size and orientation, if the directory has them. False: one of them is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// Size of the raw image, by the vendor's tags. False: a side is malformed.
+  /// Stores the size of the raw image from the vendor's tags. False: a side is malformed.
   bool storeInfoFromFujiTagsIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 

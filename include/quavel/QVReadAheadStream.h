@@ -10,24 +10,23 @@
 
 namespace quavel {
 
-/// Wraps a stream whose every request is expensive and reads it a block at a time: the many small
-/// reads of a reader are served from the first block, which is kept, and from the latest one. Ends
-/// and seeks like a file: a seek past the end succeeds, one to before the start is refused.
+/// Wraps a stream on which each read is expensive, and reads it a block at a time. Most reads are
+/// then served from the first block, which is kept, or from the latest one. It seeks like a file:
+/// a seek past the end succeeds, one to before the start fails and does not move it.
 class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
  public:
-  /// Position 0 is the source's offset 0. The source is not null and can seek; nobody else may use
-  /// it from then on. The first block is `firstBlockSize` bytes long, each later one
-  /// `nextBlockSize`, or the larger of the two where it continues the block before; 0 counts as 1.
-  /// Takes memory for two blocks of the larger size.
+  /// `source` must not be null, must be able to seek, and must not be used by anyone else from then
+  /// on. Its offset 0 is position 0 of this stream. The first block has `firstBlockSize` bytes, a
+  /// later one `nextBlockSize`, or the larger of the two when it directly follows the source's last
+  /// read; 0 counts as 1. Memory is taken for the first block and for one of the larger size.
   QVReadAheadStream(std::shared_ptr<QVStream> source, std::size_t firstBlockSize,
                     std::size_t nextBlockSize);
   ~QVReadAheadStream() override;
   QVReadAheadStream(QVReadAheadStream const&) = delete;
   QVReadAheadStream& operator=(QVReadAheadStream const&) = delete;
 
-  /// Fewer bytes than asked for: the source delivered no more, or failed. When a block cannot be
-  /// read, only the bytes that are needed are tried once more. What the source throws passes
-  /// through.
+  /// Delivers fewer bytes than asked for when the source ends or fails. When a block cannot be
+  /// read, a second attempt asks for the needed bytes only. Exceptions of the source pass through.
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;
   long getOffset() override;
   void setOffset(long const& offset) override;

@@ -19,29 +19,29 @@ enum class ByteOrder : std::uint8_t {
   LittleEndian = 1,  ///< TIFF "II"
 };
 
-/// A source of bytes with a current position. Positions are counted from `baseOffset`, so that a
-/// structure inside a larger file is read with the offsets it stores. One thread at a time.
+/// A source of bytes with a current position. Offsets are counted from `baseOffset`, so that a
+/// structure inside a larger file can be read by the offsets it stores. Not thread-safe.
 class QUAVEL_EXPORT QVStream {
  public:
-  /// `hostOrder` is the machine's, `byteOrder` big-endian, `baseOffset` 0.
+  /// Sets `hostOrder` to the machine's order, `byteOrder` to big-endian, `baseOffset` to 0.
   QVStream();
   virtual ~QVStream();
 
-  /// Copies up to `count` bytes to `destination`, advances by the number delivered and returns
-  /// it: fewer than `count` at the end of the data, 0 or -1 when nothing can be read.
+  /// Copies up to `count` bytes to `destination` and advances by the number copied, which it
+  /// returns: less than `count` at the end of the data, 0 or -1 when nothing can be read.
   virtual std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) = 0;
   /// The current position minus `baseOffset`.
   virtual long getOffset() = 0;
   /// Moves to `baseOffset` plus `offset`. Reports nothing: a failure shows at the next read.
   virtual void setOffset(long const& offset) = 0;
 
-  ByteOrder hostBytesOrder() const;  ///< The machine's, whatever `hostOrder` says.
+  ByteOrder hostBytesOrder() const;  ///< The machine's order, whatever `hostOrder` says.
 
   /// @name Typed reads
   /// @{
 
-  /// One `readBuffer` each, at the current position; numbers come in `byteOrder` and arrive in the
-  /// host's. True: all bytes were delivered. False: the destination holds nothing of use.
+  /// Each calls `readBuffer` once and converts the number from `byteOrder` to `hostOrder`. True:
+  /// all bytes were delivered. False: what the destination holds is unspecified.
   bool readChar(char* destination);
   bool readByte(unsigned char* destination);
   bool readSByte(signed char* destination);
@@ -56,7 +56,7 @@ class QUAVEL_EXPORT QVStream {
   /// @name Byte reversal in place
   /// @{
 
-  /// Always, or only on a host of the other byte order, as the name says.
+  /// The first three always reverse; the others do unless `hostOrder` is the order in their name.
   void swapS(unsigned short* value) const;
   void swapL(unsigned int* value) const;
   void swapLL(unsigned long long* value) const;
@@ -69,13 +69,13 @@ class QUAVEL_EXPORT QVStream {
   /// @}
 
   ByteOrder hostOrder;          ///< Of the machine the library runs on.
-  ByteOrder byteOrder;          ///< Of the data being read; any other value: never reversed.
+  ByteOrder byteOrder;          ///< Of the data being read; any other value: no conversion.
   std::int64_t baseOffset = 0;  ///< Absolute position, in bytes, that offset 0 stands for.
 
  private:
   friend class detail::ReadScope;
 
-  /// The read that this stream serves, if any. A copy of the stream serves none.
+  /// The read that this stream serves, if any. Not copied: a read belongs to one stream.
   struct CurrentReading {
     CurrentReading() = default;
     CurrentReading(CurrentReading const& /*other*/) {}

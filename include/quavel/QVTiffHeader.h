@@ -9,14 +9,14 @@
 
 namespace quavel {
 
-/// The 8 bytes that open every TIFF structure (TIFF 6.0). Decides the byte order of all later
-/// reads.
+/// The first 8 bytes of a TIFF structure (TIFF 6.0), which state the byte order of all of it.
 class QUAVEL_EXPORT QVTiffHeader {
  public:
   QVTiffHeader();
 
-  /// Reads at the stream's position. True: the stream stands right after the header and its
-  /// `byteOrder` is set. False: it may stand within it, and `byteOrder` may already have changed.
+  /// Reads the header at the stream's position. True: the stream stands right after the header, and
+  /// its `byteOrder` is set. False: the data ends too early, the header has no byte-order mark, or
+  /// its magic is not `expectedMagic` (TIFF: 42); `byteOrder` may already have changed.
   bool read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic);
 
   std::uint32_t firstIFDOffset = 0;  ///< Counted from the header's first byte.

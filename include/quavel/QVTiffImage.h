@@ -6,15 +6,14 @@
 
 namespace quavel {
 
-/// Reads a file that is a TIFF structure from its first byte. Gives the size, the orientation and
-/// the three dates.
+/// Reads a file that is a TIFF structure. Gives the size, the orientation and the three dates.
 class QUAVEL_EXPORT QVTiffImage : public QVMetadata {
  public:
   bool read(std::shared_ptr<QVStream>& stream) override;
 
-  /// Orientation and date of the first directory. False: one of them is malformed.
+  /// Stores orientation and date of the first directory. False: one of them is malformed.
   bool storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
-  /// Size of the full-size image. False: a side is malformed.
+  /// Stores the size of the full-size image. False: a side is malformed.
   bool storeInfoFromFullImageIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd);
 };
 

@@ -21,24 +21,24 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
  public:
   QVTiffImageFileDirectory();
 
-  /// Reads the directory at the stream's position, parsing only the listed tags, and only until
-  /// each has been met once; an empty list wants every entry. Of a repeated tag the first entry
-  /// counts. False: the entry count, a tag, a wanted entry or the next directory's offset cannot be
-  /// read; only in the last case are the new `entries` kept. False too: the entries parsed hold
-  /// more than 1048576 values, which the tags of no reader can.
+  /// Reads the directory at the stream's position. Only the listed tags are wanted, and the search
+  /// stops once each has been met; an empty list wants every entry. Of a repeated tag the first
+  /// entry is kept. False: the entry count, a tag, a wanted entry or the next directory's offset
+  /// cannot be read, or a limit is exceeded, such as 1048576 values in all. `entries` then stay as
+  /// they were, unless all but the offset could be read; `nextIFDOffset` is unchanged.
   bool read(std::shared_ptr<QVStream>& stream, std::vector<unsigned short> const& tags);
 
   /// The entry kept for `tag`, or null.
   std::shared_ptr<QVTiffImageFileDirectoryEntry> entryForTag(unsigned short const& tag) const;
 
-  std::uint32_t nextIFDOffset = 0;  ///< From the TIFF header; 0: this is the last directory.
-  /// Null until a `read` has walked the entries; replaced by each that does.
+  std::uint32_t nextIFDOffset = 0;  ///< Counted from the TIFF header; 0: this is the last one.
+  /// The entries kept, by tag; null before the first `read` that could read them.
   std::shared_ptr<std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>> entries;
 
  private:
   friend class detail::ReaderDirectory;
 
-  detail::ReaderDirectory const* ofReader = nullptr;  // this object, when it is one
+  detail::ReaderDirectory const* ofReader = nullptr;  // this, if it is a ReaderDirectory
 };
 
 }  // namespace quavel

@@ -17,19 +17,18 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntry {
  public:
   QVTiffImageFileDirectoryEntry();
 
-  /// Reads the entry with the stream right after its tag, wherever its values lie. The stream is
-  /// left where the last value ends. False: the data ends too early, the field type is unknown, or
-  /// more than 65536 values are declared; `values` is then unchanged.
+  /// Reads the entry whose tag ends at the stream's position, and its values, in the entry or
+  /// elsewhere. The stream is left where the last value ends. False: the data ends too early, the
+  /// field type is unknown, or more than 65536 values are declared; `values` is then unchanged.
   bool read(std::shared_ptr<QVStream>& stream);
 
-  /// The ASCII values up to the first NUL, untrimmed. False: a value of another type is
-  /// among them; `out` holds the text before it. An entry without values gives the empty string and
-  /// true.
+  /// Stores the ASCII values up to the first NUL, untrimmed; without values, the empty string.
+  /// False: a value before that NUL is of another type; `out` holds the text before it.
   bool convertToString(std::string& out) const;
 
   /// All values in file order; null for an UNDEFINED entry and before a `read`.
   std::shared_ptr<std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>> values;
-  /// The bytes of an UNDEFINED entry of up to 4; else null.
+  /// The bytes of an UNDEFINED entry that has at most 4; else null.
   std::shared_ptr<std::vector<std::uint8_t>> bytes;
   /// Where the bytes of a longer UNDEFINED entry lie, counted from the TIFF header; else 0.
   std::uint32_t dataOffset = 0;

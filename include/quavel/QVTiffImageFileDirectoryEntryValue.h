@@ -10,7 +10,7 @@
 
 namespace quavel {
 
-/// The TIFF 6.0 field types: a type's code in the file, less one.
+/// The TIFF 6.0 field types. Each enumerator is the type's code in the file minus 1.
 enum class EntryValueType : std::uint8_t {
   BYTE = 0,
   ASCII = 1,
@@ -26,8 +26,8 @@ enum class EntryValueType : std::uint8_t {
   DOUBLE = 11,
 };
 
-/// Field types by their code in the file. Code 13 (IFD) is an ordinary LONG. An entry refuses code
-/// 0 and the codes from 14 on, and keeps the bytes of code 7 apart.
+/// Field types by their code in the file. Code 13 (IFD) is read as a LONG. An entry with code 0 or
+/// one above 13 cannot be read; one with code 7 (UNDEFINED) has bytes instead of values.
 inline constexpr std::array<EntryValueType, 14> fieldTypeToValueType = {
     EntryValueType::UNDEFINED, EntryValueType::BYTE,      EntryValueType::ASCII,
     EntryValueType::SHORT,     EntryValueType::LONG,      EntryValueType::RATIONAL,
@@ -48,14 +48,14 @@ struct SRational {
   std::int32_t denominator;  ///< As stored.
 };
 
-/// One value of a directory entry. Every accessor answers for every type; a type that it cannot
-/// convert, UNDEFINED among them, gives zero.
+/// One value of a directory entry. Any accessor may be called for any type; it gives zero for a
+/// type that it cannot convert, such as UNDEFINED.
 class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
  public:
   QVTiffImageFileDirectoryEntryValue() = default;
 
   /// Reads one value of the type set in `type` at the stream's position, in its `byteOrder`.
-  /// False: the data ended, or the type holds no values; `value` is then to be taken as unset.
+  /// False: the data ended, or `type` is UNDEFINED or unknown; `value` is then unspecified.
   bool read(std::shared_ptr<QVStream>& stream);
 
   /// Bytes that one value takes in a file; 0 for UNDEFINED and for an unknown type.
@@ -64,9 +64,9 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @name As an integer
   /// @{
 
-  /// The stored integer widened to 32 bits by its own sign, then cut to the result's width.
-  /// Fractions and floats are truncated toward zero first; a fraction over 0 and a NaN give 0.
-  /// Floats saturate at the limits of int32, those of uint32 for `longValue`.
+  /// The stored integer is sign- or zero-extended to 32 bits, as its type requires, then truncated
+  /// to the result's width. Fractions and floats are first truncated toward zero; a NaN or a
+  /// denominator of 0 gives 0. Floats saturate at the limits of int32; for `longValue`, of uint32.
   char charValue() const;
   std::uint8_t byteValue() const;
   std::int8_t sbyteValue() const;
@@ -79,7 +79,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @name As a floating-point number
   /// @{
 
-  /// Fractions are divided in the result's precision; one over 0 gives an infinity or NaN.
+  /// Fractions are divided in the result's precision; a denominator of 0 gives an infinity or NaN.
   float floatValue() const;
   double doubleValue() const;
   /// @}
@@ -87,13 +87,13 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @name As stored
   /// @{
 
-  /// The pair of a RATIONAL and of an SRATIONAL; any other type gives 0/0.
+  /// The fraction of a RATIONAL or of an SRATIONAL, respectively; any other type gives 0/0.
   Rational rationalValue() const;
   SRational sRationalValue() const;
   /// @}
 
   EntryValueType type = EntryValueType::UNDEFINED;  ///< Of the value held or to be read.
-  /// In host byte order, left-justified; a fraction's numerator first.
+  /// In host byte order, from the first byte on; of a fraction, the numerator comes first.
   std::uint8_t value[8] = {};
 };
 

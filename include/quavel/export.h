@@ -1,18 +1,18 @@
 #ifndef QUAVEL_EXPORT_H
 #define QUAVEL_EXPORT_H
 
-/// Marks what the shared library shows to its users. A static build, and whoever uses it, defines
-/// QUAVEL_STATIC_DEFINE. A shown class hides its private members with QUAVEL_NO_EXPORT.
+/// QUAVEL_EXPORT exports a class from the shared library; QUAVEL_NO_EXPORT keeps a private member
+/// of such a class out. A static build defines QUAVEL_STATIC_DEFINE, and so do its users.
 #if defined(QUAVEL_STATIC_DEFINE)
 #define QUAVEL_EXPORT
 #define QUAVEL_NO_EXPORT
 #elif defined(_WIN32)
-#ifdef quavel_EXPORTS  // by the build of the library itself
+#ifdef quavel_EXPORTS  // defined by the library's own build
 #define QUAVEL_EXPORT __declspec(dllexport)
 #else
 #define QUAVEL_EXPORT __declspec(dllimport)
 #endif
-#define QUAVEL_NO_EXPORT  // a class is shown whole
+#define QUAVEL_NO_EXPORT  // a class is exported whole
 #elif defined(__GNUC__)
 #define QUAVEL_EXPORT __attribute__((visibility("default")))
 #define QUAVEL_NO_EXPORT __attribute__((visibility("hidden")))

@@ -16,17 +16,17 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHead
   if (start > kLastOffset || !header.read(stream)) {
     return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", place);
   }
-  // A smaller size, such as 0, would lead the walk back to where it has been. The sizes 0 (to the
-  // end of the file) and 1 (64 bits) of the standard are refused too: no metadata follows such a
-  // box.
+  // With a smaller size, the walk would stay where it is or read the header again as a box. The
+  // standard gives 0 and 1 a meaning, but no metadata follows such a box.
   if (header.boxSize < box::kHeaderSize) {
+    char const* const meaningOf1 =
+        header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)" : "";
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
                   PlacedBox{header.boxType, position}, place, header.boxSize,
                   header.boxSize == 0
                       ? " (0 stands for \"to the end of the file\", which is not read)"
-                  : header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)"
-                                        : "");
+                      : meaningOf1);
   }
   leaveBox(*stream, endOfBox(start, header));
   return true;

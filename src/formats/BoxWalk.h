@@ -17,14 +17,14 @@ class QVStream;
 
 namespace detail {
 
-/// A box for notes: "moov box at 0x18 (24)".
+/// A box in a note: "moov box at 0x18 (24)".
 struct PlacedBox {
   std::uint32_t type = 0;
   std::int64_t position = 0;  ///< In the file.
 };
 void append(std::string& out, PlacedBox box);
 
-/// Where a box lies, for notes: "in the moov box at 0x18 (24)".
+/// Where a box lies, in a note: "in the moov box at 0x18 (24)".
 struct BoxPlace {
   char const* text;
   PlacedBox parent = {};  ///< Appended to the text, unless its type is 0.
@@ -32,14 +32,14 @@ struct BoxPlace {
 void append(std::string& out, BoxPlace place);
 
 /// Reads the box header at the stream's position and moves past the box. False: the header cannot
-/// be read, its size is smaller than the header, or the read has seen too many boxes.
+/// be read, the size in it is smaller than the header itself, or there are too many boxes.
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header);
 
-/// Where a box ends, or the last of all offsets when it ends beyond.
+/// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box. Where that is out of reach, the stream stays before the end of every
-/// box around it, so that the walk over them goes on and is refused there.
+/// Moves to the end of a box. If that has no offset, the stream goes to `kOutOfReach`, which is
+/// less than the ends of the boxes around it, so that the walk over them goes on and is refused.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

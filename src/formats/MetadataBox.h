@@ -12,8 +12,8 @@
 
 namespace quavel::detail {
 
-/// Reads a metadata box of the given type. Its `readExif` gets the stream at the start of the
-/// payload, with `baseOffset` there. `baseOffset` and `byteOrder` are restored on success only.
+/// Reads a metadata box of the given type. Its `readExif` is called with the stream's position and
+/// `baseOffset` at the payload's start. `baseOffset` and `byteOrder` are restored only on success.
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {

@@ -9,7 +9,7 @@
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // Both numbers in one read: a walk reads many headers and little else.
+  // Both numbers in one read, since walks do little but read headers.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);

@@ -11,16 +11,17 @@ using namespace detail;
 namespace {
 
 /// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
-/// untouched. Not a single value: false.
+/// untouched. Not exactly one value: false.
 bool storeShort(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
   bool const isRead = findNumber(directory, tag, value);
-  field = value == nullptr ? field : value->shortValue();
+  if (value != nullptr) {
+    field = value->shortValue();
+  }
   return isRead;
 }
 
-/// Stores the tag's fraction. Absent: true, the field untouched. Not a single value, or one of
-/// another type: false.
+/// Stores the tag's fraction. Absent: true, the field untouched. Not one value of this type: false.
 bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
   ValuePointer value = nullptr;
@@ -68,8 +69,8 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
          storeFraction(ifd, tag::FNumber, EntryValueType::RATIONAL, fNumber);
 }
 
-// APEX values are powers of two (Exif, annex C): the f-number is 2^(Av/2), the exposure time 2^-Tv
-// seconds. NaN stays NaN.
+// APEX values are base-2 logarithms (Exif, annex C): the f-number is 2^(Av/2), the exposure time is
+// 2^-Tv seconds. NaN stays NaN.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {

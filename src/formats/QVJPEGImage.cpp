@@ -27,12 +27,13 @@ constexpr unsigned short kAPP1 = 0xffe1;
 constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
-// A side of up to this many pixels in the Exif directory is taken for a thumbnail's.
+// With a side of up to this many pixels, the size in the Exif directory is taken for a thumbnail's.
 constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// A constant, so that readers work even before the public map below is initialised.
+// Bytes to skip after these markers, of which no length is read. A constant, so that readers work
+// even before the public map below is initialised.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -47,7 +48,7 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd9, 2},  // EOI
 }};
 
-/// Moves to the next segment. False: it is out of reach.
+/// Moves to the next segment. False: no read may start there.
 bool seekNext(QVStream& stream, std::int64_t offset) {
   return seek(stream, offset) || refuseCut(journalOf(stream), stream.baseOffset + offset,
                                            sizeof(kSOI), "the marker of the next segment");
@@ -73,9 +74,8 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
                   "the file begins with {}, not with ff d8 (SOI)", HexPair{marker});
   }
 
-  // In an ordinary file, the walk ends at the frame header. When the baseline frame, the APP1
-  // segment or both are missing, it goes on through the scan to the end of the data. Reaching that
-  // end is not a failure.
+  // In an ordinary file, the walk ends at the frame header. Without a baseline frame or an APP1
+  // segment, it goes on through the scan to the end of the data, which is not a failure.
   WalkState walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
@@ -120,9 +120,10 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   }
   if (marker == kSOS && walk.scan < 0) {
     walk.scan = walk.start;
-    walk.missingAtScan = walk.sawAPP1 ? "SOF0" : walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
+    char const* const withoutAPP1 = walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
+    walk.missingAtScan = walk.sawAPP1 ? "SOF0" : withoutAPP1;
   }
-  // After the start of the scan, the same two bytes are not this image's frame header.
+  // After the start of the scan, these two bytes are picture data, not a frame header.
   if (marker == kSOF2 && walk.scan < 0) {
     walk.otherFrame = walk.start;
   }
@@ -141,10 +142,10 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   notePassed(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
              isExif ? "Exif" : "not Exif");
   if (isExif) {
-    unsigned short padding = 0;
-    if (!stream->readShort(&padding)) {
+    unsigned short twoZeros = 0;
+    if (!stream->readShort(&twoZeros)) {
       return refuseCut(journal, walk.start + kPayloadPosition + std::int64_t{identifier.size()},
-                       sizeof(padding), "the end of the Exif identifier of the APP1 segment at {}",
+                       sizeof(twoZeros), "the end of the Exif identifier of the APP1 segment at {}",
                        Offset{walk.start});
     }
     if (!readExifSegment(stream)) {
@@ -184,11 +185,11 @@ void QVJPEGImage::reconcileSizeWith(WalkState const& walk) {
     height = walk.frameHeight;
   }
 
-  // Exif may give the sides swapped. The frame's size then counts, unless Orientation declares that
-  // the image is turned or mirrored.
-  bool const isTurned = width == walk.frameHeight && height == walk.frameWidth;
+  // The Exif directory may give the sides swapped. The frame's size then counts, unless Orientation
+  // says that the image is rotated or mirrored.
+  bool const isSwapped = width == walk.frameHeight && height == walk.frameWidth;
   bool const isUpright = orientation == 1 || orientation == -1;
-  if (isTurned && isUpright) {
+  if (isSwapped && isUpright) {
     width = walk.frameWidth;
     height = walk.frameHeight;
   }

@@ -10,8 +10,8 @@ using namespace detail;
 
 namespace {
 
-// The rule by which this library recognises a NEF: its first directory describes a thumbnail of
-// this size. Some cameras write a different size; their files are refused.
+// A file is read as a NEF only if its first directory describes a thumbnail of this size. Some
+// cameras write a different size; their files are refused.
 constexpr std::int32_t kThumbnailWidth = 160;
 constexpr std::int32_t kThumbnailHeight = 120;
 constexpr char kThumbnailRule[] = "a NEF's first directory must be 160 x 120";
@@ -35,8 +35,7 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  // The first SubIFD is a preview's, the second the raw image's. It is read even when there is no
-  // Exif directory.
+  // The second SubIFD describes the raw image. It is read even if there is no Exif directory.
   DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, 1, {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType},
                   rawIFD)) {

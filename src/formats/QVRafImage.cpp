@@ -15,11 +15,11 @@ namespace {
 
 constexpr std::array<std::uint8_t, 8> kMagic = {'F', 'U', 'J', 'I', 'F', 'I', 'L', 'M'};
 
-// Fields of the file's header, which is big-endian whatever order the sections have.
+// Positions in the file's header, which is big-endian even if the sections are not.
 constexpr long kImageOffsetPosition = 84;
 constexpr long kRawSectionOffsetPosition = 100;
 
-// SOI, the APP1 marker and its length (2 bytes each), "Exif" and two zeros.
+// Its position: after SOI, the APP1 marker, its length (2 bytes each), "Exif" and two zeros.
 constexpr std::uint32_t kTiffHeaderInImage = 12;
 
 /// Reads the offset of a section from the file's header.
@@ -35,13 +35,13 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
   return true;
 }
 
-/// Whether an image begins as the reader expects. The segment's length may be anything.
+/// Whether an image begins as the reader expects. The segment's length, bytes 4 and 5, may be any.
 bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
   return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
          std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
 }
 
-/// Notes what the embedded image begins with, when that explains why its directories are not found.
+/// Notes what the embedded image begins with, if that may be why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
   if (!wantsAll(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
@@ -77,7 +77,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
-  stream->baseOffset = imageOffset + kTiffHeaderInImage;  // wraps around at 32 bits
+  stream->baseOffset = imageOffset + kTiffHeaderInImage;  // may wrap around at 32 bits
   stream->setOffset(0);
   if (!readMainIFD(stream)) {
     noteOtherOpening(*stream, imageOffset);

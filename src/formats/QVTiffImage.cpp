@@ -10,7 +10,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD that is marked as not reduced; null when there is none, or on failure.
+/// The first SubIFD that has NewSubfileType and is not reduced; null without one, or on failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);
@@ -27,7 +27,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
     if (type != nullptr && !isReducedImage(type)) {
       return subIFD;
     }
-    // A SubIFD without a mark is never taken.
+    // Not even a SubIFD without NewSubfileType is taken.
     noteHint(
         journal, QVReason::PassedOver, positionOf(subIFD),
         type == nullptr ? "{} has no 0x00fe NewSubfileType" : "{} declares a reduced image too",

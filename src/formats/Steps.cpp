@@ -10,7 +10,7 @@ namespace {
 
 constexpr unsigned short kTiffMagic = 42;
 
-// In a record, it cannot be told from a number that is absent.
+// The record's value for an absent number, even if the file gives it.
 constexpr std::int32_t kAbsentNumber = -1;
 
 }  // namespace
@@ -20,8 +20,9 @@ bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePoin
   value = entry.size() == 1 ? entry[0] : nullptr;
   if (!entry) {
     noteNoEntry(directory, tag);
+    return true;
   }
-  return value != nullptr || !entry || refuseContent(directory, tag, "exactly one wanted");
+  return value != nullptr || refuseContent(directory, tag, "exactly one wanted");
 }
 
 bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
@@ -131,7 +132,7 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   }
 }
 
-// Below, a directory without a row is a host's, of which no notes are kept.
+// Below, the tag has an entry. If there is no row for it, the directory is a host's, without notes.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);

@@ -12,17 +12,17 @@
 #include "tiff/ReaderDirectory.h"
 #include "tiff/WantedTags.h"
 
-// Steps that the readers of several formats share. Each step that can fail states why. The formats
-// differ in what an absent entry means, so each reader decides that itself.
+// Steps that the readers of several formats share. A step that fails has told the journal why. What
+// an absent entry means differs between formats, so each reader decides that.
 namespace quavel::detail {
 
-/// Finds the single value of a tag. Absent: true and null. No value or several: false.
+/// Finds the only value of a tag's entry. Absent: true and null. Not exactly one value: false.
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value);
 
-/// Stores the tag's number. Absent: true, the field untouched. Not a single value: false.
+/// Stores the tag's number. Absent: true, the field untouched. Not exactly one value: false.
 bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field);
 
-/// The same for a number that must be present; `rule` says so. Absent: false.
+/// The same for a number that must be present; `rule` tells the user so. Absent: false.
 bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field);
 
@@ -38,8 +38,8 @@ DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryNam
 DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
                                     TagList tags);
 
-/// Reads the directory that the entry under `pointer` leads to. Absent: true, `result` is null.
-/// Not a single value, or the directory cannot be read: false.
+/// Reads the directory whose offset is in the entry with the tag `pointer`. Absent: true, `result`
+/// is null. Not exactly one value, or the directory cannot be read: false.
 bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& directory,
                    unsigned short pointer, char const* name, TagList tags,
                    DirectoryPointer& result);
@@ -50,28 +50,28 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
                  DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD);
 
 /// Reads the raw image's directory, the SubIFD with this index. Too few SubIFDs: true, `rawIFD` is
-/// null. The directory cannot be read: false.
+/// unchanged. The directory cannot be read: false.
 bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainIFD,
                 std::uint32_t index, TagList tags, DirectoryPointer& rawIFD);
 
 /// Notes that the tag's field stays absent because there is no entry for it.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same, because its entry holds no usable value; the pattern says what it holds.
+/// Notes that it stays absent because the entry's value is unusable; the pattern says what it is.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
-/// Refuses the tag's entry, which the directory must have, for its content. Returns false.
+/// Refuses the content of the tag's entry, which must exist. Returns false.
 bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char const* wanted);
 
 /// Whether NewSubfileType's bit 0 marks a reduced-resolution version of another image.
 bool isReducedImage(ValuePointer newSubfileType);
 
-/// Stores the size of a directory that must describe a full-size image. False: a side or
-/// NewSubfileType is absent or not a single value, or the image is a reduced one.
+/// Stores the image size from a directory that must describe a full-size image. False: a side or
+/// NewSubfileType is absent or not exactly one value, or the image is a reduced one.
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory as notes name it; null for a host's, of which no notes are kept.
+/// A directory as notes name it; without a table for a host's, of which no notes are kept.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};

@@ -12,22 +12,22 @@ namespace quavel::detail {
 
 namespace {
 
-constexpr unsigned kAll = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
+constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
 /// A field that can be absent.
 struct FieldRow {
   char name[22];
-  std::uint8_t origin;    ///< Rows down to the field that it is computed from; 0: none.
+  std::uint8_t origin;    ///< It is computed from the field this many rows below; 0: from none.
   std::uint8_t families;  ///< The readers that fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
 
 using M = QVMetadata;
 constexpr FieldRow kFields[] = {
-    {"width", 0, kAll, &M::width},
-    {"height", 0, kAll, &M::height},
-    {"orientation", 0, kAll, &M::orientation},
-    {"dateTimeOriginal", 0, kAll & ~kCr3, &M::dateTimeOriginal},
+    {"width", 0, kAllFamilies, &M::width},
+    {"height", 0, kAllFamilies, &M::height},
+    {"orientation", 0, kAllFamilies, &M::orientation},
+    {"dateTimeOriginal", 0, kAllFamilies & ~kCr3, &M::dateTimeOriginal},
     {"dateTimeDigitized", 0, kTiff, &M::dateTimeDigitized},
     {"dateTime", 0, kTiff | kCr3, &M::dateTime},
     {"model", 0, kCr3, &M::model},
@@ -48,10 +48,10 @@ constexpr FieldRow kFields[] = {
 
 bool isAbsent(FieldRow const& row, QVMetadata const& record) {
   if (auto const* const number = std::get_if<std::int32_t QVMetadata::*>(&row.member)) {
-    return record.**number == -1;
+    return record.*(*number) == -1;
   }
   if (auto const* const number = std::get_if<float QVMetadata::*>(&row.member)) {
-    return std::isnan(record.**number);
+    return std::isnan(record.*(*number));
   }
   return (record.*std::get<std::string QVMetadata::*>(row.member)).empty();
 }
@@ -63,13 +63,14 @@ QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
                                  : composed("never taken from {} files", {format.kind});
     return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, 0};
   }
-  auto const* const known = journal.absenceOf((&row + row.origin)->name);
+  FieldRow const& origin = *(&row + row.origin);  // the row itself, unless it is computed
+  auto const* const known = journal.absenceOf(origin.name);
   QVNote note = known == nullptr ? QVNote() : *known;
   note.field = row.name;
   return note;
 }
 
-// Enough for each of the signatures below.
+// Enough bytes for any of the signatures below, and for the brand.
 constexpr std::size_t kOpeningSize = 16;
 constexpr std::size_t kBrandPosition = 8;
 constexpr std::size_t kBrandSize = 4;
@@ -79,7 +80,7 @@ struct Signature {
   std::uint8_t size;
   char bytes[9];
   char kind[36];
-  std::uint8_t families;  ///< The readers of such files.
+  std::uint8_t families;  ///< The readers of such files; 0: none.
 };
 
 constexpr std::uint8_t kTiffFamilies = kTiff | kNef | kArw;
@@ -118,6 +119,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       continue;
     }
     if ((row.families & format.family) == 0) {
+      // Only an ISO base media file has its signature elsewhere than at 0, and a brand after it.
       bool const hasBrand = row.position != 0 && size >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       std::string const kind =

@@ -24,22 +24,22 @@ namespace quavel::detail {
 
 namespace {
 
-/// Memory for an image of any class. As none of the classes adds members to the record, one type
-/// serves all, which keeps ten kinds of `shared_ptr` owners out of the library.
-struct ImageRoom {
-  ImageRoom() {}  // leaves the bytes as they are
-  ~ImageRoom() { image->~QVMetadata(); }
+/// Memory for a record of any class. None of the classes adds members to QVMetadata, so that one
+/// type is enough, and the library has one `shared_ptr` control block type instead of ten.
+struct RecordStorage {
+  RecordStorage() {}  // does not set the bytes to zero
+  ~RecordStorage() { record->~QVMetadata(); }
 
-  QVMetadata* image;
+  QVMetadata* record;
   alignas(QVMetadata) unsigned char bytes[sizeof(QVMetadata)];
 };
 
 template <class Image>
 std::shared_ptr<QVMetadata> make() {
   static_assert(sizeof(Image) == sizeof(QVMetadata));
-  auto const room = std::make_shared<ImageRoom>();
-  room->image = new (room->bytes) Image;
-  return {room, room->image};
+  auto const storage = std::make_shared<RecordStorage>();
+  storage->record = new (storage->bytes) Image;
+  return {storage, storage->record};
 }
 
 constexpr Format kFormats[] = {
@@ -74,7 +74,7 @@ bool refuseExtension(Journal* journal, std::string const& extension) {
 }  // namespace
 
 std::string extensionOf(std::string const& path) {
-  // When the file's name has no ".", one in a folder's name counts; it never names a format.
+  // If only a folder's name has a ".", the result contains a "/" and so names no format.
   auto const dot = path.rfind('.');
   return dot == std::string::npos ? std::string() : path.substr(dot + 1);
 }
@@ -94,6 +94,7 @@ std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) 
   int fd = -1;
   auto stream = openReadAhead(path, &fd);
   if (journal != nullptr && fd == -1) {
+    // The reader gets an empty stream and refuses it too, but the first refusal counts.
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));
@@ -118,8 +119,11 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
   }
   if (journal != nullptr) {
     journal->format = format->kind;
-    record ? noteAbsences(*format, *record, *journal)
-           : noteOtherContent(*format, *stream, start, *journal);
+    if (record) {
+      noteAbsences(*format, *record, *journal);
+    } else {
+      noteOtherContent(*format, *stream, start, *journal);
+    }
   }
   return record;
 }

@@ -15,30 +15,30 @@ namespace detail {
 
 class Journal;
 
-/// The readers, told apart by the fields of the record that they fill.
+/// Formats that are read in the same way, as one bit, so that families can be combined into sets.
 enum Family : unsigned { kTiff = 1, kNef = 2, kArw = 4, kJpeg = 8, kRaf = 16, kCr3 = 32 };
 
 /// What an extension stands for.
 struct Format {
   std::string_view extension;
-  char const* kind;  ///< "JPEG"
+  char const* kind;  ///< Its name, such as "JPEG".
   Family family;
   std::shared_ptr<QVMetadata> (*makeRecord)();
 };
 
-/// What follows the path's last ".", in the case it is written in; empty without a ".".
+/// The text after the path's last ".", its case unchanged; empty when the path has no ".".
 std::string extensionOf(std::string const& path);
 
 /// The format of an extension in lower case, or null.
 Format const* formatOf(std::string_view extension);
 
-/// Notes why each absent field of the record is absent.
+/// Notes, for each field that the record lacks, why it is absent.
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
 /// When the refused file, which begins at `start`, looks like another format, notes which one.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
-/// The record of the file at a path, or null.
+/// The record of the file at a path, or null. The journal may be null, here and below.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);
 
 /// The record of the file that the stream holds, or null.

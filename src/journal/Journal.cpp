@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 namespace {
 
-// Few enough for all notes to fit on a screen, whatever the file holds.
+// So few that all notes of any file fit on a screen.
 constexpr std::size_t kMaxSteps = 8;
 constexpr std::size_t kMaxHints = 8;
 
@@ -108,6 +108,7 @@ void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
 }
 
 bool Reading::refuseWork(Work work) const {
+  // In the order of the enumerators.
   static constexpr char const* kPatterns[] = {
       "the file makes the reader open more than {} directories",
       "the file makes the reader walk over more than {} directory entries",

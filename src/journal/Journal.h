@@ -11,13 +11,13 @@
 
 namespace quavel::detail {
 
-/// Collects the notes of one read. The readers state theirs through the functions below. A null
-/// journal means that nobody asked for notes; no text is then composed.
+/// Collects the notes of one read. The readers add theirs through the functions after this class: a
+/// null journal means that nobody asked for notes, and then no text is composed.
 class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
 
-  /// Whether steps and absences are wanted, not only the refusal.
+  /// Whether steps, hints and absences are wanted too, not only the refusal.
   bool wantsAll() const { return wantsAll_; }
 
   using Words = std::initializer_list<Word>;
@@ -29,24 +29,24 @@ class Journal {
   /// Notes a part that was read without trouble; after the first few, only counts it.
   void passed(std::int64_t position, char const* pattern, Words words);
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
-  /// The reason for a field's absence, should it be absent at the end; the last reason counts.
+  /// Keeps the reason why a field may stay absent; replaces an earlier one for the same field.
   void absent(char const* field, QVReason reason, char const* pattern, Words words);
 
   /// The reason given so far for a field's absence, or null.
   QVNote* absenceOf(char const* field);
 
-  /// The size of the data in bytes; -1: not known. Only this asks the system for it.
+  /// The size of the data in bytes, for which the first call asks the system; -1: not known.
   std::int64_t dataSize();
-  /// Why bytes that end at a position cannot be read: as a reason, and in words.
+  /// Why the last read delivered too little: as a reason, and in words for bytes that end at `end`.
   QVReason cutReason() const;
   std::string cutText(std::int64_t end);
 
   std::vector<QVNote> notes;
   std::uint64_t furtherSteps = 0;
-  char const* format = "";      ///< See QVJournal.
+  char const* format = "";      ///< See `QVJournal::format`.
   int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
-  bool hasReadFailed = false;   ///< The last read failed, other than by the end of the data.
+  bool hasReadFailed = false;   ///< The last read failed; the end of the data is not a failure.
   int systemError = 0;          ///< The `errno` of that failure; 0: none is known.
 
  private:
@@ -72,7 +72,7 @@ template <class... Words>
   return false;
 }
 
-/// The same when the data lacks `count` bytes at `position`; the pattern says what they are.
+/// Does the same for `count` bytes missing at `position`; the pattern says what they are.
 template <class... Words>
 [[gnu::cold, gnu::noinline]] bool refuseCut(Journal* journal, std::int64_t position,
                                             std::int64_t count, char const* pattern,

@@ -13,11 +13,11 @@ constexpr std::int64_t kFirstHexadecimal = 10;
 
 void appendHex(std::string& out, std::uint64_t number, int minDigits) {
   int digits = minDigits;
-  while (digits < 16 && number >> (4 * digits) != 0) {
+  while (digits < 16 && (number >> (4 * digits)) != 0) {
     ++digits;
   }
   while (digits-- > 0) {
-    out += "0123456789abcdef"[number >> (4 * digits) & 0xfU];
+    out += "0123456789abcdef"[(number >> (4 * digits)) & 0xfU];
   }
 }
 
@@ -76,7 +76,7 @@ std::string composed(char const* pattern, std::initializer_list<Word> words) {
   text.reserve(kMaxTextLength / 4);
   auto const* word = words.begin();
   std::string_view rest = pattern;
-  // A pattern has no other braces.
+  // Each "{" in a pattern begins a "{}".
   for (auto at = rest.find('{'); at != rest.npos && word != words.end(); at = rest.find('{')) {
     text += rest.substr(0, at);
     word->appendTo(text);

@@ -29,7 +29,7 @@ struct HexCode {
   std::uint16_t value;
 };
 
-/// Text of the file, shown as printable ASCII with the rest as "\x1b".
+/// Text of the file: printable ASCII as it is, any other byte like "\x1b".
 struct QuotedBytes {
   std::uint8_t const* bytes;
   std::size_t count;
@@ -47,8 +47,8 @@ void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 
-/// A part of a note's text. It refers to a value that one of the `append` functions, above or next
-/// to the value's own type, puts into words, which happens only for a note that is kept.
+/// A part of a note's text: a value, which must outlive this, and the function that turns it into
+/// text. That is one of the `append` functions above, or one declared beside the value's type.
 class Word {
  public:
   template <class Value>
@@ -64,7 +64,7 @@ class Word {
   void (*append_)(std::string& out, void const* word);
 };
 
-/// The pattern with each "{}" replaced by a word, cut to the length that a note may have.
+/// The pattern with each "{}" replaced by the next word, cut to the greatest length of a note.
 std::string composed(char const* pattern, std::initializer_list<Word> words);
 
 }  // namespace quavel::detail

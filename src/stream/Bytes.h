@@ -13,7 +13,7 @@
 
 namespace quavel::detail {
 
-/// Whether the bytes of numbers from the stream must be reversed on this host.
+/// Whether numbers read from the stream must have their bytes reversed for the host.
 inline bool needsReversal(QVStream const& stream) {
   bool const isKnown =
       stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
@@ -52,7 +52,15 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// Copies bytes. Most reads are of one number: its constant size spares the call of memcpy.
+/// The sum and the difference of positions, which wrap around where signed ones are undefined.
+inline std::int64_t wrappingSum(std::int64_t a, std::int64_t b) {
+  return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
+}
+inline std::int64_t wrappingDifference(std::int64_t a, std::int64_t b) {
+  return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) - static_cast<std::uint64_t>(b));
+}
+
+/// Copies bytes. Most reads are of one number; with a constant size, memcpy needs no call.
 inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std::size_t count) {
   switch (count) {
     case 2:
@@ -69,17 +77,17 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// Where `long` has 32 bits, nothing beyond 2 GB has an offset. Reads start somewhat before that, so
-// that the offset after all entries of a directory still exists.
+// The last offset at which a read may start. Where `long` has 32 bits, no offset reaches beyond
+// 2 GB; stopping 1 MB earlier keeps the offset after a directory's last entry within them.
 inline constexpr bool kIsLongShort = sizeof(long) < sizeof(std::int64_t);
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLongShort ? 1L << 20U : 0);
 
-/// Stands for every position that has no offset.
+/// The offset that a walk moves to if its target has none. Where `long` has 32 bits, it is less
+/// than the largest `long`, which is taken for the end of a box that ends beyond all offsets.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLongShort ? 1 : 0);
 
-/// Moves the stream to an offset. False: the offset is out of reach. The stream has not moved then,
-/// and must not be read.
+/// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
 inline bool seek(QVStream& stream, std::int64_t offset) {
   if (offset > kLastOffset || offset < std::numeric_limits<long>::min()) {
     return false;
@@ -88,7 +96,7 @@ inline bool seek(QVStream& stream, std::int64_t offset) {
   return true;
 }
 
-/// Reads in one piece. False: the stream does not deliver exactly as many bytes as asked for.
+/// Calls `readBuffer` once. False: it does not deliver exactly `count` bytes.
 inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t count) {
   std::int64_t const delivered = stream.readBuffer(destination, count);
   if (delivered == static_cast<std::int64_t>(count)) {

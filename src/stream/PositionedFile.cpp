@@ -5,18 +5,19 @@
 #include <chrono>
 
 #include "quavel/QVReadAheadStream.h"
+#include "stream/Bytes.h"
 #include "system/File.h"
 
 namespace quavel::detail {
 
 namespace {
 
-// Photos take one to four reads, those that are walked through their image data dozens.
+// Most photos take one to four reads; one that is walked through its image data takes dozens.
 constexpr int kReadsOfAWalk = 16;
-constexpr std::int64_t kForeseen = std::int64_t{4} << 20;
+constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;
 
-// The metadata of most files lies in the first block; beyond it are single directories and
-// segments. docs/speed.md shows how both sizes were measured.
+// The first block holds all metadata of most files; later ones are read for a single directory or
+// segment each. docs/speed.md shows how both sizes were measured.
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
@@ -31,7 +32,7 @@ struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
 
   PositionedFile file;
-  // Owns nothing: the file lives as long as this object.
+  // The pointer to `file` owns nothing: both streams live as long as this object.
   QVReadAheadStream ahead{std::shared_ptr<QVStream>(std::shared_ptr<void>(), &file),
                           kFirstBlockSize, kNextBlockSize};
 };
@@ -42,7 +43,7 @@ PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t count) {
   int const left = filesToAdvise.load(std::memory_order_relaxed);
-  // By default, a system fetches several times what is asked for at the start of a file.
+  // Otherwise the first read makes the system fetch several times what is asked for.
   if (left > 0) {
     file::expectFewReads(fd);
   }
@@ -56,9 +57,9 @@ std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t co
 }
 
 std::int64_t PositionedFile::readFurther(std::uint8_t* destination, std::size_t count) {
-  if (reads_ >= kReadsOfAWalk && position_ >= foreseenEnd_) {
-    file::expectReads(fd, position_, kForeseen);
-    foreseenEnd_ = position_ + kForeseen;
+  if (reads_ >= kReadsOfAWalk && position_ >= advisedEnd_) {
+    file::expectReads(fd, position_, kAdvisedSize);
+    advisedEnd_ = position_ + kAdvisedSize;
   }
   return file::readAt(fd, destination, count, position_);
 }
@@ -81,7 +82,7 @@ std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t cou
   if (position_ != pipePosition_) {
     return -1;
   }
-  // A pipe delivers what its writer has written so far, so loop until all has arrived.
+  // Each read of a pipe delivers only what its writer has written so far.
   std::size_t received = 0;
   std::int64_t delivered = 1;
   while (received < count && delivered > 0) {
@@ -93,13 +94,11 @@ std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t cou
 }
 
 long PositionedFile::getOffset() {
-  return static_cast<long>(static_cast<std::uint64_t>(position_) -
-                           static_cast<std::uint64_t>(baseOffset));
+  return static_cast<long>(wrappingDifference(position_, baseOffset));
 }
 
 void PositionedFile::setOffset(long const& offset) {
-  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
-                                                static_cast<std::uint64_t>(offset));
+  std::int64_t const target = wrappingSum(baseOffset, offset);
   bool const isAccepted =
       target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
   if (isAccepted) {

@@ -8,14 +8,13 @@
 
 namespace quavel::detail {
 
-/// Each file system has its own limit for positions; every one accepts those up to this.
+/// A position that every file system accepts. Each has its own limit beyond it.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
-/// A file for a few scattered reads. Each read names its position, so that a seek costs nothing,
-/// and the system is asked not to read ahead while files come from the disk rather than from its
-/// cache. A file that takes many reads is being walked to its end, so the system is then asked to
-/// fetch what follows. A pipe is read front to back; a read
-/// anywhere else fails.
+/// A file for a few scattered reads. Each read states its position, so that a seek needs no system
+/// call, and the system is advised not to read ahead while files come from the disk and not from
+/// its cache. Many reads mean a walk to the end of the file; the system is then advised to fetch
+/// what follows. A pipe is read only front to back.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);
@@ -31,7 +30,7 @@ class PositionedFile : public QVFStream {
 
   std::int64_t position_ = 0;      // absolute
   std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
-  std::int64_t foreseenEnd_ = 0;   // of the range that the system was told to expect reads in
+  std::int64_t advisedEnd_ = 0;    // of the range that the system was advised to fetch
   int reads_ = 0;
 };
 

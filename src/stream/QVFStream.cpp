@@ -1,5 +1,6 @@
 #include "quavel/QVFStream.h"
 
+#include "stream/Bytes.h"
 #include "system/File.h"
 
 namespace quavel {
@@ -19,15 +20,13 @@ std::int64_t QVFStream::readBuffer(std::uint8_t* destination, std::size_t count)
 }
 
 long QVFStream::getOffset() {
-  // Unsigned, here and below: a result out of range wraps around instead of being undefined.
-  auto const position = static_cast<std::uint64_t>(fd == -1 ? 0 : file::position(fd));
-  return static_cast<long>(position - static_cast<std::uint64_t>(baseOffset));
+  std::int64_t const position = fd == -1 ? 0 : file::position(fd);
+  return static_cast<long>(detail::wrappingDifference(position, baseOffset));
 }
 
 void QVFStream::setOffset(long const& offset) {
   if (fd != -1) {
-    file::seek(fd, static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
-                                             static_cast<std::uint64_t>(offset)));
+    file::seek(fd, detail::wrappingSum(baseOffset, offset));
   }
 }
 

@@ -12,7 +12,7 @@ QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
 std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   auto const delivered = static_cast<std::size_t>(std::min<std::uint64_t>(count, length - offset));
   if (delivered == 0) {
-    return 0;
+    return 0;  // `buffer` may be null
   }
   detail::copyBytes(destination, buffer + offset, delivered);
   offset += delivered;
@@ -24,7 +24,7 @@ long QVMStream::getOffset() {
 }
 
 void QVMStream::setOffset(long const& newOffset) {
-  // Unsigned, a target before the start lies beyond any length.
+  // As an unsigned number, a target before the start is larger than any length.
   std::uint64_t const target =
       static_cast<std::uint64_t>(baseOffset) + static_cast<std::uint64_t>(newOffset);
   offset = std::min(target, length);

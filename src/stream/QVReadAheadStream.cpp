@@ -13,15 +13,16 @@ namespace quavel {
 
 namespace {
 
+bool fitsLong(std::int64_t number) { return number == static_cast<long>(number); }
+
 /// Seeks to a position that does not fit a `long`, by way of `baseOffset`. False: the seek failed.
 bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
-  source.baseOffset = static_cast<std::int64_t>(static_cast<std::uint64_t>(base) +
-                                                static_cast<std::uint64_t>(target));
+  source.baseOffset = detail::wrappingSum(base, target);
   source.setOffset(0);
   bool const isThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores the base is at its start instead.
+  // A source that ignores `baseOffset` is at its start instead, and reports offset 0.
   return isThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -49,14 +50,11 @@ std::int64_t QVReadAheadStream::readBuffer(std::uint8_t* destination, std::size_
 }
 
 long QVReadAheadStream::getOffset() {
-  return static_cast<long>(static_cast<std::uint64_t>(position_) -
-                           static_cast<std::uint64_t>(baseOffset));
+  return static_cast<long>(detail::wrappingDifference(position_, baseOffset));
 }
 
 void QVReadAheadStream::setOffset(long const& offset) {
-  // Unsigned, a sum out of range wraps around instead of being undefined.
-  auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
-                                                static_cast<std::uint64_t>(offset));
+  std::int64_t const target = detail::wrappingSum(baseOffset, offset);
   if (target < 0 || (target > detail::kSurelyAccepted && !sourceAccepts(target))) {
     return;
   }
@@ -64,10 +62,10 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  // A source that refuses the seek stays at 0. One that stops at its end counts as accepting it.
+  // Start at 0: a source that refuses the seek stays there. One that stops at its end accepts it.
   sourcePosition_ = -1;
   source_->setOffset(0);
-  if (target == static_cast<long>(target)) {
+  if (fitsLong(target)) {
     source_->setOffset(static_cast<long>(target));
     return source_->getOffset() != 0;
   }
@@ -107,7 +105,7 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
   block.size = 0;  // even a read that fails may overwrite its bytes
-  errno = 0;       // a host's stream need not say why it fails
+  errno = 0;       // a host's stream may fail without setting it
   std::int64_t delivered = readSource(block, wanted);
   if (delivered < 0 && needed < wanted) {
     // The fault may lie beyond the bytes that are needed.
@@ -119,17 +117,16 @@ void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t need
 }
 
 std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
+  // The source's position is unknown from here on, unless the read succeeds.
   if (std::exchange(sourcePosition_, -1) != position_) {
-    if (position_ == static_cast<long>(position_)) {
+    if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
     } else if (!sourceAccepts(position_)) {
       return -1;
-    } else {
-      sourcePosition_ = -1;  // unless the read succeeds
     }
   }
   std::int64_t const delivered = source_->readBuffer(block.bytes.get(), count);
-  // Nor can more be delivered than was asked for, or anything past the largest position.
+  // More bytes than asked for, or bytes past the largest position, are a failure too.
   if (delivered < 0 || static_cast<std::uint64_t>(delivered) > count ||
       delivered > std::numeric_limits<std::int64_t>::max() - position_) {
     return -1;

@@ -24,7 +24,7 @@ std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::i
 std::int64_t position(int fd);
 std::int64_t seek(int fd, std::int64_t position);
 std::int64_t size(int fd);
-inline void expectFewReads(int /*fd*/) {}
+inline void expectFewReads(int /*fd*/) {}  // Windows takes no such advice
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 
 #else
@@ -39,7 +39,7 @@ inline std::int64_t read(int fd, std::uint8_t* destination, std::size_t count) {
   return ::read(fd, destination, count);
 }
 
-/// Reads at a position. A pipe has none: ESPIPE.
+/// Reads at a position; -1 with ESPIPE for a pipe, which has no positions.
 inline std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count,
                            std::int64_t position) {
   return ::pread(fd, destination, count, position);
@@ -49,10 +49,11 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// The size of a regular file; -1 for anything else, which sets no `errno`.
+/// The size of a regular file. Any other kind of file has -1 too, without an `errno`.
 inline std::int64_t size(int fd) {
   struct stat status = {};
-  return ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode) ? std::int64_t{status.st_size} : -1;
+  bool const isRegular = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
+  return isRegular ? std::int64_t{status.st_size} : -1;
 }
 
 #ifdef POSIX_FADV_RANDOM
@@ -62,7 +63,7 @@ inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM
 inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
   ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
 }
-#else  // a system without such advice reads as it likes
+#else  // the system takes no advice
 inline void expectFewReads(int /*fd*/) {}
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 #endif

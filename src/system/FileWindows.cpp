@@ -26,10 +26,10 @@ std::wstring widened(std::string const& path) {
   return wide.data();
 }
 
-/// Windows accepts a path of MAX_PATH characters or more only when it is absolute and has the
-/// prefix that is added here.
-std::wstring marked(std::wstring const& path) {
-  DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);
+/// The path in the form that Windows requires from MAX_PATH characters on: absolute and with the
+/// prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
+std::wstring withLongPathPrefix(std::wstring const& path) {
+  DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with the final NUL
   std::vector<wchar_t> whole(std::size_t{size} + 1);
   if (size < MAX_PATH || ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
     return path;
@@ -62,7 +62,7 @@ int errorNumber(DWORD error) {
 }  // namespace
 
 int open(std::string const& path) {
-  std::wstring const wide = marked(widened(path));
+  std::wstring const wide = withLongPathPrefix(widened(path));
   // Others may go on reading, writing, renaming and deleting the file, as on other systems.
   HANDLE const handle = ::CreateFileW(wide.c_str(), GENERIC_READ,
                                       FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,

@@ -12,7 +12,7 @@ Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : exists_(true) {
 }
 
 bool Entry::convertToString(std::string& out) const {
-  // Resized to the longest it can get, then cut: appending would check the capacity each time.
+  // Resized to the greatest possible length, then cut: each append would check the capacity.
   out.resize(size_);
   char* const text = out.data();
   std::size_t length = 0;

@@ -15,8 +15,8 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// A view of an entry's values, which belong to a reader's directory or a host's and must outlive
-/// it. It may be empty: there is no such entry.
+/// A view of an entry's values, which must outlive the view; they belong to a reader's directory or
+/// to a host's. As a bool, false: there is no such entry.
 class Entry {
  public:
   Entry() = default;
@@ -25,17 +25,17 @@ class Entry {
 
   explicit operator bool() const { return exists_; }
 
-  /// An UNDEFINED entry holds no values.
+  /// The number of values; 0 for an UNDEFINED entry.
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 
-  /// As that of `QVTiffImageFileDirectoryEntry`.
+  /// Does what that of `QVTiffImageFileDirectoryEntry` does.
   bool convertToString(std::string& out) const;
 
  private:
   bool exists_ = false;
-  ValuePointer values_ = nullptr;  // side by side, or
-  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;
+  ValuePointer values_ = nullptr;  // an array of values, in a reader's directory
+  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // or pointers
   std::size_t size_ = 0;
 };
 

@@ -13,11 +13,10 @@ namespace quavel::detail {
 
 namespace {
 
-// Values, of 9 bytes each. Most files have fewer wanted ones, and allocators are quick with blocks
-// of up to 1 KB.
+// In values of 9 bytes: few directories need more, and allocators are fast for blocks up to 1 KB.
 constexpr std::size_t kFirstCapacity = 112;
 
-// An entry count is only what the file claims.
+// An entry count may be made up, so it does not decide alone how much is reserved.
 constexpr std::size_t kMaxReservedRows = 256;
 
 bool refuseCount(Journal* journal, EntryTable const& table) {
@@ -56,8 +55,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     if (!wanted.take(tag)) {
       continue;
     }
-    // Seek past the entry first: a stream that refuses the seek to the values stays there.
     RawEntry entry;
+    // Go to the next entry first: a stream that refuses the seek to the values then reads there.
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
@@ -68,11 +67,11 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     }
   }
 
-  // The entries may have left the stream anywhere.
+  // Reading the values may have moved the stream anywhere.
   if (!seek(stream, walk.end())) {
     return refuseNext(journal_, *this, entryCount_);
   }
-  return reading.spend(Work::Entries, walk.number() - 1);
+  return reading.spend(Work::Entries, walk.passed());
 }
 
 bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,

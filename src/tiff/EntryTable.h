@@ -22,8 +22,8 @@ namespace detail {
 
 class Journal;
 
-/// The wanted entries of a directory as they are read, their values side by side. A host gets a map
-/// made from it, of which it may keep any entry and any value.
+/// The wanted entries of a directory, with all their values in one array. A host gets a map that is
+/// made from the table, and may keep any entry and any value of that map.
 class EntryTable {
  public:
   struct Row {
@@ -31,8 +31,8 @@ class EntryTable {
     std::uint16_t typeCode;
     std::uint32_t count;
     std::int64_t position;  ///< Of the entry, in the file.
-    std::uint32_t field;    ///< UNDEFINED: its bytes as in the file, or their offset.
-    std::uint32_t first;    ///< Index of its first value, if it has any.
+    std::uint32_t field;    ///< UNDEFINED: see `undefinedField`.
+    std::uint32_t first;    ///< Index of its first value in the array.
 
     std::uint32_t valueCount() const { return typeCode == kUndefinedCode ? 0 : count; }
   };
@@ -40,13 +40,12 @@ class EntryTable {
   /// For a directory at a position in the file.
   EntryTable(DirectoryName const& name, std::int64_t position) : name_(name), position_(position) {}
 
-  /// Reads the entry count at the stream's position, which is the directory's, and the wanted
-  /// entries, until all have been met. To be called once. True: the stream stands after the last
-  /// entry. False: the count, a tag or a wanted entry cannot be read, or the read has done too much
-  /// work.
+  /// Reads the directory at the stream's position: the entry count, then the wanted entries, until
+  /// all have been met. To be called once. True: the stream stands after the directory's last
+  /// entry. False: the count, a tag or a wanted entry cannot be read, or the read exceeds a limit.
   bool read(QVStream& stream, WantedTags& wanted);
 
-  /// The same at an offset, then the next directory's offset. Also false when that cannot be read.
+  /// Does the same at an offset, then reads the next directory's offset; false also if that fails.
   bool readWithNext(QVStream& stream, std::uint32_t offset, TagList tags,
                     std::uint32_t* nextIFDOffset);
 
@@ -56,7 +55,7 @@ class EntryTable {
         std::find_if(rows_.begin(), rows_.end(), [tag](Row const& row) { return row.tag == tag; });
     return found == rows_.end() ? nullptr : &*found;
   }
-  /// The same with its values, or none.
+  /// The entry of that row; false as a bool when there is no row.
   Entry entry(unsigned short tag) const {
     Row const* const row = find(tag);
     return row == nullptr ? Entry() : Entry(values_.data() + row->first, row->valueCount());
@@ -68,7 +67,7 @@ class EntryTable {
 
   DirectoryName const& name() const { return name_; }
   std::int64_t position() const { return position_; }
-  Journal* journal() const { return journal_; }  ///< Of the read that filled the table; or null.
+  Journal* journal() const { return journal_; }  ///< Of the read that filled the table, or null.
 
  private:
   bool readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
@@ -84,29 +83,29 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
-// An entry as hosts get it: each value can outlive the others.
+// Values as hosts get them: one block, which lives as long as a host keeps any of its values.
 
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
-/// Pointers to some of a block's values; each shares the ownership of the block.
+/// Pointers to `count` values of a block from `first` on; each keeps the block alive.
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// The field of an UNDEFINED entry: up to 4 bytes as in the file, missing ones as 0, or the offset
-/// of more.
+/// What a row keeps of an UNDEFINED entry's field: up to 4 bytes as in the file, with zeros for
+/// those beyond its end, or the offset of more than 4.
 std::uint32_t undefinedField(RawEntry const& entry, bool isReversed);
 
-/// Stores such a field.
+/// Stores that, and the count of bytes, in an entry for a host.
 void storeUndefined(std::uint32_t count, std::uint32_t field, QVTiffImageFileDirectoryEntry& entry);
 
-/// "IFD0 at 8"
+/// A directory in a note: "IFD0 at 8".
 struct PlacedDirectory {
   EntryTable const* table;
 };
 void append(std::string& out, PlacedDirectory directory);
 
-/// "0x0132 DateTime at 0xe6 (230) in IFD0"
+/// An entry in a note, by the row's tag and position: "0x0132 DateTime at 0xe6 (230) in IFD0".
 struct PlacedEntry {
   EntryTable const& table;
   EntryTable::Row row;

@@ -9,7 +9,7 @@
 
 namespace quavel::detail {
 
-/// A walk over a directory's entries, which reads as many at a time as its buffer holds.
+/// A walk over a directory's entries. It reads as many of them at a time as its buffer can hold.
 class EntryWalk {
  public:
   /// The stream stands at the first of `count` entries, which is at `position` in the file.
@@ -28,40 +28,42 @@ class EntryWalk {
     --left_;
   }
 
-  /// The current entry's number, from 1 on.
-  std::uint32_t number() const { return count_ - left_ + 1; }
-  std::int64_t position() const { return position_ + std::int64_t{kEntrySize} * (number() - 1); }
+  /// How many entries come before the current one.
+  std::uint32_t passed() const { return count_ - left_; }
+  /// The current entry, counted from 1.
+  std::uint32_t number() const { return passed() + 1; }
+  std::int64_t position() const { return position_ + std::int64_t{kEntrySize} * passed(); }
 
   /// Whether the data holds the current entry's tag. May move the stream.
-  bool hasTag() { return isBuffered(kEntryTypePosition) || fillBuffer(); }
+  bool hasTag() { return isBufferedUpTo(kEntryTypePosition) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
   /// Reads what follows the tag. False: the data ends within the type or the count.
   bool readRest(RawEntry* entry) const {
-    if (!isBuffered(kEntryFieldPosition)) {
+    if (!isBufferedUpTo(kEntryFieldPosition)) {
       return false;
     }
     entry->typeCode = numberIn<std::uint16_t>(kEntryTypePosition);
-    entry->count = numberIn<std::uint32_t>(kEntryCountPosition);
+    entry->count = numberIn<std::uint32_t>(kValueCountPosition);
     entry->field = entry_ + kEntryFieldPosition;
     auto const left = static_cast<std::size_t>(bufferEnd_ - entry->field);
     entry->fieldSize = std::min(left, kEntryFieldSize);
     return true;
   }
 
-  /// Where the next entry begins, and where the last one ends.
+  /// The offsets at which the next entry begins and the last one ends.
   std::int64_t nextOffset() const { return offset() + kStep; }
   std::int64_t end() const { return offset() + kStep * left_; }
 
  private:
-  static constexpr std::int64_t kStep = kEntrySize;
+  static constexpr std::int64_t kStep = kEntrySize;  // signed, as offsets are
 
   std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
-  /// Whether the buffer holds the first `size` bytes of the current entry.
-  bool isBuffered(std::size_t size) const {
-    return bufferEnd_ - entry_ >= static_cast<std::ptrdiff_t>(size);
+  /// Whether the buffer holds the current entry up to this position in it.
+  bool isBufferedUpTo(std::size_t position) const {
+    return bufferEnd_ - entry_ >= static_cast<std::ptrdiff_t>(position);
   }
 
   template <class Number>
@@ -69,22 +71,22 @@ class EntryWalk {
     return numberAt<Number>(entry_ + position, isReversed_);
   }
 
-  /// Buffers the current entry and those after it. False: its tag is not in the data.
+  /// Buffers the current entry and those after it. False: the data ends before its tag does.
   bool fillBuffer() {
     bufferOffset_ = offset();
     entry_ = buffer_.data();
     std::size_t const size = std::min(kEntrySize * left_, buffer_.size());
     bool const isReached = seek(stream_, bufferOffset_);
     bufferEnd_ = entry_ + (isReached ? readUpTo(stream_, buffer_.data(), size) : 0);
-    return isBuffered(kEntryTypePosition);
+    return isBufferedUpTo(kEntryTypePosition);
   }
 
   QVStream& stream_;
   bool const isReversed_;
-  std::int64_t bufferOffset_;  // of the buffer's first byte in the stream
+  std::int64_t bufferOffset_;  // of the buffer's first byte
   std::int64_t const position_;
   std::uint32_t const count_;
-  std::uint32_t left_;  // entries from the current one on
+  std::uint32_t left_;  // entries, the current one included
   std::array<std::uint8_t, 64 * kEntrySize> buffer_;
   std::uint8_t const* entry_ = buffer_.data();
   std::uint8_t const* bufferEnd_ = buffer_.data();

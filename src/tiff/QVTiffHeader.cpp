@@ -9,7 +9,7 @@ namespace quavel {
 
 namespace {
 
-// Each is the same in either byte order.
+// Both bytes of a mark are equal, so it can be read in either byte order.
 constexpr unsigned short kLittleEndianMark = 0x4949;  // "II"
 constexpr unsigned short kBigEndianMark = 0x4d4d;     // "MM"
 
@@ -34,6 +34,7 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
     return refuseCut(journal, start, sizeof(mark), "{}", name);
   }
   if (mark != kLittleEndianMark && mark != kBigEndianMark) {
+    // The pair is shown in the order in which the file has it.
     return refuse(journal, QVReason::OtherKind, start,
                   "{} at {} begins with {}, not with 49 49 (\"II\") or 4d 4d (\"MM\")", name,
                   Offset{start},

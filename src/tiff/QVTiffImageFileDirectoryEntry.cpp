@@ -25,7 +25,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   entry.field = field.data();
   entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Bytes in the field are stored even when some are missing, an offset only when it is whole.
+    // Up to 4 bytes are stored even if the data ends within them; an offset only if it is whole.
     if (entry.count <= kEntryFieldSize || isWhole(entry)) {
       storeUndefined(entry.count, undefinedField(entry, needsReversal(*stream)), *this);
     }

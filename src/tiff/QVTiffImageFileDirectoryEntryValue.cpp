@@ -42,10 +42,11 @@ std::int32_t quotient(SRational const& fraction) {
   if (fraction.denominator == 0) {
     return 0;
   }
-  // INT32_MIN / -1 does not fit 32 bits: it is computed in 64 and cut back to INT32_MIN.
+  // INT32_MIN / -1 does not fit 32 bits: computed in 64, it is truncated to INT32_MIN.
   return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
 }
 
+/// The number truncated toward zero; saturates at the limits of the type, 0 for NaN.
 template <class Integer>
 Integer truncated(double number) {
   if (std::isnan(number)) {
@@ -60,8 +61,8 @@ Integer truncated(double number) {
   return static_cast<Integer>(number);
 }
 
-/// Passes the value, in its own type, to a conversion. 0 for UNDEFINED and for an unknown type,
-/// which the public `type` may be set to.
+/// The result of `convert` for the value in its own type. 0 for UNDEFINED and for an unknown type:
+/// a host may set `type` to anything.
 template <class Convert>
 auto converted(EntryValue const& value, Convert const& convert) -> decltype(convert(0)) {
   switch (value.type) {
@@ -92,7 +93,7 @@ auto converted(EntryValue const& value, Convert const& convert) -> decltype(conv
   return 0;
 }
 
-/// The value as 32 bits. Integers are sign- or zero-extended as their own type demands; floats
+/// The value as 32 bits. Integers are sign- or zero-extended as their own type requires; floats
 /// saturate at the limits of `Integer`, which also has 32 bits; fractions are divided.
 template <class Integer>
 std::uint32_t to32Bits(EntryValue const& value) {
@@ -108,7 +109,7 @@ std::uint32_t to32Bits(EntryValue const& value) {
   });
 }
 
-/// Rounds to the precision of `Float`: an x87 keeps more digits in its registers.
+/// Rounds to the precision of `Float`: the registers of an x87 FPU keep more digits.
 template <class Float, class Number>
 Float rounded(Number number) {
   auto const result = static_cast<Float>(number);
@@ -131,6 +132,7 @@ Float toFloat(EntryValue const& value) {
   });
 }
 
+/// The value for all integer accessors but `longValue`: its floats saturate at other limits.
 std::uint32_t bitsOf(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace

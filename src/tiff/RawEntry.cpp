@@ -9,7 +9,7 @@ namespace {
 
 using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
-// Bytes read at a time; a multiple of the size of any value.
+// How many bytes are read at a time: a multiple of every value's size.
 constexpr std::size_t kPartSize = 512;
 
 template <class Number>
@@ -51,18 +51,18 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
 
   std::array<std::uint8_t, kPartSize> part;
   for (std::size_t left = entry.count; left > 0;) {
-    std::size_t const length = left * size <= kPartSize ? left : kPartSize / size;
-    if (!isInField && readUpTo(stream, part.data(), length * size) < length * size) {
+    std::size_t const partCount = left * size <= kPartSize ? left : kPartSize / size;
+    if (!isInField && readUpTo(stream, part.data(), partCount * size) < partCount * size) {
       return false;
     }
     std::uint8_t const* bytes = isInField ? entry.field : part.data();
-    values.resize(values.size() + length);
-    EntryValue* value = values.data() + (values.size() - length);
-    for (std::size_t i = 0; i < length; ++i, ++value, bytes += size) {
+    values.resize(values.size() + partCount);
+    EntryValue* value = values.data() + (values.size() - partCount);
+    for (std::size_t i = 0; i < partCount; ++i, ++value, bytes += size) {
       value->type = type;
       storeValue(bytes, size, isReversed, *value);
     }
-    left -= length;
+    left -= partCount;
   }
   return true;
 }

@@ -12,13 +12,13 @@
 
 namespace quavel::detail {
 
-// Where the parts of a directory entry lie, in bytes from its start (TIFF 6.0).
+// A directory entry and its parts: sizes, and positions in bytes from its start (TIFF 6.0).
 inline constexpr std::size_t kEntryTypePosition = 2;
-inline constexpr std::size_t kEntryCountPosition = 4;
+inline constexpr std::size_t kValueCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize = 2;  // the number of entries, which comes first
+inline constexpr std::int64_t kEntryCountSize = 2;  // of the number of entries in a directory
 
 inline constexpr std::uint16_t kUndefinedCode = 7;
 
@@ -27,14 +27,14 @@ struct RawEntry {
   std::uint16_t typeCode;
   std::uint32_t count;
   std::uint8_t const* field;  ///< The values, or their offset.
-  std::size_t fieldSize;      ///< How many of its 4 bytes the data holds.
+  std::size_t fieldSize;      ///< How many of the field's 4 bytes the data holds.
 };
 
-// The wanted entries of real files hold some hundred values at most; the longest are texts. The
-// bound keeps what a damaged count can make an entry allocate below 2 MB.
+// In real files, the longest wanted entries are texts of a few hundred values. The bound keeps the
+// memory that a damaged count can make an entry take below 2 MB.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
-/// Bytes of one value in a file, by field types.
+/// Bytes of one value in a file, by EntryValueType (not by the type's code in the file).
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
 /// Whether the code stands for a field type.
@@ -62,13 +62,13 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
 /// Whether the data holds all the bytes of the field that the entry uses.
 inline bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
-/// The offset that the field, which must be whole, holds.
+/// The offset in the field, of which all 4 bytes must be there.
 inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }
 
-/// Appends the values of a whole, allowed entry that is not UNDEFINED. False: the data does not
-/// hold them all.
+/// Appends the values of an entry, which must be whole and allowed and must not be UNDEFINED.
+/// False: the data does not hold them all.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 

@@ -12,8 +12,8 @@ namespace quavel::detail {
 
 using DirectoryPointer = std::shared_ptr<QVTiffImageFileDirectory>;
 
-/// A directory as the library's own readers use it: they look entries up in the table. A host never
-/// sees one; it gets what `forHost` makes.
+/// A directory for the library's own readers, which find entries in its table instead of `entries`.
+/// A host never sees one; it gets what `forHost` makes.
 class ReaderDirectory final : public QVTiffImageFileDirectory {
  public:
   ReaderDirectory(DirectoryName const& name, std::int64_t position) : table(name, position) {
@@ -22,12 +22,12 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   ReaderDirectory(ReaderDirectory const&) = delete;
   ReaderDirectory& operator=(ReaderDirectory const&) = delete;
 
-  /// The same directory as what it is; null when a host made it.
+  /// The directory as a reader's own; null when a host made it.
   static ReaderDirectory const* of(QVTiffImageFileDirectory const& directory) {
     return directory.ofReader;
   }
 
-  /// Moves the values into a directory with `entries`, which a host can use.
+  /// Moves the values into a new directory, whose `entries` a host can use.
   DirectoryPointer forHost();
 
   EntryTable table;
@@ -38,7 +38,7 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);
 
-/// The entry kept for the tag, or none.
+/// The entry kept for the tag; false as a bool when there is none.
 Entry findEntry(DirectoryPointer const& directory, unsigned short tag);
 
 /// The journal of the read that a reader's directory belongs to; null for a host's.

@@ -6,7 +6,7 @@
 // The tags read from TIFF 6.0 and Exif directories, under their standard names.
 namespace quavel::tag {
 
-/// A tag, its name for notes, and the record's field that its entry gives, if any.
+/// A tag, its name for notes, and the record's field that is filled from its entry, if any.
 struct Tag {
   unsigned short number;
   char name[26];  // an array: pointers would be relocated each time the library is loaded

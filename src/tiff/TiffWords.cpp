@@ -9,9 +9,9 @@ namespace quavel::detail {
 
 namespace {
 
-constexpr char kTypeNames[][10] = {"",          "BYTE",  "ASCII",     "SHORT",  "LONG",
-                                   "RATIONAL",  "SBYTE", "UNDEFINED", "SSHORT", "SLONG",
-                                   "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
+constexpr char kNamesByTypeCode[][10] = {"",          "BYTE",  "ASCII",     "SHORT",  "LONG",
+                                         "RATIONAL",  "SBYTE", "UNDEFINED", "SSHORT", "SLONG",
+                                         "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
 
 tag::Tag const* known(unsigned short number) {
   auto const* const found = std::find_if(std::begin(tag::kAll), std::end(tag::kAll),
@@ -30,7 +30,7 @@ void append(std::string& out, TagName tag) {
 
 void append(std::string& out, TypedCount values) {
   append(out, values.count);
-  out.append(" ").append(kTypeNames[values.typeCode]);
+  out.append(" ").append(kNamesByTypeCode[values.typeCode]);
   out += values.count == 1 ? " value" : " values";
 }
 
@@ -47,7 +47,8 @@ void append(std::string& out, DirectoryName const& directory) {
 
 char const* fieldOf(unsigned short tag) {
   auto const* const row = known(tag);
-  return row == nullptr || row->field[0] == '\0' ? nullptr : row->field;
+  bool const hasField = row != nullptr && row->field[0] != '\0';
+  return hasField ? row->field : nullptr;
 }
 
 }  // namespace quavel::detail

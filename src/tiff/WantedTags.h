@@ -10,11 +10,11 @@
 
 namespace quavel::detail {
 
-/// A list of tags as readers write it.
+/// The tags that a reader wants, listed in its call.
 using TagList = std::initializer_list<unsigned short>;
 
-/// The tags that the reader of a directory still wants, each until it is met. An empty list wants
-/// every entry, repeated tags included.
+/// The tags that are still wanted while a directory is read. A listed tag is wanted until it is
+/// met; with an empty list, every entry is wanted, even one with a repeated tag.
 class WantedTags {
  public:
   WantedTags(unsigned short const* tags, std::size_t count) : wantsAll_(count == 0) {
@@ -28,7 +28,7 @@ class WantedTags {
     }
   }
 
-  /// Whether the tag is wanted. A listed tag is wanted only once.
+  /// Whether the tag was still wanted. A listed tag is not wanted again.
   bool take(unsigned short tag) {
     if ((mask_ & bitOf(tag)) == 0) {
       return false;
@@ -36,7 +36,7 @@ class WantedTags {
     return wantsAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
   }
 
-  /// How many are still to be met; more than a directory holds when all are wanted.
+  /// How many listed tags are still to be met; SIZE_MAX when every entry is wanted.
   std::size_t count() const { return wantsAll_ ? SIZE_MAX : left_; }
 
   /// Whether there is a list and all its tags have been met.
@@ -46,13 +46,13 @@ class WantedTags {
   static constexpr std::size_t kShortList = 16;  // no reader's list is longer
   using LongList = std::bitset<std::size_t{UINT16_MAX} + 1>;
 
-  static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << tag % 64; }
+  static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << (tag % 64); }
 
   void add(unsigned short tag) {
     if (longList_) {
       left_ += longList_->test(tag) ? 0 : 1;
       longList_->set(tag);
-    } else if ((mask_ & bitOf(tag)) == 0 || find(tag) == left_) {
+    } else if ((mask_ & bitOf(tag)) == 0 || find(tag) == left_) {  // not yet listed
       shortList_[left_++] = tag;
     }
     mask_ |= bitOf(tag);
@@ -70,10 +70,11 @@ class WantedTags {
     if (i == left_) {
       return false;
     }
-    shortList_[i] = shortList_[--left_];
+    shortList_[i] = shortList_[--left_];  // the last one fills the gap
     return true;
   }
 
+  /// The tag's index in the short list; `left_` when it is not there.
   std::size_t find(unsigned short tag) const {
     std::size_t i = 0;
     while (i < left_ && shortList_[i] != tag) {
@@ -83,10 +84,10 @@ class WantedTags {
   }
 
   bool const wantsAll_;
-  std::uint64_t mask_ = 0;  // rules out most unwanted tags
+  std::uint64_t mask_ = 0;  // a bit for each tag modulo 64: rules out most others quickly
   std::size_t left_ = 0;    // listed tags that are still to be met
   std::array<unsigned short, kShortList> shortList_;
-  std::unique_ptr<LongList> longList_;  // null for a short one
+  std::unique_ptr<LongList> longList_;  // null while the short list is enough
 };
 
 }  // namespace quavel::detail

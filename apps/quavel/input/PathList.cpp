@@ -16,8 +16,8 @@ namespace {
 constexpr std::size_t kReadSize = std::size_t{1} << 16;
 constexpr std::size_t kMaxPathLength = 4096;  // Linux's PATH_MAX
 
-/// The `errno` of reading nothing, which fails for a folder, say; 0 when the file can be read. An
-/// error is thus reported before anything is written.
+/// The `errno` of a read of 0 bytes, which fails for a folder, for example; 0 when it succeeds. So
+/// an error is reported before anything is written.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input entryOf(std::string const& path) {
@@ -38,7 +38,8 @@ Input entryOf(std::string const& path) {
 PathList::PathList(std::string const& name, char separator)
     : fd_(name == "-" ? STDIN_FILENO : ::open(name.c_str(), O_RDONLY | O_CLOEXEC)),
       separator_(separator) {
-  if (int const problem = fd_ == -1 ? errno : whyUnreadable(fd_)) {
+  int const problem = fd_ == -1 ? errno : whyUnreadable(fd_);
+  if (problem != 0) {
     if (fd_ > STDIN_FILENO) {
       ::close(fd_);
     }
@@ -81,7 +82,7 @@ bool PathList::refill() {
   buffer_.erase(0, start_);
   start_ = 0;
   if (buffer_.size() > 2 * kMaxPathLength) {
-    buffer_.resize(kMaxPathLength + 1);  // too long in any case: the rest is not needed
+    buffer_.resize(kMaxPathLength + 1);  // enough to tell that the path is too long
   }
   std::size_t const size = buffer_.size();
   buffer_.resize(size + kReadSize);

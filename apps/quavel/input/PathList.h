@@ -18,8 +18,8 @@ class PathList {
 
   /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
-  /// The next path that is not empty. False: the list has ended, or a read failed; `error` is then
-  /// its `errno`, else 0.
+  /// The next path that is not empty. False: the list has ended, and `error` is 0, or a read
+  /// failed, and `error` is its `errno`.
   bool next(Input& input);
 
   int error = 0;

@@ -29,7 +29,8 @@ bool Source::nextOfPaths(Input& input) {
       walk_.reset();
       if (isWalkEmpty_) {
         std::string const extensions = whyUnknown({});
-        report_(inputs_.paths[nextPath_ - 1],
+        std::string const& folder = inputs_.paths[nextPath_ - 1];
+        report_(folder,
                 "no photos found in it; hidden and excluded names are "
                 "skipped, and others must end in" +
                     extensions.substr(extensions.rfind(':') + 1));
@@ -52,7 +53,7 @@ bool Source::nextOfPaths(Input& input) {
 }
 
 /// Drops the CR that a list from another system leaves at the end of a path, unless it belongs to
-/// the file's name. True: there was nothing else on the line.
+/// the file's name. True: the line is now empty.
 bool Source::dropCarriageReturn(std::string& path) {
   struct stat status = {};
   if (path.back() != '\r' || ::lstat(path.c_str(), &status) == 0) {
@@ -75,7 +76,7 @@ bool Source::nextOfList(Input& input) {
       return true;
     }
   }
-  int const error = list_->error;
+  int const error = list_->error;  // if it is 0, nobody looks at the input below
   list_.reset();
   input = {inputs_.list,
            false,

@@ -26,6 +26,7 @@ class Source {
 
   /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
+  /// The next file. False: there are no more.
   bool next(Input& input);
 
  private:

@@ -35,10 +35,11 @@ constexpr Relation kRelations[] = {
     {"!=", meets<std::not_equal_to<>>},  {"==", meets<std::equal_to<>>},
     {"=", meets<std::equal_to<>>},       {">", meets<std::greater<>>},
     {"<", meets<std::less<>>},           {"~", containsText}};
+// By the index of the type in Words.
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// The text as a value of a field's type; absent when it is not one as a whole.
+/// The whole text as a value of a field's type; absent when it is not such a value.
 struct Parsed {
   std::string_view text;
 
@@ -53,7 +54,7 @@ struct Parsed {
       auto const* const end = text.data() + text.size();
       auto const result = std::from_chars(text.data(), end, value);
       bool const isWhole = result.ec == std::errc() && result.ptr == end;
-      return isWhole && value == value ? Value(value) : Value();  // NaN equals nothing
+      return isWhole && value == value ? Value(value) : Value();  // NaN is not equal to itself
     }
   }
 };
@@ -63,9 +64,8 @@ Value comparable(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
   auto const* const words = std::get_if<std::string (*)(std::string const&)>(&field.words);
   if (text != nullptr && words != nullptr && *words == words::date) {
-    for (char& c : *text) {
-      c = c == ':' ? '-' : c == 'T' ? ' ' : c;
-    }
+    std::replace(text->begin(), text->end(), ':', '-');
+    std::replace(text->begin(), text->end(), 'T', ' ');
   }
   return value;
 }

@@ -14,11 +14,11 @@ class Condition {
   /// What may begin the comparison after a field's name.
   static constexpr char kSigns[] = "<>=!~";
 
-  /// `comparison` is a relation and a value, such as ">=3200". Throws std::invalid_argument, which
-  /// quotes the wrong part, when it is malformed or does not suit the field.
+  /// `comparison` is a relation and a value, such as ">=3200". If it is malformed or does not suit
+  /// the field, throws std::invalid_argument with a message that quotes the wrong part.
   Condition(Field const& field, std::string_view comparison);
 
-  /// Compares exact values. An absent value never meets it.
+  /// Compares exact values. False when the value is absent.
   bool holds(Outcome const& outcome) const;
 
  private:

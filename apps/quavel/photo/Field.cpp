@@ -18,6 +18,7 @@ using quavel::QVMetadata;
 constexpr std::size_t kMaxCells = 200;
 constexpr std::size_t kMaxBytes = 8 * kMaxCells;
 
+/// A member of a record or a problem; absent when it holds the value that means absence there.
 template <class T>
 Value present(T value) {
   if constexpr (std::is_same_v<T, std::string>) {
@@ -40,7 +41,7 @@ Value captureDate(Outcome const& outcome) {
   return outcome.record ? present(outcome.record->captureDate()) : Value();
 }
 
-/// The same without blank dates, which a record keeps as the file has them.
+/// The same, but never a blank date; the record itself may choose one.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -57,6 +58,7 @@ Value problem(Outcome const& outcome) {
   return present(outcome.problem.*member);
 }
 
+/// The bytes in hexadecimal of a path that is not valid UTF-8.
 Value pathBytes(Outcome const& outcome) {
   if (isPlain(outcome.path) || pathAsUtf8(outcome.path) == outcome.path) {
     return {};

@@ -14,8 +14,7 @@ namespace app {
 /// An exact value; the first alternative is absence. Texts are UTF-8.
 using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
-/// A function that puts a value into words, by the value's type: the same alternatives, without
-/// absence.
+/// A function that puts a value into words, for each type that a present Value can have.
 using Words = std::variant<std::string (*)(bool), std::string (*)(std::int32_t),
                            std::string (*)(std::int64_t), std::string (*)(float),
                            std::string (*)(std::string const&)>;
@@ -36,7 +35,7 @@ std::vector<Field> const& allFields();
 /// Null when there is no such field.
 Field const* fieldNamed(std::string_view name);
 bool contains(Fields const& fields, std::string_view name);
-/// The fields of a file that gave a record: those up to error.
+/// The fields of a file that gave a record: those before error.
 Fields recordFields();
 
 /// The field for people: in words, on one line, safe for a terminal and at most 200 cells long
@@ -46,11 +45,11 @@ std::string inWords(Field const& field, Outcome const& outcome);
 /// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
-/// The value that sorts and selects files, the same in every form.
+/// The value by which files are sorted and selected, whatever form the output has.
 Value compared(Field const& field, Outcome const& outcome);
 
-/// Appends the value for programs: text as it is, digits that read back to the same number,
-/// "Infinity", "true". Nothing when absent.
+/// Appends the value for programs: a text as it is, a number with the digits that give it exactly
+/// when read back, or "Infinity", "true" or "false". Nothing when absent.
 void appendExact(std::string& text, Value const& value);
 
 }  // namespace app

@@ -24,20 +24,20 @@ struct Problem {
 struct Input {
   std::string path;
   bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
-  Problem problem;       ///< Set when it cannot even be tried.
+  Problem problem;       ///< Set when it is not even to be read.
 };
 
-/// What became of one file.
+/// The result of reading one file.
 struct Outcome {
   std::string path;
   /// Null when there is none, or it is no longer needed.
   std::shared_ptr<quavel::QVMetadata> record;
-  Problem problem;                    ///< When there is no record.
+  Problem problem;                    ///< Why there is no record.
   char const* format = "";            ///< As the journal gives it.
-  std::vector<quavel::QVNote> notes;  ///< When they are wanted.
-  std::uint64_t furtherSteps = 0;     ///< Those that the notes leave out.
+  std::vector<quavel::QVNote> notes;  ///< Empty unless they are wanted.
+  std::uint64_t furtherSteps = 0;     ///< How many steps the notes leave out.
   bool isShown = true;                ///< It meets all conditions.
-  std::string text;                   ///< As the chosen form shows it, once prepared.
+  std::string text;                   ///< The output for it in the chosen form, once prepared.
   std::vector<std::string> cells;     ///< The same for the table.
 };
 

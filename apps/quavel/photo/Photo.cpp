@@ -27,12 +27,13 @@ Problem irregular(mode_t mode) {
   if (S_ISDIR(mode)) {
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
-  char const* const kind = S_ISFIFO(mode) ? "FIFO" : S_ISSOCK(mode) ? "socket" : "device";
+  char const* const other = S_ISSOCK(mode) ? "socket" : "device";
+  char const* const kind = S_ISFIFO(mode) ? "FIFO" : other;
   return {reason::kSpecialFile,
           std::string("a ") + kind + ", not a regular file; give a photo, or use --stdin"};
 }
 
-/// Why the library must not be given the path; no problem otherwise.
+/// Why the path must not be given to the library; no problem if it may.
 Problem whyUnfit(std::string const& path) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
@@ -41,7 +42,7 @@ Problem whyUnfit(std::string const& path) {
   return S_ISREG(status.st_mode) ? Problem() : irregular(status.st_mode);
 }
 
-/// All bytes of standard input, or the problem.
+/// All bytes of standard input; sets `problem` if they cannot all be read.
 std::string readAll(Problem& problem) {
   constexpr std::size_t kStep = std::size_t{1} << 16;
   std::string bytes;
@@ -69,7 +70,7 @@ bool isDate(std::string const& text) {
   day.tm_year = time.tm_year;
   day.tm_mon = time.tm_mon;
   day.tm_mday = time.tm_mday;
-  ::timegm(&day);  // makes 1 March of 30 February
+  ::timegm(&day);  // turns a day that does not exist, such as 30 February, into a later one
   // strptime accepts any number of blanks before a number.
   return text.size() == kDateSize && end == text.c_str() + kDateSize && text.find(' ') == 10 &&
          text.rfind(' ') == 10 && day.tm_mday == time.tm_mday && time.tm_sec <= 60;

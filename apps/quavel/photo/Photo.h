@@ -12,7 +12,7 @@ namespace app {
 
 using Detail = quavel::QVJournal::Detail;
 
-/// What follows the last ".", in lower case; empty without a ".".
+/// The text after the path's last ".", in lower case; empty when the path has no ".".
 std::string extensionOf(std::string_view path);
 /// Whether an extension in lower case names a format.
 bool isPhotoExtension(std::string const& extension);
@@ -20,11 +20,11 @@ bool isPhotoExtension(std::string const& extension);
 std::string whyUnknown(std::string const& extension);
 
 /// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
-/// The outcome holds notes when all of them are wanted.
+/// The outcome has notes only with `Detail::All`.
 Outcome readPhoto(Input input, Detail detail);
 
-/// Clears blank dates. With `asIso`, well-formed Exif dates become
-/// "2018-02-21T12:08:56"; what is not a date stays as it is.
+/// Clears blank dates. With `asIso`, well-formed Exif dates become "2018-02-21T12:08:56"; any other
+/// text stays as it is.
 void tidyDates(quavel::QVMetadata& record, bool asIso);
 
 /// Reads one image from standard input, under the path "-".

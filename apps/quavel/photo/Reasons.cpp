@@ -30,7 +30,7 @@ char const* advice(int error) {
   }
 }
 
-/// What a reason means, put before the facts; empty where the facts say it themselves.
+/// What a reason means, to be put before the facts; empty when the facts alone are clear.
 char const* leadOf(QVReason reason) {
   switch (reason) {
     case QVReason::ReadError:
@@ -82,9 +82,9 @@ Problem refusal(QVJournal const& journal) {
       return {QVJournal::reasonName(note.reason), hint.text + ": " + note.text, note.position};
     }
   }
-  char const* const end =
+  char const* const tip =
       note.reason == QVReason::Empty ? "; copy it again from its source" : advice(note.systemError);
-  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + end, note.position};
+  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + tip, note.position};
 }
 
 }  // namespace app::reason

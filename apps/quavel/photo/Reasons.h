@@ -11,7 +11,7 @@
 /// Why files give no record, in words that their owner can act on.
 namespace app::reason {
 
-// The codes for what the library is not even asked to read.
+// The codes of problems other than the library's refusals.
 inline constexpr char kFolder[] = "folder";
 inline constexpr char kSpecialFile[] = "special-file";
 inline constexpr char kBadPath[] = "bad-path";
@@ -28,7 +28,7 @@ Problem cannotOpen(int error);
 Problem cannotRead(int error);
 /// For an exception thrown during the read.
 Problem failure(std::exception const& error);
-/// The library's refusal. When the file is plainly of another kind, it says so first.
+/// The library's refusal. Its text first says so when the file is plainly of another kind.
 Problem refusal(quavel::QVJournal const& journal);
 
 }  // namespace app::reason

@@ -14,7 +14,7 @@ std::string decimal(float value, int digits) {
     return value < 0 ? "-∞" : "∞";
   }
   char text[32];
-  if (!(std::fabs(value) < 1e7F)) {
+  if (std::fabs(value) >= 1e7F) {
     std::snprintf(text, sizeof text, "%g", static_cast<double>(value));
     return text;
   }
@@ -27,7 +27,7 @@ std::string decimal(float value, int digits) {
   return result == "-0" ? "0" : result;
 }
 
-/// The name of a value that is counted from `first`.
+/// The name of a value; `names[0]` is that of the value `first`.
 template <std::size_t count>
 std::string named(char const* const (&names)[count], std::int32_t value, std::int32_t first = 0) {
   if (value < first || static_cast<std::size_t>(value - first) >= count) {

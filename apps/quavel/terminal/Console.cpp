@@ -29,6 +29,7 @@ void Console::printFileMessage(std::string const& path, std::string const& probl
 void Console::showProgress(std::string const& line) {
   isProgressShown_ = true;
   interrupt::setProgressShown(true);
+  // The last cell stays free: some terminals go to the next line when it is written.
   interrupt::write(STDERR_FILENO,
                    interrupt::kEraseLine + keepStart(line, terminalWidth(STDERR_FILENO) - 1));
 }

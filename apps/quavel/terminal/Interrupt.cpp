@@ -27,6 +27,7 @@ std::atomic<int> pendingSignal{0};
   ::_exit(128 + signal);
 }
 
+/// Completes the output and the terminal's line, then dies.
 [[noreturn]] void leave() {
   ::alarm(1);  // in case nobody reads the tail
   isWriting = true;
@@ -44,7 +45,7 @@ void handle(int signal) {
     if (signal == SIGALRM) {
       die();
     }
-    return;  // already ending, and the alarm limits how long that takes
+    return;  // it is ending already, within the alarm's second
   }
   pendingSignal = signal;
   if (!isWriting) {

@@ -5,12 +5,12 @@
 
 #include <string_view>
 
-/// Ends the process at once, by the signal, when the user or the system asks for it. There is no
-/// thread for that: a second thread makes every system call of a reader more expensive.
+/// Ends the process at once, by the signal itself, when the user or the system sends one. No thread
+/// waits for signals: a second thread makes every system call of a reader more expensive.
 namespace app::interrupt {
 
-/// Must be called once, on the thread that writes, before any other is started. Signals that are
-/// ignored then stay ignored.
+/// Must be called once, on the thread that writes, before any other is started. Signals that the
+/// process already ignores stay ignored.
 void install();
 
 /// While it lives, threads that the calling thread starts do not receive the signals.
@@ -28,17 +28,17 @@ class BlockSignals {
 /// The characters that erase a terminal's line.
 inline constexpr char kEraseLine[] = "\r\x1b[K";
 
-/// Writes the bytes, or those that can be written. A signal handler may call it.
+/// Writes the bytes, as far as possible. A signal handler may call it.
 void write(int fd, std::string_view bytes);
 
-/// What closes the output when an interrupt ends it; null for nothing. Not copied.
+/// Sets the text that an interrupt writes to standard output at the end; null: none. Not copied.
 void setTail(char const* tail);
 
-/// Whether a line on the terminal must be erased at the end.
+/// States whether the terminal shows a progress line, which an interrupt must erase.
 void setProgressShown(bool isShown);
 
-/// While one lives, an interrupt waits until what is being written is finished, for a second at
-/// most; further signals change nothing.
+/// While one lives, an interrupt waits for the write in progress, but for a second at most. Further
+/// signals change nothing.
 class WriteScope {
  public:
   WriteScope();

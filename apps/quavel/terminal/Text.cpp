@@ -15,7 +15,7 @@ constexpr std::string_view kEllipsis = "…";
 
 /// One character, or one byte that is not part of a valid one.
 struct Character {
-  utf8proc_int32_t code;  // of the byte, when it is not valid
+  utf8proc_int32_t code;  // the byte itself, when it is not valid
   std::string_view bytes;
   bool isValid;
 };
@@ -46,7 +46,7 @@ std::size_t cellsOf(Character const& character) {
   }
 }
 
-/// It has no glyph of its own but changes how its neighbours or the line appear.
+/// Whether it has no glyph of its own but changes how its neighbours or the line appear.
 bool isHidden(Character const& character) {
   constexpr utf8proc_int32_t kNonJoiner = 0x200c;
   constexpr utf8proc_int32_t kJoiner = 0x200d;
@@ -86,8 +86,8 @@ bool isUtf8(std::string_view text) {
 }  // namespace
 
 bool isPlain(std::string_view text) {
-  // Eight characters at a time: subtracting a space or adding one sets the top bit of any byte that
-  // is not visible ASCII, unless it is already set.
+  // Eight characters at a time: subtracting ' ' or adding 1 sets the top bit of any byte that is
+  // not visible ASCII, unless it is set already. Only such a byte carries into the next one.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = kSpaces;
@@ -96,8 +96,8 @@ bool isPlain(std::string_view text) {
     std::memcpy(&word, text.data(), sizeof word);
     tops |= word | (word - kSpaces) | (word + kOnes);
   }
-  for (char const c : text) {
-    word = word << 8U | static_cast<unsigned char>(c);
+  for (char const c : text) {  // less than a word: the rest of it is spaces, or has been looked at
+    word = (word << 8U) | static_cast<unsigned char>(c);
   }
   tops |= word | (word - kSpaces) | (word + kOnes);
   return (tops & (kOnes << 7U)) == 0;

@@ -7,7 +7,7 @@
 
 namespace app {
 
-/// Whether it is all visible ASCII. Nearly all texts are, and need no look at each character.
+/// Whether it is all visible ASCII. Nearly all texts are, and are not looked at further.
 bool isPlain(std::string_view text);
 /// A text from a file as UTF-8. Texts that are not UTF-8 are mostly Latin-1: when any byte is not
 /// valid UTF-8, the whole text is read as Latin-1.
@@ -24,8 +24,8 @@ std::string escapedPath(std::string path);
 
 /// Terminal cells that an escaped text takes.
 std::size_t cells(std::string_view text);
-/// The start or the end of an escaped text, cut with "…" to fit the cells. The start also has at
-/// most `most` bytes, since combining marks take no cells.
+/// The start or the end of an escaped text, cut with "…" if it takes more than `width` cells. The
+/// start is also cut after `most` bytes, since any number of combining marks takes no cells.
 std::string keepStart(std::string const& text, std::size_t width,
                       std::size_t most = std::string::npos);
 std::string keepEnd(std::string const& text, std::size_t width);
