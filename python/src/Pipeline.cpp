@@ -8,6 +8,8 @@
 #include <new>
 #include <system_error>
 
+#include "photo/Reasons.h"
+
 namespace binding {
 
 namespace {
@@ -33,13 +35,13 @@ bool isSpecial(Photo& photo) {
     return false;
   }
   bool const isFolder = S_ISDIR(status.st_mode);
-  photo.refusal.reason = isFolder ? "folder" : "special-file";
+  photo.refusal.reason = isFolder ? app::reason::kFolder : app::reason::kSpecialFile;
   photo.refusal.text = isFolder ? "a folder, not a photo" : "not a regular file";
   return true;
 }
 
 void readPhoto(Photo& photo, QVJournal& journal) {
-  if (!photo.refusal.reason.empty()) {
+  if (photo.refusal) {
     return;
   }
   try {
@@ -51,7 +53,7 @@ void readPhoto(Photo& photo, QVJournal& journal) {
       photo.refusal = refusalOf(journal);
     }
   } catch (std::bad_alloc const&) {
-    photo.refusal = {"out-of-memory", "not enough memory", -1, 0};  // short texts need none
+    photo.refusal = {{app::reason::kOutOfMemory, "not enough memory"}, 0};  // short texts need none
   }
 }
 

@@ -8,23 +8,24 @@
 
 #include "Arguments.h"
 #include "Unlocked.h"
+#include "photo/Reasons.h"
 
 namespace binding {
 
 namespace {
 
-constexpr std::size_t kLargestBatch = 64;
+constexpr std::size_t kMaxBatch = 64;
 // A batch is to be short enough for results to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;
 // For files that are not cached: there 32 are several times as fast as 2, and more gain little.
-constexpr unsigned kUsualJobs = 32;
+constexpr unsigned kUncachedJobs = 32;
 // How long Ctrl-C may go unnoticed.
-constexpr std::chrono::milliseconds kPatience{50};
+constexpr std::chrono::milliseconds kSignalInterval{50};
 
 std::unique_ptr<Pipeline> makePipeline(unsigned jobs) {
   unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
   return jobs != 0 ? std::make_unique<Pipeline>(jobs, jobs)
-                   : std::make_unique<Pipeline>(std::max(processors, kUsualJobs), processors);
+                   : std::make_unique<Pipeline>(std::max(processors, kUncachedJobs), processors);
 }
 
 /// A path of a folder's, as os.fsdecode gives it.
@@ -71,9 +72,10 @@ Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
     : source_(std::move(source)), process_(::getpid()), pipeline_(makePipeline(jobs)) {
   if (isFolder) {
     isBytes_ = py::isinstance<py::bytes>(source_);
-    std::string folder = pathOf(source_, "paths_or_folder");
+    std::string const folder = pathOf(source_, "paths_or_folder");
+    static app::Filter const usual;
     Unlocked const unlocked;
-    walk_.emplace(std::move(folder));
+    walk_.emplace(folder, usual, [](auto const&, auto const&) {});
   }
 }
 
@@ -101,7 +103,7 @@ py::list Scanner::nextBatch() {
   auto const work = std::move(order_.front());
   order_.pop_front();
   batchSize_ = work->batch.seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
-                                                : std::min(batchSize_ * 2, kLargestBatch);
+                                                : std::min(batchSize_ * 2, kMaxBatch);
   return resultsOf(*work);
 }
 
@@ -123,12 +125,13 @@ void Scanner::takeFound(Work& work) {
   while (photos.size() < batchSize_ && !walk_->isAtEnd()) {
     {
       Unlocked const unlocked;
-      auto const end = std::chrono::steady_clock::now() + kPatience;
-      Photo photo;
-      while (photos.size() < batchSize_ && !walk_->isAtEnd() &&
-             std::chrono::steady_clock::now() < end) {
-        if (walk_->step(photo)) {
-          photos.push_back(std::move(photo));
+      auto const end = Clock::now() + kSignalInterval;
+      app::Input input;
+      while (photos.size() < batchSize_ && !walk_->isAtEnd() && Clock::now() < end) {
+        if (walk_->step(input)) {
+          int const error = input.problem ? walk_->error : 0;
+          photos.push_back(
+              {std::move(input.path), input.isPhoto, {std::move(input.problem), error}});
         }
       }
     }
@@ -160,8 +163,8 @@ void Scanner::takePaths(Work& work) {
         if (!error.matches(PyExc_ValueError)) {
           throw;
         }
-        photo.refusal = {"bad-path", "the path contains a character that no path can contain", -1,
-                         0};
+        photo.refusal = {
+            {app::reason::kBadPath, "the path contains a character that no path can contain"}, 0};
       }
       work.paths.append(path);
       work.batch.photos.push_back(std::move(photo));
@@ -181,7 +184,7 @@ void Scanner::waitForOldest() {
   while (!isDone) {
     {
       Unlocked const unlocked;
-      isDone = pipeline_->waitFor(oldest, kPatience);
+      isDone = pipeline_->waitFor(oldest, kSignalInterval);
     }
     if (PyErr_CheckSignals() != 0) {
       throw py::error_already_set();

@@ -11,7 +11,7 @@
 #include <string>
 
 #include "Pipeline.h"
-#include "Walk.h"
+#include "input/FolderWalk.h"
 
 namespace binding {
 
@@ -49,7 +49,7 @@ class Scanner {
 
   py::object source_;  // null once it has ended
   std::optional<py::error_already_set> failure_;
-  std::optional<Walk> walk_;
+  std::optional<app::FolderWalk> walk_;
   bool isBytes_ = false;
   pid_t process_;
   std::unique_ptr<Pipeline> pipeline_;
