@@ -32,7 +32,7 @@ long countWaits() { return 0; }
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
     : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kTellsWaits), work_(std::move(work)) {
-#ifdef __GLIBC__
+#if defined(__GLIBC__) && defined(QUAVEL_COMMAND_VERSION)  // in no process but the command's
   // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
   ::mallopt(M_ARENA_MAX, 4);
 #endif
@@ -42,7 +42,6 @@ Pipeline::~Pipeline() {
   {
     std::lock_guard<std::mutex> const lock(mutex_);
     isEnding_ = true;
-    waiting_.clear();
   }
   hasWork_.notify_all();
   for (auto& thread : threads_) {
@@ -72,9 +71,6 @@ void Pipeline::submit(std::unique_ptr<Batch> batch) {
 }
 
 std::unique_ptr<Batch> Pipeline::take() {
-  if (order_.empty()) {
-    return nullptr;
-  }
   auto batch = std::move(order_.front());
   order_.pop_front();
   std::unique_lock<std::mutex> lock(mutex_);
@@ -85,9 +81,10 @@ std::unique_ptr<Batch> Pipeline::take() {
   return batch;
 }
 
-bool Pipeline::isOldestDone() {
-  std::lock_guard<std::mutex> const lock(mutex_);
-  return !order_.empty() && order_.front()->isDone;
+bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
+  std::unique_lock<std::mutex> lock(mutex_);
+  return !order_.empty() &&
+         batchDone_.wait_for(lock, patience, [this] { return order_.front()->isDone; });
 }
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * limit()); }

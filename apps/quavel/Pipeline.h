@@ -2,6 +2,7 @@
 #define QUAVEL_APPS_PIPELINE_H
 
 #include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -16,8 +17,10 @@
 
 namespace app {
 
-/// Some consecutive files.
+/// Some consecutive files. Whoever knows more about them derives from it.
 struct Batch {
+  virtual ~Batch() = default;
+
   std::vector<Input> inputs;
   std::vector<Outcome> outcomes;
   double seconds = 0;     ///< How long the work took.
@@ -41,13 +44,13 @@ class Pipeline {
   Pipeline& operator=(Pipeline const&) = delete;
 
   void submit(std::unique_ptr<Batch> batch);
-  /// Waits for the oldest batch and returns it, or throws what its work threw; null when the
-  /// pipeline is empty.
+  /// The oldest batch, once it is done, or throws what its work threw. Not when there is none.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
   /// Whether enough batches are under way to keep the threads busy.
   bool isFull() const;
-  bool isOldestDone();
+  /// Waits for the oldest batch, at most that long; false when it is not done, or there is none.
+  bool isOldestDone(std::chrono::milliseconds patience = {});
 
  private:
   std::size_t limit() const;

@@ -8,7 +8,7 @@ using quavel::QVJournal;
 
 Refusal refusalOf(QVJournal const& journal) {
   quavel::QVNote const& note = *journal.refusal();
-  Refusal refusal = {QVJournal::reasonName(note.reason), note.text, note.position,
+  Refusal refusal = {{QVJournal::reasonName(note.reason), note.text, note.position},
                      note.systemError};
   for (auto const& hint : journal.notes()) {
     if (hint.reason == quavel::QVReason::OtherContent) {

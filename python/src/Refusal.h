@@ -5,17 +5,15 @@
 #include <quavel/QVJournal.h>
 
 #include <cstdint>
-#include <string>
+
+#include "photo/Outcome.h"
 
 namespace binding {
 
 namespace py = pybind11;
 
 /// Why there is no record.
-struct Refusal {
-  std::string reason;
-  std::string text;
-  std::int64_t position = -1;
+struct Refusal : app::Problem {
   int systemError = 0;
 };
 

@@ -7,24 +7,26 @@
 #include <utility>
 
 #include "Arguments.h"
+#include "Refusal.h"
 #include "Unlocked.h"
+#include "photo/Reasons.h"
 
 namespace binding {
 
 namespace {
 
-constexpr std::size_t kLargestBatch = 64;
+constexpr std::size_t kMaxBatch = 64;
 // A batch is to be short enough for results to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;
 // For files that are not cached: there 32 are several times as fast as 2, and more gain little.
-constexpr unsigned kUsualJobs = 32;
+constexpr unsigned kUncachedJobs = 32;
 // How long Ctrl-C may go unnoticed.
-constexpr std::chrono::milliseconds kPatience{50};
+constexpr std::chrono::milliseconds kSignalInterval{50};
 
-std::unique_ptr<Pipeline> makePipeline(unsigned jobs) {
+std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs) {
   unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
-  return jobs != 0 ? std::make_unique<Pipeline>(jobs, jobs)
-                   : std::make_unique<Pipeline>(std::max(processors, kUsualJobs), processors);
+  unsigned const most = jobs != 0 ? jobs : std::max(processors, kUncachedJobs);
+  return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, readBatch);
 }
 
 /// A path of a folder's, as os.fsdecode gives it.
@@ -71,9 +73,10 @@ Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
     : source_(std::move(source)), process_(::getpid()), pipeline_(makePipeline(jobs)) {
   if (isFolder) {
     isBytes_ = py::isinstance<py::bytes>(source_);
-    std::string folder = pathOf(source_, "paths_or_folder");
+    std::string const folder = pathOf(source_, "paths_or_folder");
+    static app::Filter const usual;
     Unlocked const unlocked;
-    walk_.emplace(std::move(folder));
+    walk_.emplace(folder, usual, [](auto const&, auto const&) {});
   }
 }
 
@@ -85,50 +88,51 @@ py::list Scanner::nextBatch() {
     return py::list();
   }
   auto const start = Clock::now();
-  while (source_ && order_.size() < 2 * pipeline_->limit()) {
+  while (source_ && !pipeline_->isFull()) {
     submitNext();
-    if (isLong(start) && !order_.empty() && pipeline_->isDone(order_.front()->batch)) {
+    if (isLong(start) && pipeline_->isOldestDone()) {
       break;  // the caller need not wait for a slow iterable or folder
     }
   }
-  if (order_.empty()) {
+  if (pipeline_->isEmpty()) {
     if (failure_) {
       throw std::exchange(failure_, std::nullopt).value();
     }
     return py::list();
   }
   waitForOldest();
-  auto const work = std::move(order_.front());
-  order_.pop_front();
-  batchSize_ = work->batch.seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
-                                                : std::min(batchSize_ * 2, kLargestBatch);
-  return resultsOf(*work);
+  py::list const paths = std::move(paths_.front());
+  paths_.pop_front();
+  auto const batch = pipeline_->take();
+  batchSize_ = batch->seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
+                                           : std::min(batchSize_ * 2, kMaxBatch);
+  return resultsOf(static_cast<Batch&>(*batch), paths);
 }
 
 void Scanner::submitNext() {
-  auto work = std::make_unique<Work>();
+  auto batch = std::make_unique<Batch>();
+  py::list paths;
   if (walk_) {
-    takeFound(*work);
+    takeFound(*batch);
   } else {
-    takePaths(*work);
+    takePaths(*batch, paths);
   }
-  if (!work->batch.photos.empty()) {
-    order_.push_back(std::move(work));
-    pipeline_->submit(order_.back()->batch, order_.size());
+  if (!batch->inputs.empty()) {
+    paths_.push_back(std::move(paths));
+    pipeline_->submit(std::move(batch));
   }
 }
 
-void Scanner::takeFound(Work& work) {
-  auto& photos = work.batch.photos;
-  while (photos.size() < batchSize_ && !walk_->isAtEnd()) {
+void Scanner::takeFound(Batch& batch) {
+  while (batch.inputs.size() < batchSize_ && !walk_->isAtEnd()) {
     {
       Unlocked const unlocked;
-      auto const end = std::chrono::steady_clock::now() + kPatience;
-      Photo photo;
-      while (photos.size() < batchSize_ && !walk_->isAtEnd() &&
-             std::chrono::steady_clock::now() < end) {
-        if (walk_->step(photo)) {
-          photos.push_back(std::move(photo));
+      auto const end = Clock::now() + kSignalInterval;
+      app::Input input;
+      while (batch.inputs.size() < batchSize_ && !walk_->isAtEnd() && Clock::now() < end) {
+        if (walk_->step(input)) {
+          int const error = input.problem ? walk_->error : 0;
+          batch.add(std::move(input), error);
         }
       }
     }
@@ -141,10 +145,10 @@ void Scanner::takeFound(Work& work) {
   }
 }
 
-void Scanner::takePaths(Work& work) {
+void Scanner::takePaths(Batch& batch, py::list& paths) {
   try {
     auto const start = Clock::now();
-    while (work.batch.photos.size() < batchSize_ && (work.batch.photos.empty() || !isLong(start))) {
+    while (batch.inputs.size() < batchSize_ && (batch.inputs.empty() || !isLong(start))) {
       auto const path = nextOf(source_);
       if (!path) {
         source_ = py::object();
@@ -153,18 +157,18 @@ void Scanner::takePaths(Work& work) {
         }
         return;
       }
-      Photo photo;
+      app::Input input;
       try {
-        photo.path = pathOf(path, "a path of paths_or_folder");
+        input.path = pathOf(path, "a path of paths_or_folder");
       } catch (py::error_already_set const& error) {
         if (!error.matches(PyExc_ValueError)) {
           throw;
         }
-        photo.refusal = {"bad-path", "the path contains a character that no path can contain", -1,
-                         0};
+        input.problem = {app::reason::kBadPath,
+                         "the path contains a character that no path can contain"};
       }
-      work.paths.append(path);
-      work.batch.photos.push_back(std::move(photo));
+      paths.append(path);
+      batch.add(std::move(input), 0);
     }
   } catch (py::error_already_set& error) {
     source_ = py::object();
@@ -176,12 +180,11 @@ void Scanner::takePaths(Work& work) {
 }
 
 void Scanner::waitForOldest() {
-  Batch const& oldest = order_.front()->batch;
-  bool isDone = pipeline_->isDone(oldest);
+  bool isDone = pipeline_->isOldestDone();
   while (!isDone) {
     {
       Unlocked const unlocked;
-      isDone = pipeline_->waitFor(oldest, kPatience);
+      isDone = pipeline_->isOldestDone(kSignalInterval);
     }
     if (PyErr_CheckSignals() != 0) {
       throw py::error_already_set();
@@ -189,15 +192,15 @@ void Scanner::waitForOldest() {
   }
 }
 
-py::list Scanner::resultsOf(Work& work) {
+py::list Scanner::resultsOf(Batch& batch, py::list const& paths) {
   auto const type = py::module_::import("quavel._types").attr("Result");
   auto* const resultType = reinterpret_cast<PyTypeObject*>(type.ptr());
-  auto& photos = work.batch.photos;
-  py::list results(photos.size());
-  for (std::size_t i = 0; i < photos.size(); ++i) {
-    Photo& photo = photos[i];
-    py::object path = walk_ ? decoded(photo.path, isBytes_) : py::object(work.paths[i]);
-    py::object error = photo.record ? py::none() : noRecord(photo.refusal, path);
+  py::list results(batch.outcomes.size());
+  for (std::size_t i = 0; i < batch.outcomes.size(); ++i) {
+    app::Outcome& photo = batch.outcomes[i];
+    py::object path = walk_ ? decoded(photo.path, isBytes_) : py::object(paths[i]);
+    py::object error =
+        photo.record ? py::none() : noRecord({photo.problem, batch.systemErrors[i]}, path);
     results[i] = makeResult(resultType, std::move(path), py::cast(std::move(photo.record)),
                             std::move(error));
   }
@@ -206,10 +209,8 @@ py::list Scanner::resultsOf(Work& work) {
 
 int Scanner::traverse(visitproc visit, void* arg) {
   Py_VISIT(source_.ptr());
-  for (auto const& work : order_) {
-    if (work) {
-      Py_VISIT(work->paths.ptr());
-    }
+  for (auto const& paths : paths_) {
+    Py_VISIT(paths.ptr());
   }
   return 0;
 }
@@ -219,14 +220,11 @@ void Scanner::close() {
   if (process_ != ::getpid()) {
     // The threads exist in the parent alone, and what they worked on may be half done.
     static_cast<void>(pipeline_.release());
-    for (auto& work : order_) {
-      static_cast<void>(work.release());
-    }
   } else {
     Unlocked const unlocked;
     pipeline_.reset();
   }
-  order_.clear();
+  paths_.clear();
 }
 
 }  // namespace binding

@@ -10,8 +10,8 @@
 #include <optional>
 #include <string>
 
-#include "Pipeline.h"
-#include "Walk.h"
+#include "Batch.h"
+#include "input/FolderWalk.h"
 
 namespace binding {
 
@@ -36,24 +36,19 @@ class Scanner {
   int traverse(visitproc visit, void* arg);
 
  private:
-  struct Work {
-    py::list paths;  // as the iterator gave them; empty for a folder
-    Batch batch;
-  };
-
   void submitNext();
-  void takePaths(Work& work);
-  void takeFound(Work& work);
+  void takePaths(Batch& batch, py::list& paths);
+  void takeFound(Batch& batch);
   void waitForOldest();
-  py::list resultsOf(Work& work);
+  py::list resultsOf(Batch& batch, py::list const& paths);
 
   py::object source_;  // null once it has ended
   std::optional<py::error_already_set> failure_;
-  std::optional<Walk> walk_;
+  std::optional<app::FolderWalk> walk_;
   bool isBytes_ = false;
   pid_t process_;
-  std::unique_ptr<Pipeline> pipeline_;
-  std::deque<std::unique_ptr<Work>> order_;
+  std::unique_ptr<app::Pipeline> pipeline_;
+  std::deque<py::list> paths_;  // of each batch, as the iterator gave them; empty for a folder
   std::size_t batchSize_ = 1;
 };
 

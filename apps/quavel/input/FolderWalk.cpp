@@ -13,39 +13,37 @@
 
 namespace app {
 
-namespace {
-
-constexpr std::size_t kUsualPath = 100;  // so that most paths take memory only once
-
-}  // namespace
-
 FolderWalk::FolderWalk(std::string const& folder, Filter const& filter, Report report)
     : filter_(filter), report_(std::move(report)) {
   enter(folder, false);
 }
 
 bool FolderWalk::next(Input& input) {
-  while (missed_ || !levels_.empty()) {
-    if (missed_) {
-      input = std::move(*missed_);
-      missed_.reset();
-      return true;
-    }
-    Level& level = levels_.back();
-    if (level.entries.empty()) {
-      levels_.pop_back();
-      continue;
-    }
-    Entry const entry = level.entries.back();
-    level.entries.pop_back();
-    std::string path;
-    path.reserve(kUsualPath);
-    path.append(level.path).append(&level.names[entry.name]);
-    if (visit(entry.type, std::move(path), input)) {
-      return true;
-    }
+  bool isFound = false;
+  while (!isFound && !isAtEnd()) {
+    isFound = step(input);
   }
-  return false;
+  return isFound;
+}
+
+bool FolderWalk::step(Input& input) {
+  if (missed_) {
+    input = std::move(*missed_);
+    missed_.reset();
+    return true;
+  }
+  Level& level = levels_.back();
+  if (level.entries.empty()) {
+    levels_.pop_back();
+    return false;
+  }
+  Entry const entry = level.entries.back();
+  level.entries.pop_back();
+  constexpr std::size_t kUsualPath = 100;  // so that most paths take memory only once
+  std::string path;
+  path.reserve(kUsualPath);
+  path.append(level.path).append(&level.names[entry.name]);
+  return visit(entry.type, std::move(path), input);
 }
 
 bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
@@ -81,10 +79,8 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
     }
     return false;
   }
-  if (!isPhotoExtension(extensionOf(path))) {
-    return false;
-  }
-  return visit(S_ISREG(status.st_mode) ? DT_REG : DT_CHR, std::move(path), input);
+  return isPhotoExtension(extensionOf(path)) &&
+         visit(S_ISREG(status.st_mode) ? DT_REG : DT_CHR, std::move(path), input);
 }
 
 void FolderWalk::enter(std::string const& path, bool isLink) {
@@ -151,7 +147,8 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
   });
 }
 
-void FolderWalk::miss(std::string const& path, int error) {
+void FolderWalk::miss(std::string const& path, int systemError) {
+  error = systemError;
   missed_ = {path,
              false,
              {reason::kUnreadableFolder, "the folder cannot be read: " + reason::systemText(error) +

@@ -38,6 +38,11 @@ class FolderWalk {
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
+  bool isAtEnd() const { return !missed_ && levels_.empty(); }
+  /// A step on the way of `next`; false when it led to nothing yet. Not at the end.
+  bool step(Input& input);
+
+  int error = 0;  ///< The `errno` of the last folder that could not be read.
 
  private:
   using Identity = std::pair<dev_t, ino_t>;
@@ -56,7 +61,7 @@ class FolderWalk {
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
   bool isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const;
   void readEntries(DIR* folder, Level& level);
-  void miss(std::string const& path, int error);
+  void miss(std::string const& path, int systemError);
   bool visit(unsigned char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
 

@@ -1,0 +1,72 @@
+#include "Batch.h"
+
+#include <quavel/QVJournal.h>
+#include <sys/stat.h>
+
+#include <chrono>
+#include <new>
+#include <optional>
+#include <utility>
+
+#include "Refusal.h"
+#include "Unlocked.h"
+#include "photo/Reasons.h"
+
+namespace binding {
+
+namespace {
+
+using quavel::QVJournal;
+using Clock = std::chrono::steady_clock;
+
+/// Opening a FIFO would wait for its writer.
+app::Problem whyUnfit(std::string const& path) {
+  struct stat status = {};
+  if (::stat(path.c_str(), &status) == -1 || S_ISREG(status.st_mode)) {
+    return {};  // reading it will show what is wrong
+  }
+  return S_ISDIR(status.st_mode) ? app::Problem{app::reason::kFolder, "a folder, not a photo"}
+                                 : app::Problem{app::reason::kSpecialFile, "not a regular file"};
+}
+
+void read(app::Outcome& outcome, bool isPhoto, int& systemError, QVJournal& journal) {
+  try {
+    if (!isPhoto) {
+      outcome.problem = whyUnfit(outcome.path);
+    }
+    outcome.record = outcome.problem ? nullptr : journal.read(outcome.path);
+    if (!outcome.record && !outcome.problem) {
+      Refusal const refusal = refusalOf(journal);
+      outcome.problem = refusal;
+      systemError = refusal.systemError;
+    }
+  } catch (std::bad_alloc const&) {
+    outcome.problem = {app::reason::kOutOfMemory, "out of memory"};  // texts too short to need any
+  }
+}
+
+}  // namespace
+
+void readBatch(app::Batch& batch) {
+  // Until its threads run, the pipeline works on the caller's, which is one of Python's.
+  std::optional<Unlocked> unlocked;
+  if (PyGILState_GetThisThreadState() != nullptr) {
+    unlocked.emplace();
+  }
+  auto const start = Clock::now();
+  auto& systemErrors = static_cast<Batch&>(batch).systemErrors;
+  QVJournal journal(QVJournal::Detail::Refusals);
+  batch.outcomes.resize(batch.inputs.size());
+  for (std::size_t i = 0; i < batch.inputs.size(); ++i) {
+    app::Input& input = batch.inputs[i];
+    app::Outcome& outcome = batch.outcomes[i];
+    outcome.path = std::move(input.path);
+    outcome.problem = std::move(input.problem);
+    if (!outcome.problem) {
+      read(outcome, input.isPhoto, systemErrors[i], journal);
+    }
+  }
+  batch.seconds = std::chrono::duration<double>(Clock::now() - start).count();
+}
+
+}  // namespace binding
