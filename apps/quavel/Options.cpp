@@ -191,13 +191,13 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
     check(options);
   } catch (CLI::CallForHelp const&) {
     parsed.status = kSuccess;
-    parsed.output = helpOf(command);
+    parsed.text = helpOf(command);
   } catch (CLI::CallForVersion const& version) {
     parsed.status = kSuccess;
-    parsed.output = std::string(version.what()) + "\n";
+    parsed.text = std::string(version.what()) + "\n";
   } catch (CLI::Error const& error) {
     parsed.status = kWrongUsage;
-    parsed.error = escaped(error.what()) + "\nTry 'quavel --help'.";
+    parsed.text = escaped(error.what()) + "\nTry 'quavel --help'.";
   }
   return parsed;
 }

@@ -26,9 +26,8 @@ struct Options {
 /// What the arguments ask for.
 struct ParsedOptions {
   Options options;
-  std::optional<int> status;  ///< When set, the command only has to end with it.
-  std::string output;         ///< For standard output when `status` is set.
-  std::string error;          ///< For standard error when `status` is set.
+  std::optional<int> status;  ///< When set, the command only has to print `text` and end with it.
+  std::string text;           ///< For standard output; for standard error if the usage is wrong.
 };
 
 ParsedOptions parseOptions(int argc, char const* const* argv);

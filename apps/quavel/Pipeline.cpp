@@ -7,10 +7,6 @@
 
 #include "terminal/Interrupt.h"
 
-#ifdef __GLIBC__
-#include <malloc.h>
-#endif
-
 namespace app {
 
 namespace {
@@ -31,12 +27,7 @@ long countWaits() { return 0; }
 }  // namespace
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
-    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kTellsWaits), work_(std::move(work)) {
-#if defined(__GLIBC__) && defined(QUAVEL_COMMAND_VERSION)  // in no process but the command's
-  // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
-  ::mallopt(M_ARENA_MAX, 4);
-#endif
-}
+    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kTellsWaits), work_(std::move(work)) {}
 
 Pipeline::~Pipeline() {
   {

@@ -13,6 +13,10 @@
 #include "terminal/Console.h"
 #include "terminal/Interrupt.h"
 
+#ifdef __GLIBC__
+#include <malloc.h>
+#endif
+
 namespace {
 
 /// Opens /dev/null for each standard stream that is closed, so that no photo gets its descriptor,
@@ -35,10 +39,11 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
   if (!parsed.status) {
     return app::run(parsed.options, output, console);
   }
-  output.add(parsed.output);
-  output.flush();
-  if (!parsed.error.empty()) {
-    console.printMessage(parsed.error);
+  if (*parsed.status == app::kSuccess) {
+    output.add(parsed.text);
+    output.flush();
+  } else {
+    console.printMessage(parsed.text);
   }
   return *parsed.status;
 }
@@ -48,6 +53,10 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
 int main(int argc, char** argv) {
   holdStandardStreams();
   ::signal(SIGPIPE, SIG_IGN);  // the write then fails instead
+#ifdef __GLIBC__
+  // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
+  ::mallopt(M_ARENA_MAX, 4);
+#endif
   app::interrupt::install();
   app::Console console;
   app::Output output(console);

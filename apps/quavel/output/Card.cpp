@@ -31,10 +31,7 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
     return {};
   }
   static Fields const all = cardFields();
-  std::string card;
-  if (form.fields.empty()) {
-    card = escapedPath(outcome.path) + "\n";
-  }
+  std::string card = form.fields.empty() ? escapedPath(outcome.path) + "\n" : "";
   for (auto const* field : form.fields.empty() ? all : form.fields) {
     std::string const text = inWords(*field, outcome);
     if (text.empty() && !form.showAbsent.value_or(!form.fields.empty())) {

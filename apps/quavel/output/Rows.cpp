@@ -31,8 +31,7 @@ std::string minutes(std::string const& date) {
 
 std::string withoutVerb(std::string const& orientation) {
   constexpr std::string_view kVerb = "turn ";
-  return orientation.compare(0, kVerb.size(), kVerb) == 0 ? orientation.substr(kVerb.size())
-                                                          : orientation;
+  return orientation.substr(orientation.rfind(kVerb, 0) == 0 ? kVerb.size() : 0);
 }
 
 Cells defaultCells(Outcome const& outcome) {

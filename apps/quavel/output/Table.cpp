@@ -17,8 +17,7 @@ namespace {
 
 constexpr std::size_t kPage = 500;
 constexpr auto kFlushInterval = std::chrono::milliseconds(200);
-constexpr auto kFirstFlushInterval =
-    std::chrono::milliseconds(12);  // soon enough to show that it works
+constexpr auto kFirstFlushInterval = std::chrono::milliseconds(12);  // so that work is seen
 
 /// The folder that all paths of the rows are in, with a "/" at its end; empty when there is none.
 std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std::size_t column) {
@@ -31,10 +30,6 @@ std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std:
     folder.erase(folder.rfind('/') + 1);
   }
   return folder.size() <= 2 ? "" : folder;  // "./" and "/" take no room
-}
-
-bool isWithin(Widths const& inner, Widths const& outer) {
-  return std::equal(inner.begin(), inner.end(), outer.begin(), outer.end(), std::less_equal<>());
 }
 
 class Table : public Writer {
@@ -186,8 +181,10 @@ bool Table::isInLayout(std::size_t line) const {
   auto const isInFolder = [this](std::vector<std::string> const& row) {
     return folder_.empty() || row[pathColumn_].compare(0, folder_.size(), folder_) == 0;
   };
+  Widths const natural = naturalWidths(false);
   return line == line_ && std::all_of(page_.begin(), page_.end(), isInFolder) &&
-         isWithin(naturalWidths(false), natural_);
+         std::equal(natural.begin(), natural.end(), natural_.begin(), natural_.end(),
+                    std::less_equal<>());
 }
 
 void Table::writeHeader() {

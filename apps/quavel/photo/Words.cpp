@@ -90,9 +90,7 @@ std::string size(quavel::QVMetadata const& record) {
   if (record.width == -1 && record.height == -1) {
     return {};
   }
-  auto const side = [](std::int32_t value) {
-    return value == -1 ? std::string("?") : std::to_string(value);
-  };
+  auto const side = [](std::int32_t value) { return value == -1 ? "?" : std::to_string(value); };
   return side(record.width) + "x" + side(record.height);
 }
 

@@ -135,11 +135,7 @@ std::string escaped(std::string const& text) {
   std::string result;
   for (std::string_view rest = text; !rest.empty();) {
     Character const next = takeCharacter(rest);
-    if (next.isValid && !isHidden(next)) {
-      result += next.bytes;
-    } else {
-      result += shown(next);
-    }
+    result += next.isValid && !isHidden(next) ? std::string(next.bytes) : shown(next);
   }
   return result;
 }
