@@ -100,7 +100,8 @@ class ManyFiles(CommandTest):
         self.assertEqual(len(tables), 1)
         lines = tables.pop().decode().splitlines()
         self.assertRegex(lines[0], r"^File        Captured          Size       Orient. +Camera +Lens +Exposure$")
-        self.assertEqual((len(lines), lines[-1].split()[6]), (1102, "写真機"))
+        last = lines[-1].split()
+        self.assertEqual((len(lines), last[0], last[6]), (1102, "./later/x.cr3", "写真機"))
         self.assertEqual({line.index("2020-07-06 15:32") for line in lines[1:501]}, {12})
 
     def test_order_is_the_inputs_whatever_the_jobs(self):
@@ -221,9 +222,14 @@ class Endings(CommandTest):
 
     def test_progress_shows_on_a_terminal_and_goes(self):
         main, side = open_terminal(60)
-        with self.start("--jsonl", "--files-from", "list", stdout=subprocess.PIPE, stderr=side) as process:
+        _, other = open_terminal(60)
+        with self.start("--jsonl", "--files-from", "list", stdout=subprocess.PIPE, stderr=side) as process, \
+                self.start("--print0", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
+                           stderr=other) as piped:
             os.close(side)
             time.sleep(0.6)  # a slow reader makes a slow run
+            names = piped.communicate(b"a.tif\n" * 30000, 60)[0]
+            self.assertEqual(names.count(b"\0"), 30000)  # its files are not counted ahead: a pipe is read once
             for megabytes in range(0, 20, 2):
                 if megabytes == 6:
                     fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
