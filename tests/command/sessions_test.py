@@ -42,7 +42,9 @@ class Sessions(CommandTest):
         return output + re.sub("(?m)^(?=.)", "! ", errors) + (f"[{status}]\n" if status else "")
 
     def play(self, path):
-        for prompt, line, following in STEP.findall(path.read_text(encoding="utf-8")):
+        text = path.read_text(encoding="utf-8")
+        self.assertRegex(STEP.sub("", text), r"\A(# .*\n|\n)*\Z", "neither a step nor a remark")
+        for prompt, line, following in STEP.findall(text):
             line = line.replace("\n> ", "\n")
             if prompt == "@":
                 self.make(*shlex.split(line))
