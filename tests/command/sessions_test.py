@@ -36,9 +36,8 @@ class Sessions(CommandTest):
         if width:
             output, errors, status = self.on_terminal(*shell, width=int(width))
         else:
-            done = subprocess.run(shell, cwd=self.folder, stdin=subprocess.DEVNULL, capture_output=True,
-                                  encoding="utf-8", timeout=60)
-            output, errors, status = done.stdout, done.stderr, done.returncode
+            done = subprocess.run(shell, cwd=self.folder, stdin=subprocess.DEVNULL, capture_output=True, timeout=60)
+            output, errors, status = done.stdout.decode(), done.stderr.decode(), done.returncode
         return output + re.sub("(?m)^(?=.)", "! ", errors) + (f"[{status}]\n" if status else "")
 
     def play(self, path):
