@@ -38,7 +38,6 @@ def test_order(jobs, cut):
     assert [outcome(result) for result in results] == list(expected)
     assert all((result.record is None) != (result.error is None) for result in results)
     assert results[1].error.path == cut and results[2].error.errno == 2
-    assert list(quavel.scan([])) == []
 
 
 def test_folders(tmp_path):
@@ -91,6 +90,11 @@ def test_ends_its_threads():
         gc.collect()
         assert threads() == 1
         assert next(pulled) < 7000  # and has not run far ahead
+
+
+def test_one_job_takes_no_thread():
+    for paths in ([], [NIGHT] * 500, PHOTOS):
+        assert {threads() for _ in quavel.scan(paths, 1)} <= {1}
 
 
 def test_constant_memory():
