@@ -79,7 +79,7 @@ def test_ends_its_threads():
     pulled = itertools.count()
     for leave in ("close", "collect", "cycle"):
         holder = {}
-        scan = quavel.scan((NIGHT for _ in pulled if holder is not None), 4)
+        scan = quavel.scan(map(lambda _, holder=holder: NIGHT, pulled), 4)
         assert {outcome(result) for result in itertools.islice(scan, 1000)} == {6032}
         assert 1 < threads() <= 5
         if leave == "close":
