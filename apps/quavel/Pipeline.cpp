@@ -74,8 +74,9 @@ std::unique_ptr<Batch> Pipeline::take() {
 
 bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
   std::unique_lock<std::mutex> lock(mutex_);
+  auto const isDone = [this] { return order_.front()->isDone; };
   return !order_.empty() &&
-         batchDone_.wait_for(lock, patience, [this] { return order_.front()->isDone; });
+         (patience.count() == 0 ? isDone() : batchDone_.wait_for(lock, patience, isDone));
 }
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * limit()); }

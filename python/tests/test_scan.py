@@ -38,7 +38,6 @@ def test_order(jobs, cut):
     assert [outcome(result) for result in results] == list(expected)
     assert all((result.record is None) != (result.error is None) for result in results)
     assert results[1].error.path == cut and results[2].error.errno == 2
-    assert list(quavel.scan([])) == []
 
 
 def test_folders(tmp_path):
@@ -80,7 +79,7 @@ def test_ends_its_threads():
     pulled = itertools.count()
     for leave in ("close", "collect", "cycle"):
         holder = {}
-        scan = quavel.scan((NIGHT for _ in pulled if holder is not None), 4)
+        scan = quavel.scan(map(lambda _, holder=holder: NIGHT, pulled), 4)
         assert {outcome(result) for result in itertools.islice(scan, 1000)} == {6032}
         assert 1 < threads() <= 5
         if leave == "close":
@@ -91,6 +90,11 @@ def test_ends_its_threads():
         gc.collect()
         assert threads() == 1
         assert next(pulled) < 7000  # and has not run far ahead
+
+
+def test_one_job_takes_no_thread():
+    for paths in ([], [NIGHT] * 500, PHOTOS):
+        assert {threads() for _ in quavel.scan(paths, 1)} <= {1}
 
 
 def test_constant_memory():
