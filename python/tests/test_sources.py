@@ -1,10 +1,12 @@
 """Paths, buffers and files: good ones, odd ones, and arguments that are none."""
 import array
+import http.server
 import io
 import mmap
 import os
 import subprocess
 import sys
+import threading
 import zipfile
 
 import pytest
@@ -105,13 +107,41 @@ def test_kinds_of_files():
     assert counted.calls <= 2
 
 
+class Ranges(http.server.BaseHTTPRequestHandler):
+    """Serves a photo by byte ranges, as web servers do and Python's own does not."""
+
+    requests: "list[str]" = []
+
+    def do_GET(self):
+        data, headers = NIGHT.read_bytes(), {"Accept-Ranges": "bytes"}
+        if self.command == "GET":
+            self.requests.append(self.headers["Range"])
+            start, end = (int(n) for n in self.headers["Range"].partition("=")[2].split("-"))
+            headers["Content-Range"] = f"bytes {start}-{end}/{len(data)}"
+            data = data[start : end + 1]
+        self.send_response(206 if self.command == "GET" else 200)
+        for header in [*headers.items(), ("Content-Length", str(len(data)))]:
+            self.send_header(*header)
+        self.end_headers()
+        self.wfile.write(data if self.command == "GET" else b"")
+
+    do_HEAD = do_GET
+
+
 def test_the_example_with_fsspec(tmp_path):
+    """On an archive and a web server."""
     pytest.importorskip("fsspec")
+    pytest.importorskip("aiohttp")
     with zipfile.ZipFile(tmp_path / "photos.zip", "w", zipfile.ZIP_DEFLATED) as file:
         file.write(NIGHT, "night.nef")
-    urls = [f"zip://{name}::{tmp_path}/photos.zip" for name in ("night.nef", "gone.nef")]
-    command = [sys.executable, ROOT / "python" / "examples" / "remote_photos.py", *urls]
-    lines = subprocess.run(command, stdout=subprocess.PIPE, text=True, check=True).stdout
-    found, gone = lines.splitlines()
-    assert found == f"{urls[0]}: 6032 x 4032, 2021:05:01 10:00:00"
-    assert gone.startswith(urls[1])
+    with http.server.ThreadingHTTPServer(("127.0.0.1", 0), Ranges) as server:
+        threading.Thread(target=server.serve_forever, daemon=True).start()
+        urls = [f"zip://{name}::{tmp_path}/photos.zip" for name in ("night.nef", "gone.nef")]
+        urls.insert(1, f"http://127.0.0.1:{server.server_port}/night.nef")
+        command = [sys.executable, ROOT / "python" / "examples" / "remote_photos.py", *urls]
+        lines = subprocess.run(command, stdout=subprocess.PIPE, text=True, check=True).stdout
+        server.shutdown()
+    *found, gone = lines.splitlines()
+    assert found == [f"{url}: 6032 x 4032, 2021:05:01 10:00:00" for url in urls[:2]]
+    assert gone.startswith(urls[2])
+    assert 1 <= len(Ranges.requests) <= 2
