@@ -22,7 +22,7 @@ Field const* wantedField(std::string const& option, std::string const& name) {
 
 }  // namespace
 
-/// The parser's own lists skip empty names.
+/// Splits the list itself: the parser would skip empty names instead of refusing them.
 void addFields(std::string const& list, Fields& fields) {
   std::istringstream names(list + ',');  // ends the last name too, even an empty one
   for (std::string name; std::getline(names, name, ',');) {
@@ -76,7 +76,7 @@ bool choose(std::string const& option, std::string const& choice, char const* no
   return choice == yes;
 }
 
-/// The parser itself would also accept other notations.
+/// The parser's own conversion would also accept other notations, such as 0x10.
 unsigned jobsOf(std::string const& text) {
   unsigned jobs = 0;
   auto const* const end = text.data() + text.size();

@@ -13,7 +13,7 @@ namespace app {
 namespace {
 
 // For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
-constexpr unsigned kUsualJobs = 32;
+constexpr unsigned kUncachedJobs = 32;
 
 constexpr char kFooter[] =
     "Examples:\n"
@@ -30,7 +30,7 @@ class ShortFormatter : public CLI::Formatter {
  public:
   std::string make_option_opts(CLI::Option const* option) const override {
     std::string const type = option->get_type_name();
-    return type.empty() ? "" : " " + type.substr(0, type.find(':'));
+    return type.empty() ? "" : " " + type;
   }
   std::string make_usage(CLI::App const* /*app*/, std::string /*name*/) const override {
     return "Usage: quavel [OPTIONS] PATH...    photos, and folders with photos\n";
@@ -125,9 +125,10 @@ void addChoices(CLI::App& command, Options& options) {
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
 }
 
-void check(Options& options) {
+/// Refuses what the parser cannot judge, and normalizes the extension.
+void finish(Options& options) {
   if (options.fromStdin) {
-    options.extension = extensionOf("." + options.extension);
+    options.extension = extensionOf("." + options.extension);  // so that "nef" and ".nef" both do
     std::string const unknown = whyUnknown(options.extension);
     if (!unknown.empty()) {
       throw CLI::ValidationError("--extension: " + unknown);
@@ -138,23 +139,24 @@ void check(Options& options) {
     throw CLI::ValidationError("--fields and --absent: with --why, add --json or --jsonl");
   }
   bool const hasPaths = !options.inputs.paths.empty() || !options.inputs.list.empty();
-  if (hasPaths == options.fromStdin) {
+  if (hasPaths == options.fromStdin) {  // both, or neither
     throw CLI::ValidationError(hasPaths ? "--stdin reads one image: give no paths with it"
                                         : "no photos given: name files or folders");
   }
 }
 
-/// The parser would take "--quiet=0" as a request for messages, "-q=0" as two options, and after
-/// "--exclude=" the next word, such as a folder, for the missing value.
+/// The parser would read "--quiet=0" as a request for messages and "-q=0" as two options. After
+/// "--exclude=", it would take the next word, such as a folder, as the value.
 void refuseOddValues(CLI::App const& command, int argc, char const* const* argv) {
   for (int i = 1; i < argc && argv[i] != std::string_view("--"); ++i) {
     std::string const word = argv[i];
-    auto const* const option = command.get_option_no_throw(word.substr(0, word.find('=')));
-    if (word.find('=') != std::string::npos && option != nullptr &&
-        option->get_items_expected_max() == 0) {
+    auto const equals = word.find('=');
+    auto const* const option = command.get_option_no_throw(word.substr(0, equals));
+    bool const isAssignment = equals != std::string::npos && option != nullptr;
+    if (isAssignment && option->get_items_expected_max() == 0) {
       throw CLI::ValidationError("'" + word + "': this option takes no value");
     }
-    if (word[0] == '-' && word.find('=') + 1 == word.size() && option != nullptr) {
+    if (isAssignment && equals + 1 == word.size() && word[0] == '-') {  // "PATH=" may be a file
       throw CLI::ValidationError("'" + word + "': give a value after the =");
     }
   }
@@ -181,14 +183,14 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
   options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
-  options.jobs = std::max(options.cachedJobs, kUsualJobs);
+  options.jobs = std::max(options.cachedJobs, kUncachedJobs);
   addInputs(command, options);
   addForms(command, options.form);
   addChoices(command, options);
   try {
     refuseOddValues(command, argc, argv);
     command.parse(argc, argv);
-    check(options);
+    finish(options);
   } catch (CLI::CallForHelp const&) {
     parsed.status = kSuccess;
     parsed.text = helpOf(command);

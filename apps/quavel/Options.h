@@ -16,17 +16,17 @@ constexpr int kWrongUsage = 2;
 struct Options {
   Inputs inputs;
   bool fromStdin = false;
-  std::string extension;  ///< Of what standard input holds, in lower case.
+  std::string extension;  ///< Of the image on standard input, in lower case.
   Form form;
   unsigned jobs = 1;        ///< Files read at a time when reading waits for the disk.
-  unsigned cachedJobs = 1;  ///< When it does not; at most `jobs`.
+  unsigned cachedJobs = 1;  ///< The same while the files are cached; at most `jobs`.
   bool isQuiet = false;
 };
 
 /// What the arguments ask for.
 struct ParsedOptions {
   Options options;
-  std::optional<int> status;  ///< When set, the command only has to print `text` and end with it.
+  std::optional<int> status;  ///< If set, the command only prints `text` and exits with this.
   std::string text;           ///< For standard output; for standard error if the usage is wrong.
 };
 

@@ -12,7 +12,7 @@ namespace app {
 namespace {
 
 #ifdef RUSAGE_THREAD
-constexpr bool kTellsWaits = true;
+constexpr bool kCanCountWaits = true;
 /// How often the calling thread has waited for something, such as the disk.
 long countWaits() {
   rusage usage = {};
@@ -20,14 +20,14 @@ long countWaits() {
   return usage.ru_nvcsw;
 }
 #else
-constexpr bool kTellsWaits = false;
+constexpr bool kCanCountWaits = false;  // so all reading is taken to wait for the disk
 long countWaits() { return 0; }
 #endif
 
 }  // namespace
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
-    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kTellsWaits), work_(std::move(work)) {}
+    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kCanCountWaits), work_(std::move(work)) {}
 
 Pipeline::~Pipeline() {
   {
@@ -43,9 +43,8 @@ Pipeline::~Pipeline() {
 void Pipeline::submit(std::unique_ptr<Batch> batch) {
   Batch* const work = batch.get();
   order_.push_back(std::move(batch));
-  // A single file is not worth a thread. Threads start with the second batch, one for each batch
-  // under way.
-  if (jobs_ > 1 && hasBegun_ && threads_.size() < std::min<std::size_t>(limit(), order_.size())) {
+  // Threads start with the second batch, because a single file is not worth one.
+  if (jobs_ > 1 && hasBegun_ && threads_.size() < std::min(maxThreads(), order_.size())) {
     startThread();
   }
   hasBegun_ = true;
@@ -79,31 +78,31 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
          (patience.count() == 0 ? isDone() : batchDone_.wait_for(lock, patience, isDone));
 }
 
-bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * limit()); }
+bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * maxThreads()); }
 
-std::size_t Pipeline::limit() const { return waitsForDisk_ ? jobs_ : busyJobs_; }
+std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_ : busyJobs_; }
 
 void Pipeline::startThread() {
   interrupt::BlockSignals const block;
   try {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
-    // No further thread can be started: those that run do the work or, without any, the caller.
+    // No further thread can be started: those that run do the work; if none runs, the caller does.
     jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
     busyJobs_ = std::min(busyJobs_, jobs_);
   }
 }
 
 void Pipeline::workOn(Batch& batch) {
-  bool const isTold = kTellsWaits && jobs_ > 1;
-  long const before = isTold ? countWaits() : 0;
+  bool const isMeasured = kCanCountWaits && jobs_ > 1;
+  long const before = isMeasured ? countWaits() : 0;
   try {
     work_(batch);
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file does not wait. Other files wait for the disk at least once each.
-  if (isTold) {
+  // Reading a cached file does not wait; any other waits at least once. The majority decides.
+  if (isMeasured) {
     waitsForDisk_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
   }
 }

@@ -17,7 +17,7 @@
 
 namespace app {
 
-/// Some consecutive files. Whoever knows more about them derives from it.
+/// Some consecutive files. A caller that keeps more about them derives its own kind of batch.
 struct Batch {
   virtual ~Batch() = default;
 
@@ -31,7 +31,7 @@ struct Batch {
 
 /// Works on batches on several threads and returns them in the order in which they were submitted.
 /// Up to `jobs` threads are started while the work waits for the disk, so that the disk is never
-/// idle, and up to `busyJobs` while it keeps the processors busy. None stops before the end.
+/// idle, and up to `busyJobs` while it keeps the processors busy. A thread runs until the end.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
@@ -44,16 +44,16 @@ class Pipeline {
   Pipeline& operator=(Pipeline const&) = delete;
 
   void submit(std::unique_ptr<Batch> batch);
-  /// The oldest batch, once it is done, or throws what its work threw. Not when there is none.
+  /// Waits for the oldest batch and returns it, or throws what its work threw. There must be one.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
-  /// Whether enough batches are under way to keep the threads busy.
+  /// Whether enough batches are under way to keep the threads busy: two for each.
   bool isFull() const;
-  /// Waits for the oldest batch, at most that long; false when it is not done, or there is none.
+  /// Waits up to `patience` for the oldest batch; false if it is still not done or there is none.
   bool isOldestDone(std::chrono::milliseconds patience = {});
 
  private:
-  std::size_t limit() const;
+  std::size_t maxThreads() const;
   void startThread();
   void workOn(Batch& batch);
   void runThread();
@@ -65,10 +65,10 @@ class Pipeline {
   std::vector<std::thread> threads_;
   std::deque<std::unique_ptr<Batch>> order_;  // used by the caller's thread only
   bool hasBegun_ = false;
-  std::mutex mutex_;
+  std::mutex mutex_;  // guards `waiting_`, `isEnding_` and each batch's `isDone`
   std::condition_variable hasWork_;
   std::condition_variable batchDone_;
-  std::deque<Batch*> waiting_;
+  std::deque<Batch*> waiting_;  // not begun yet
   bool isEnding_ = false;
 };
 

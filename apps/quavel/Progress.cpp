@@ -29,7 +29,7 @@ double secondsSince(std::chrono::steady_clock::time_point start) {
 bool isRereadable(std::string const& list) {
   struct stat status = {};
   bool const isFile = ::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode);
-  return list.empty() || (list != "-" && isFile);
+  return list.empty() || (list != "-" && isFile);  // empty: there is no list
 }
 
 std::string rate(std::size_t files, double seconds) {
@@ -37,13 +37,12 @@ std::string rate(std::size_t files, double seconds) {
 }
 
 std::string duration(double seconds) {
-  auto const whole = static_cast<long>(seconds) + 1;
+  auto const whole = static_cast<long>(seconds) + 1;  // never "0 s"
   if (whole < 60) {
     return std::to_string(whole) + " s";
   }
-  return whole < 3600
-             ? std::to_string(whole / 60) + " min"
-             : std::to_string(whole / 3600) + " h " + std::to_string(whole / 60 % 60) + " min";
+  std::string const minutes = std::to_string(whole / 60 % 60) + " min";
+  return whole < 3600 ? minutes : std::to_string(whole / 3600) + " h " + minutes;
 }
 
 }  // namespace
@@ -51,7 +50,7 @@ std::string duration(double seconds) {
 Progress::Progress(Console& console, Options const& options)
     : console_(console),
       options_(options),
-      isShown_(console.isTerminal() && !options.isQuiet && !options.fromStdin),
+      showsLine_(console.isTerminal() && !options.isQuiet && !options.fromStdin),
       nextTick_(start_ + kQuietStart) {}
 
 Progress::~Progress() {
@@ -68,17 +67,17 @@ Progress::~Progress() {
 
 void Progress::tick() {
   auto const now = Clock::now();
-  if (!isShown_ || now < nextTick_) {
+  if (!showsLine_ || now < nextTick_) {
     return;
   }
-  if (nextTick_ == start_ + kQuietStart) {
-    startCounting();
+  if (nextTick_ == start_ + kQuietStart) {  // the first update
+    startCountingAhead();
   }
   nextTick_ = now + kInterval;
   console_.showProgress(line(secondsSince(start_)));
 }
 
-void Progress::startCounting() {
+void Progress::startCountingAhead() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
@@ -86,7 +85,7 @@ void Progress::startCounting() {
   try {
     counter_ = std::thread([this] {
       try {
-        countFiles();
+        countAhead();
       } catch (std::exception const&) {  // the total stays unknown
       }
     });
@@ -94,14 +93,14 @@ void Progress::startCounting() {
   }
 }
 
-void Progress::countFiles() {
+void Progress::countAhead() {
   Source source(options_.inputs, [](auto&&...) {});
   Input input;
   std::size_t count = 0;
   auto start = Clock::now();
   while (source.next(input)) {
     ++count;
-    // The reading comes first: counting keeps the disk busy for a fifth of the time at most.
+    // Reading photos comes first: counting keeps the disk busy for a fifth of the time at most.
     auto const spell = Clock::now() - start;
     if (spell >= kCountingSpell) {
       std::unique_lock<std::mutex> lock(mutex_);
@@ -117,12 +116,13 @@ void Progress::countFiles() {
 std::string Progress::line(double seconds) const {
   std::size_t const files = records_ + failures_;
   std::size_t const total = total_;
+  bool const isTotalKnown = total > 0 && total >= files;  // new files may make it too low
   std::string text = std::to_string(files);
-  if (total >= files && total > 0) {
+  if (isTotalKnown) {
     text += " of " + std::to_string(total);
   }
   text += " files, " + rate(files, seconds) + " files/s";
-  if (total >= files && files > 0) {
+  if (isTotalKnown && files > 0) {
     text += ", " +
             duration(seconds / static_cast<double>(files) * static_cast<double>(total - files)) +
             " left";
@@ -132,8 +132,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  bool const isToldAll = failures_ == 0 || options_.form.isExplanation();
-  if (options_.isQuiet || (files == 1 && isToldAll)) {
+  bool const isOutputEnough = failures_ == 0 || options_.form.isExplanation();
+  if (options_.isQuiet || (files == 1 && isOutputEnough)) {
     return;
   }
   double const seconds = secondsSince(start_);

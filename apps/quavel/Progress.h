@@ -14,7 +14,7 @@ namespace app {
 
 class Console;
 
-/// Counts the files, shows the progress once the work takes long enough, and sums it up at the end.
+/// Counts the files read, shows progress once the work takes long, and sums it up at the end.
 class Progress {
  public:
   /// `options` must outlive this.
@@ -27,7 +27,7 @@ class Progress {
     ++(hasRecord ? records_ : failures_);
     shown_ += isShown ? 1 : 0;
   }
-  /// Updates the line when it is due.
+  /// Updates the progress line when it is due.
   void tick();
   void sumUp();
 
@@ -36,23 +36,23 @@ class Progress {
  private:
   using Clock = std::chrono::steady_clock;
 
-  void startCounting();
-  void countFiles();
+  void startCountingAhead();
+  void countAhead();
   std::string line(double seconds) const;
 
   Console& console_;
   Options const& options_;
-  bool isShown_;
+  bool showsLine_;
   Clock::time_point start_ = Clock::now();
   Clock::time_point nextTick_;
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
   std::size_t shown_ = 0;
-  std::thread counter_;
+  std::thread counter_;  // counts ahead
   std::mutex mutex_;
   std::condition_variable hasEnded_;
   bool isEnding_ = false;
-  std::atomic<std::size_t> total_{0};  // 0 until it is known
+  std::atomic<std::size_t> total_{0};  // of all files; 0 until it is known
 };
 
 }  // namespace app

@@ -17,10 +17,10 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kMaxBatch = 64;
+constexpr std::size_t kMaxBatch = 64;  // files
 // A batch should be short enough for the output to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;                      // seconds
-constexpr std::size_t kWideBatch = std::size_t{1} << 20;  // bytes of output
+constexpr double kLongBatch = 0.002;                       // seconds
+constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
 
 /// One run over the files of a source.
 class Runner {
@@ -31,7 +31,7 @@ class Runner {
 
  private:
   int runSource(Source& source);
-  std::unique_ptr<Batch> nextBatch(Source& source) const;
+  std::unique_ptr<Batch> nextBatch(Source& source) const;  // waits only for its first file
   void work(Batch& batch) const;
   void prepare(Outcome& outcome) const;
   void emitOldest();
@@ -45,9 +45,9 @@ class Runner {
   std::unique_ptr<Writer> writer_;
   Detail detail_;
   Progress progress_;
-  Pipeline pipeline_;
+  Pipeline pipeline_;  // destroyed first: its threads use the members above
   std::size_t batchSize_ = 1;
-  bool lacksError_;  // the output has no error column, and no message has said so
+  bool isErrorHintDue_;  // the CSV has no error column, and no message has said so yet
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -58,8 +58,8 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
       pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }),
-      lacksError_(options.form.kind == FormKind::Csv && !options.form.fields.empty() &&
-                  !contains(options.form.fields, "error")) {}
+      isErrorHintDue_(options.form.kind == FormKind::Csv && !options.form.fields.empty() &&
+                      !contains(options.form.fields, "error")) {}
 
 int Runner::run() {
   if (options_.fromStdin) {
@@ -83,7 +83,7 @@ int Runner::run() {
 
 int Runner::runSource(Source& source) {
   while (true) {
-    if (!source.isReady()) {
+    if (!source.isReady()) {  // show all there is while the next path is awaited
       emitAll();
       writer_->pause();
       output_.flush();
@@ -148,22 +148,22 @@ void Runner::emitOldest() {
   }
   output_.flush();
   progress_.tick();
-  bool const isLarge = batch->seconds > kLongBatch || batch->bytes > kWideBatch;
+  bool const isTooLarge = batch->seconds > kLongBatch || batch->bytes > kLargeBatch;
   batchSize_ =
-      isLarge ? std::max<std::size_t>(batchSize_ / 2, 1) : std::min(batchSize_ * 2, kMaxBatch);
+      isTooLarge ? std::max<std::size_t>(batchSize_ / 2, 1) : std::min(batchSize_ * 2, kMaxBatch);
 }
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
   progress_.count(!outcome.problem, outcome.isShown);
-  // An explanation states the problem itself. So does a row or an object for programs, which is
-  // enough with --quiet.
+  // An explanation states the problem itself. A row or an object for programs does so too, but
+  // replaces the message only with --quiet.
   bool const isOutputEnough =
       outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
   if (outcome.problem && !isOutputEnough) {
     console_.printFileMessage(outcome.path, outcome.problem.text);
   }
-  if (outcome.problem && outcome.isShown && std::exchange(lacksError_, false)) {
+  if (outcome.problem && outcome.isShown && std::exchange(isErrorHintDue_, false)) {
     console_.printMessage(
         "the rows of files without a record do not say why: add error to --fields");
   }

@@ -19,14 +19,14 @@
 
 namespace {
 
-/// Opens /dev/null for each standard stream that is closed, so that no photo gets its descriptor,
-/// and in the mode in which using the stream fails.
+/// Opens /dev/null in place of each closed standard stream, so that no photo gets its descriptor.
+/// The mode is the wrong one for the stream, so that using it still fails.
 void holdStandardStreams() {
   if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
-    // Not for reading: an empty input would look like an empty list.
+    // Not for reading, because an empty input would look like an empty list.
     static_cast<void>(::open("/dev/null", O_WRONLY | O_CLOEXEC));
   }
-  int fd = -1;
+  int fd = -1;  // each open takes the lowest descriptor that is free
   do {
     fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);
@@ -52,9 +52,9 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
 
 int main(int argc, char** argv) {
   holdStandardStreams();
-  ::signal(SIGPIPE, SIG_IGN);  // the write then fails instead
+  ::signal(SIGPIPE, SIG_IGN);  // writing to a closed pipe then fails instead
 #ifdef __GLIBC__
-  // Each arena takes 64 MB of address space; one for each thread may exceed the user's limit.
+  // Each arena takes 64 MB of address space; one for each thread could exceed `ulimit -v`.
   ::mallopt(M_ARENA_MAX, 4);
 #endif
   app::interrupt::install();

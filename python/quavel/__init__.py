@@ -38,10 +38,10 @@ __all__ = [
     "scan",
 ]
 
-_MOST_JOBS = 256
+_MAX_JOBS = 256
 
 
-# Functions of Python's own, since pickle cannot hand those of the extension to other processes.
+# Written in Python, since pickle cannot pass functions of the extension to other processes.
 
 
 def read(path: Path) -> Record:
@@ -99,14 +99,14 @@ def scan(
     """
     if jobs is not None and not isinstance(jobs, int):
         raise TypeError(f"jobs must be int or None, not {type(jobs).__name__}")
-    if jobs is not None and not 1 <= jobs <= _MOST_JOBS:
-        raise ValueError(f"jobs must be from 1 to {_MOST_JOBS}, not {jobs}")
+    if jobs is not None and not 1 <= jobs <= _MAX_JOBS:
+        raise ValueError(f"jobs must be from 1 to {_MAX_JOBS}, not {jobs}")
     paths = paths_or_folder
     if isinstance(paths, (str, bytes, os.PathLike)):
         path = os.fspath(paths)
         if os.path.isdir(path):
             return _results(_quavel.Scanner(path, True, jobs or 0))
-        os.stat(path)  # a mistyped folder is an error of the caller's, not a photo's
+        os.stat(path)  # raises if it is missing: a mistyped folder is the caller's error
         paths = [paths]
     elif not isinstance(paths, Iterable):
         kind = type(paths).__name__

@@ -32,7 +32,7 @@ class NoRecord(Exception):
         errno: Optional[int] = None,
         path: Optional[Path] = None,
     ) -> None:
-        super().__init__(text, reason, position, errno, path)  # what pickle hands over again
+        super().__init__(text, reason, position, errno, path)  # pickle passes these again
         self.text = text
         self.reason = reason
         self.position = position

@@ -6,8 +6,8 @@ namespace {
 
 std::string typeName(py::handle object) { return Py_TYPE(object.ptr())->tp_name; }
 
-/// The exception now set gets the argument's name, and stays as its cause.
-[[noreturn]] void raiseOf(PyObject* type, std::string const& message) {
+/// Raises an exception that names the argument. The one that is set becomes its cause.
+[[noreturn]] void raiseAs(PyObject* type, std::string const& message) {
   py::raise_from(type, message.c_str());
   throw py::error_already_set();
 }
@@ -20,11 +20,11 @@ std::string pathOf(py::handle path, char const* name) {
     return py::reinterpret_steal<py::bytes>(bytes);
   }
   if (PyErr_ExceptionMatches(PyExc_TypeError) != 0) {
-    raiseOf(PyExc_TypeError,
+    raiseAs(PyExc_TypeError,
             std::string(name) + " must be str, bytes or os.PathLike, not " + typeName(path));
   }
   if (PyErr_ExceptionMatches(PyExc_ValueError) != 0) {
-    raiseOf(PyExc_ValueError, std::string(name) + " contains a character that no path can contain");
+    raiseAs(PyExc_ValueError, std::string(name) + " contains a character that no path can contain");
   }
   throw py::error_already_set();
 }
@@ -36,7 +36,7 @@ std::string extensionOf(py::handle extension) {
   Py_ssize_t size = 0;
   char const* const utf8 = PyUnicode_AsUTF8AndSize(extension.ptr(), &size);
   if (utf8 == nullptr) {
-    raiseOf(PyExc_ValueError, "extension contains a character that no extension can contain");
+    raiseAs(PyExc_ValueError, "extension contains a character that no extension can contain");
   }
   std::string text(utf8, static_cast<std::size_t>(size));
   if (!text.empty() && text.front() == '.') {
@@ -54,7 +54,7 @@ Bytes::Bytes(py::handle object, char const* name) {
                          typeName(object));
   }
   if (PyObject_GetBuffer(object.ptr(), &view_, PyBUF_SIMPLE) != 0) {
-    raiseOf(PyExc_ValueError, std::string(name) + " must be contiguous, and not released");
+    raiseAs(PyExc_ValueError, std::string(name) + " must be contiguous, and not released");
   }
 }
 

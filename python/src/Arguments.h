@@ -10,17 +10,18 @@ namespace binding {
 
 namespace py = pybind11;
 
-/// The bytes of a str, bytes or os.PathLike. Throws TypeError or ValueError with `name`.
+/// The bytes of a str, bytes or os.PathLike. Throws TypeError or ValueError, which mentions `name`.
 std::string pathOf(py::handle path, char const* name);
 
-/// A file extension as the library takes it: "nef" for "nef", ".nef" and ".NEF". Throws TypeError.
+/// A file extension as the library takes it: "nef" for "nef", ".nef" and ".NEF". Throws TypeError
+/// or ValueError.
 std::string extensionOf(py::handle extension);
 
-/// The bytes of any object with the buffer protocol, in place. While it lives the object can
-/// neither give up nor resize them.
+/// The bytes of any object with the buffer protocol, in place. As long as this lives, the object
+/// can neither release nor resize them.
 class Bytes {
  public:
-  /// Throws TypeError or ValueError with `name`.
+  /// Throws TypeError or ValueError, which mentions `name`.
   Bytes(py::handle object, char const* name);
   ~Bytes();
   Bytes(Bytes const&) = delete;

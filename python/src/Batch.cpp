@@ -19,11 +19,11 @@ namespace {
 using quavel::QVJournal;
 using Clock = std::chrono::steady_clock;
 
-/// Opening a FIFO would wait for its writer.
+/// Why the path must not be opened: opening a FIFO, for one, would wait for its writer.
 app::Problem whyUnfit(std::string const& path) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1 || S_ISREG(status.st_mode)) {
-    return {};  // reading it will show what is wrong
+    return {};  // if something is wrong, reading will show it
   }
   return S_ISDIR(status.st_mode) ? app::Problem{app::reason::kFolder, "a folder, not a photo"}
                                  : app::Problem{app::reason::kSpecialFile, "not a regular file"};
@@ -41,14 +41,14 @@ void read(app::Outcome& outcome, bool isPhoto, int& systemError, QVJournal& jour
       systemError = refusal.systemError;
     }
   } catch (std::bad_alloc const&) {
-    outcome.problem = {app::reason::kOutOfMemory, "out of memory"};  // texts too short to need any
+    outcome.problem = {app::reason::kOutOfMemory, "out of memory"};  // both fit without memory
   }
 }
 
 }  // namespace
 
 void readBatch(app::Batch& batch) {
-  // Until its threads run, the pipeline works on the caller's, which is one of Python's.
+  // Before it has threads, the pipeline works on the caller's thread, which holds the GIL.
   std::optional<Unlocked> unlocked;
   if (PyGILState_GetThisThreadState() != nullptr) {
     unlocked.emplace();

@@ -7,7 +7,7 @@
 
 namespace binding {
 
-/// Some photos that follow each other.
+/// Some consecutive photos.
 struct Batch : app::Batch {
   void add(app::Input&& input, int systemError) {
     inputs.push_back(std::move(input));

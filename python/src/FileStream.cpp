@@ -38,7 +38,7 @@ std::int64_t FileStream::readBuffer(std::uint8_t* destination, std::size_t count
     call(seek_, position_);
     filePosition_ = position_;
   }
-  // Unbuffered files deliver less than they have.
+  // A read of an unbuffered file may deliver less than is there.
   std::size_t total = 0;
   while (total < count) {
     std::size_t const delivered = readOnce(destination + total, count - total);
@@ -64,6 +64,7 @@ std::size_t FileStream::readOnce(std::uint8_t* destination, std::size_t count) {
 }
 
 void FileStream::setOffset(long const& offset) {
+  // Unsigned, so that the sum may wrap around.
   auto const target = static_cast<std::int64_t>(static_cast<std::uint64_t>(baseOffset) +
                                                 static_cast<std::uint64_t>(offset));
   if (target >= 0) {

@@ -8,11 +8,11 @@ namespace binding {
 
 namespace py = pybind11;
 
-/// A Python file object, read with `seek` and `read`. What they raise passes through, and so does
-/// TypeError or ValueError for what no binary file returns. Needs the GIL.
+/// A Python file object, read with `seek` and `read`. What they raise passes through. If `read`
+/// returns what no binary file does, that is a TypeError or ValueError. Needs the GIL.
 class FileStream : public quavel::QVStream {
  public:
-  /// Throws TypeError when it has no such methods.
+  /// Throws TypeError when the object lacks one of these methods.
   explicit FileStream(py::handle file);
 
   std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override;
@@ -24,8 +24,8 @@ class FileStream : public quavel::QVStream {
 
   py::object read_;
   py::object seek_;
-  std::int64_t position_ = 0;
-  std::int64_t filePosition_ = -1;  // -1: not known
+  std::int64_t position_ = 0;       // where the next read begins
+  std::int64_t filePosition_ = -1;  // where the file object is; -1: not known
 };
 
 }  // namespace binding

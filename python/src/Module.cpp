@@ -22,11 +22,11 @@ namespace {
 using quavel::QVJournal;
 using RecordPointer = std::shared_ptr<quavel::QVMetadata>;
 
-// A file object pays for each request, be it a system call, a round trip or unpacking.
+// Each request to a file object costs a system call, a network round trip or unpacking.
 constexpr std::size_t kFirstBlock = 16384;
 constexpr std::size_t kNextBlock = 8192;
 
-/// The record that `read` gives, or NoRecord.
+/// Returns the record that `read` gives, or raises NoRecord.
 template <class Read>
 RecordPointer recordOf(py::handle path, Read read) {
   QVJournal journal(QVJournal::Detail::Refusals);
@@ -98,7 +98,8 @@ void refuseSubinterpreter() {
   }
 }
 
-bool isMade(PyObject* self) {
+/// False between __new__ and __init__.
+bool isConstructed(PyObject* self) {
   return reinterpret_cast<py::detail::instance*>(self)->get_value_and_holder().holder_constructed();
 }
 
@@ -110,10 +111,10 @@ void collectScanners(PyHeapTypeObject* heapType) {
 #if PY_VERSION_HEX >= 0x03090000
     Py_VISIT(Py_TYPE(self));
 #endif
-    return isMade(self) ? py::cast<Scanner&>(py::handle(self)).traverse(visit, arg) : 0;
+    return isConstructed(self) ? py::cast<Scanner&>(py::handle(self)).traverse(visit, arg) : 0;
   };
   type.tp_clear = [](PyObject* self) {
-    if (isMade(self)) {
+    if (isConstructed(self)) {
       py::cast<Scanner&>(py::handle(self)).close();
     }
     return 0;

@@ -18,8 +18,8 @@ using quavel::QVMetadata;
 
 template <class T>
 struct Field {
-  char const* name;  // in Python
-  char const* member;
+  char const* name;    // in Python
+  char const* member;  // in C++
   T QVMetadata::*value;
   char const* doc;
 };
@@ -78,8 +78,8 @@ void forEachField(Visit visit) {
 /// The double whose shortest text is that of the float: 2.8, where a cast gives 2.799999952316284.
 double shortest(float value) {
   char text[32] = {};
-  std::to_chars(std::begin(text), std::end(text) - 1, value);
-  return PyOS_string_to_double(text, nullptr, nullptr);  // strtod minds the locale's decimal comma
+  std::to_chars(std::begin(text), std::end(text) - 1, value);  // a NUL is left at the end
+  return PyOS_string_to_double(text, nullptr, nullptr);        // strtod may expect a decimal comma
 }
 
 py::object shown(bool value) { return py::bool_(value); }
@@ -102,7 +102,7 @@ bool isSame(T const& a, T const& b) {
   return a == b;
 }
 
-/// The digits at `at` as a number; -1 when one of them is not a digit.
+/// The digits at `at` as a number; -1, which no date accepts, when one of them is not a digit.
 int number(std::string const& date, std::size_t at, std::size_t digits) {
   int value = 0;
   char const* const end = date.data() + at + digits;
@@ -163,7 +163,7 @@ std::string represent(QVMetadata const& record) {
   return "quavel.Record(" + fields + ')';
 }
 
-/// A record that no file is read into.
+/// A record from a pickle: no file is read into it.
 struct Restored : QVMetadata {
   bool read(std::shared_ptr<quavel::QVStream>& /*stream*/) override { return false; }
 };
@@ -242,12 +242,12 @@ void addRecord(py::module_& module) {
       .def("__hash__", hashOf)
       .def("__repr__", represent)
       .def("__reduce__", [](py::object const& self) {
-        // By way of Python: pickle cannot name a function of this module.
+        // Through a Python function: pickle cannot refer to those of this module.
         return py::make_tuple(py::module_::import("quavel._types").attr("restore"),
                               py::make_tuple(stateOf(self.cast<QVMetadata const&>())));
       });
   record.attr("__module__") = "quavel";
-  // Record.__new__(Record) would give one that was never filled.
+  // Record.__new__(Record) would give a record that was never filled.
   reinterpret_cast<PyTypeObject*>(record.ptr())->tp_new = nullptr;
   module.def("restore", restore);
 }

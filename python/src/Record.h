@@ -10,13 +10,13 @@ namespace binding {
 
 namespace py = pybind11;
 
-/// Adds the class `Record`, a `QVMetadata` that nobody can change, to the module.
+/// Adds the class `Record`, a read-only `QVMetadata`, to the module.
 void addRecord(py::module_& module);
 
 /// UTF-8 where the bytes are valid UTF-8, else Latin-1: never fails, and loses nothing.
 py::str text(std::string const& bytes);
 
-/// The attribute of `Record` that shows a member of `QVMetadata`; None for any other name.
+/// The name of the attribute of `Record` that shows a member of `QVMetadata`, or None.
 py::object attributeOf(std::string const& member);
 
 }  // namespace binding

@@ -17,16 +17,16 @@ struct Refusal : app::Problem {
   int systemError = 0;
 };
 
-/// Of a read that gave no record.
+/// The refusal in the journal of a read that gave no record.
 Refusal refusalOf(quavel::QVJournal const& journal);
 
-/// The exception `NoRecord`; `path` is None for what was not read by path.
+/// The exception `NoRecord`; `path` is None for a photo that was not read by path.
 py::object noRecord(Refusal const& refusal, py::handle path);
 
 /// Throws it.
 [[noreturn]] void raiseNoRecord(quavel::QVJournal const& journal, py::handle path);
 
-/// The value, or None where it is the one that means absence.
+/// The value, or None if it is the one that means absence.
 py::object orNone(std::int64_t value, std::int64_t absent);
 
 }  // namespace binding

@@ -15,10 +15,10 @@ namespace binding {
 
 namespace {
 
-constexpr std::size_t kMaxBatch = 64;
-// A batch is to be short enough for results to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;
-// For files that are not cached: there 32 are several times as fast as 2, and more gain little.
+constexpr std::size_t kMaxBatch = 64;  // photos
+// A batch should be short enough for results to flow and long enough to be worth handing over.
+constexpr double kLongBatch = 0.002;  // seconds
+// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
 constexpr unsigned kUncachedJobs = 32;
 // How long Ctrl-C may go unnoticed.
 constexpr std::chrono::milliseconds kSignalInterval{50};
@@ -29,7 +29,7 @@ std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs) {
   return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, readBatch);
 }
 
-/// A path of a folder's, as os.fsdecode gives it.
+/// The path of a photo in a folder: the bytes, or what os.fsdecode gives for them.
 py::object decoded(std::string const& path, bool isBytes) {
   auto const size = static_cast<Py_ssize_t>(path.size());
   auto* const object = isBytes ? PyBytes_FromStringAndSize(path.data(), size)
@@ -40,7 +40,7 @@ py::object decoded(std::string const& path, bool isBytes) {
   return py::reinterpret_steal<py::object>(object);
 }
 
-/// A named tuple, filled without a call of Python code: there is one for each photo.
+/// A Result, made without calling Python code because there is one for each photo.
 py::object makeResult(PyTypeObject* type, py::object path, py::object record, py::object error) {
   auto result = py::reinterpret_steal<py::object>(type->tp_alloc(type, 3));
   if (!result) {
@@ -58,7 +58,7 @@ bool isLong(Clock::time_point start) {
   return std::chrono::duration<double>(Clock::now() - start).count() > kLongBatch;
 }
 
-/// Null at the end, and when an exception is set.
+/// Null at the end; null, with the exception set, when the iterator raises one.
 py::object nextOf(py::handle iterator) {
   try {
     return py::reinterpret_steal<py::object>(PyIter_Next(iterator.ptr()));
@@ -175,7 +175,7 @@ void Scanner::takePaths(Batch& batch, py::list& paths) {
     if (!error.matches(PyExc_Exception)) {
       throw;  // such as KeyboardInterrupt
     }
-    failure_ = std::move(error);  // after the results of the paths before it
+    failure_ = std::move(error);  // to be thrown after the results of the paths before it
   }
 }
 
@@ -218,7 +218,7 @@ int Scanner::traverse(visitproc visit, void* arg) {
 void Scanner::close() {
   source_ = py::object();
   if (process_ != ::getpid()) {
-    // The threads exist in the parent alone, and what they worked on may be half done.
+    // A fork has no threads to join, and their work may be half done: the pipeline is abandoned.
     static_cast<void>(pipeline_.release());
   } else {
     Unlocked const unlocked;

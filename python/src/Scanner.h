@@ -17,11 +17,11 @@ namespace binding {
 
 namespace py = pybind11;
 
-/// What `quavel.scan` iterates over. Python code is run on the caller's thread alone.
+/// What `quavel.scan` iterates over. Python code is run only on the caller's thread.
 class Scanner {
  public:
-  /// Either the photos in a folder, whose paths are str or bytes like it, or an iterator of paths.
-  /// `jobs` 0: as many as suit the disk.
+  /// `source`: a folder, as str or bytes, as its photos' paths will be too; or an iterator of
+  /// paths. `jobs` 0: as many as suit the disk.
   Scanner(py::object source, bool isFolder, unsigned jobs);
   ~Scanner() { close(); }
   Scanner(Scanner const&) = delete;
@@ -30,7 +30,7 @@ class Scanner {
   /// The results of the next photos, in order; none at the end. Throws what the iterator or a
   /// signal handler raises.
   py::list nextBatch();
-  /// Ends the threads. Nothing comes after it.
+  /// Ends the threads. There are no results after this.
   void close();
   /// For the garbage collector.
   int traverse(visitproc visit, void* arg);
@@ -46,9 +46,10 @@ class Scanner {
   std::optional<py::error_already_set> failure_;
   std::optional<app::FolderWalk> walk_;
   bool isBytes_ = false;
-  pid_t process_;
+  pid_t process_;  // which started the threads
   std::unique_ptr<app::Pipeline> pipeline_;
-  std::deque<py::list> paths_;  // of each batch, as the iterator gave them; empty for a folder
+  // The paths of each batch under way, as the iterator gave them; no paths for a folder.
+  std::deque<py::list> paths_;
   std::size_t batchSize_ = 1;
 };
 

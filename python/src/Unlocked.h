@@ -6,15 +6,16 @@
 
 namespace binding {
 
-/// For a thread that Python ends by unwinding it, since the interpreter has ended: no destructor
-/// lets that through, nor could one let go of an object. The process is about to end.
+/// Python may unwind a thread to end it once the interpreter has ended. That cannot pass a
+/// destructor, nor could a destructor still release objects. So the thread waits for the process to
+/// end.
 [[noreturn]] inline void waitForTheEnd() {
   while (true) {
     ::pause();
   }
 }
 
-/// While it lives, the thread does without the interpreter's lock.
+/// While it lives, the thread does not hold the GIL.
 class Unlocked {
  public:
   Unlocked() : state_(PyEval_SaveThread()) {}

@@ -14,7 +14,7 @@ namespace {
 
 // Most photos take one to four reads; one that is walked through its image data takes dozens.
 constexpr int kReadsOfAWalk = 16;
-constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;
+constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;  // bytes to fetch at a time
 
 // The first block holds all metadata of most files; later ones are read for a single directory or
 // segment each. docs/speed.md shows how both sizes were measured.
@@ -22,9 +22,9 @@ constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
 // The advice against reading ahead costs a system call and helps only with files that are not
-// cached. So it is given while the files read lately took as long as a disk does.
+// cached. So it is given only while recent reads were as slow as reads from a disk.
 constexpr auto kSlowRead = std::chrono::microseconds(40);  // a cached block takes about 3
-constexpr int kFilesAdvised = 64;                          // from the last slow read on
+constexpr int kFilesAdvised = 64;                          // after a slow read
 std::atomic<int> filesToAdvise{1};
 
 /// Both streams in one allocation.
@@ -43,7 +43,7 @@ PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t count) {
   int const left = filesToAdvise.load(std::memory_order_relaxed);
-  // Otherwise the first read makes the system fetch several times what is asked for.
+  // Without the advice, the system would fetch several times what the first read asks for.
   if (left > 0) {
     file::expectFewReads(fd);
   }

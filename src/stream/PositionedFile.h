@@ -34,8 +34,8 @@ class PositionedFile : public QVFStream {
   int reads_ = 0;
 };
 
-/// Opens the file at `path` as a stream that reads ahead. Sets `fd` to its descriptor, which the
-/// stream owns; -1: the file cannot be opened, and `errno` says why.
+/// Opens the file at `path` as a stream that reads ahead. Sets `*fd`, if given, to its descriptor,
+/// which the stream owns; -1: the file cannot be opened, and `errno` says why.
 std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
 
 }  // namespace quavel::detail

@@ -48,7 +48,7 @@ bool FolderWalk::step(Input& input) {
 
 bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
-    case DT_REG:
+    case DT_REG:  // a photo: other files never get here
       input = {std::move(path), true, {}};
       return true;
     case DT_DIR:
@@ -74,13 +74,13 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
     return isPhotoExtension(extensionOf(input.path));
   }
   if (S_ISDIR(status.st_mode)) {
-    if (!isLeftOut({}, path.substr(path.rfind('/') + 1), true)) {
+    if (!isLeftOut({}, path.substr(path.rfind('/') + 1), true)) {  // again, now as a folder
       enter(path, true);
     }
     return false;
   }
-  return isPhotoExtension(extensionOf(path)) &&
-         visit(S_ISREG(status.st_mode) ? DT_REG : DT_CHR, std::move(path), input);
+  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR: any other type
+  return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
 }
 
 void FolderWalk::enter(std::string const& path, bool isLink) {
@@ -99,9 +99,9 @@ void FolderWalk::enter(std::string const& path, bool isLink) {
 }
 
 bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool isLink) {
-  bool const isInside = std::any_of(levels_.begin(), levels_.end(),
-                                    [&](Level const& level) { return level.identity == identity; });
-  if (isInside) {
+  bool const isLoop = std::any_of(levels_.begin(), levels_.end(),
+                                  [&](Level const& level) { return level.identity == identity; });
+  if (isLoop) {
     report_(path, "symbolic-link loop, back to a folder above; skipped");
     return true;
   }
@@ -113,8 +113,7 @@ bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, b
 }
 
 bool FolderWalk::isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const {
-  // On foreign file systems, macOS keeps some data about IMG.JPG in ._IMG.JPG, which is not a
-  // photo.
+  // On foreign file systems, macOS keeps some data about IMG.JPG in ._IMG.JPG: not a photo.
   if (!filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_")) {
     return true;
   }
@@ -143,7 +142,7 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
   }
   char const* const names = level.names.data();
   std::sort(level.entries.begin(), level.entries.end(), [names](Entry const& a, Entry const& b) {
-    return std::strcmp(names + a.name, names + b.name) > 0;
+    return std::strcmp(names + a.name, names + b.name) > 0;  // the last one is visited first
   });
 }
 

@@ -39,7 +39,7 @@ class FolderWalk {
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
   bool isAtEnd() const { return !missed_ && levels_.empty(); }
-  /// A step on the way of `next`; false when it led to nothing yet. Not at the end.
+  /// One step of `next`; false when it found nothing. Must not be called at the end.
   bool step(Input& input);
 
   int error = 0;  ///< The `errno` of the last folder that could not be read.
@@ -68,8 +68,8 @@ class FolderWalk {
   Filter const& filter_;
   Report report_;
   std::vector<Level> levels_;
-  std::set<Identity> linked_;
-  std::optional<Input> missed_;
+  std::set<Identity> linked_;    // folders that a symbolic link led to
+  std::optional<Input> missed_;  // a folder that cannot be read, to be found next
 };
 
 }  // namespace app

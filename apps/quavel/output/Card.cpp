@@ -30,11 +30,12 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
   if (!outcome.record) {
     return {};
   }
-  static Fields const all = cardFields();
+  static Fields const usual = cardFields();
+  bool const showAbsent = form.showAbsent.value_or(!form.fields.empty());
   std::string card = form.fields.empty() ? escapedPath(outcome.path) + "\n" : "";
-  for (auto const* field : form.fields.empty() ? all : form.fields) {
+  for (auto const* field : form.fields.empty() ? usual : form.fields) {
     std::string const text = inWords(*field, outcome);
-    if (text.empty() && !form.showAbsent.value_or(!form.fields.empty())) {
+    if (text.empty() && !showAbsent) {
       continue;
     }
     std::string label = field->label;

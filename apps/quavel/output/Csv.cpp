@@ -18,7 +18,7 @@ std::string quoted(std::string const& text) {
 
 char const* lineEnd(Form const& form) { return form.endsWithLf ? "\n" : "\r\n"; }
 
-Fields columnsOf(Form const& form) {
+Fields fieldsOf(Form const& form) {
   Fields fields = form.fields;
   if (fields.empty()) {
     for (auto const& field : allFields()) {
@@ -32,23 +32,24 @@ Fields columnsOf(Form const& form) {
 
 std::string csvHeader(Form const& form) {
   std::string header;
-  for (auto const* field : columnsOf(form)) {
+  for (auto const* field : fieldsOf(form)) {
     header.append(header.empty() ? "" : ",").append(field->name);
   }
   return header + lineEnd(form);
 }
 
 TextOf csvRows(Form const& form, bool isForTerminal) {
-  return [fields = columnsOf(form), isForTerminal, end = lineEnd(form)](Outcome const& outcome) {
+  return [fields = fieldsOf(form), isForTerminal, end = lineEnd(form)](Outcome const& outcome) {
     std::string row;
     for (auto const* field : fields) {
       std::string text;
       appendExact(text, field->value(outcome));
-      bool const isPath = field->name == "path";
-      row += quoted(!isForTerminal ? text : isPath ? escapedPath(outcome.path) : escaped(text));
-      row += ',';
+      if (isForTerminal) {
+        text = field->name == "path" ? escapedPath(outcome.path) : escaped(text);
+      }
+      row += quoted(text) + ',';
     }
-    row.pop_back();
+    row.pop_back();  // the last comma
     return row + end;
   };
 }

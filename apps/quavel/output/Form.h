@@ -13,7 +13,7 @@ enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 /// How the files are shown.
 struct Form {
   FormKind kind = FormKind::Automatic;
-  Fields fields;                      ///< Empty: those of the form.
+  Fields fields;                      ///< Empty: the form chooses them.
   Field const* sort = nullptr;        ///< Null: the order of the input.
   bool isDescending = false;          ///< Sorted in descending order.
   std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
@@ -22,6 +22,7 @@ struct Form {
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
+  /// --print0 does not count, because it shows no values.
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }

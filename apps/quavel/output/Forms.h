@@ -12,19 +12,18 @@ namespace app {
 /// What a form shows of one file. Called on any thread.
 using TextOf = std::function<std::string(Outcome const&)>;
 
-/// The card of a file that gave a record, labelled lines for people; empty for any other.
+/// A card: labelled lines for people. Empty when the file gave no record.
 std::string cardOf(Form const& form, Outcome const& outcome);
 
-/// Why a file gives no record, or which fields its record leaves absent and why: a verdict, then
-/// some lines of detail.
+/// Why a file gives no record, or which fields its record lacks and why: a verdict, then details.
 std::string explanationOf(Outcome const& outcome);
 
 /// Comma-separated values by RFC 4180: a row for each file below the header row. Absent values are
-/// empty. On a terminal, what could steer it is shown as `escaped` does.
+/// empty. For a terminal, texts are made safe by `escaped`.
 std::string csvHeader(Form const& form);
 TextOf csvRows(Form const& form, bool isForTerminal);
 
-/// JSON objects, each on one line, which ends in the form of JSON lines. An infinity, which JSON
+/// JSON objects, each on one line (with its line end only in JSON Lines). An infinity, which JSON
 /// has no number for, is the text "Infinity" or "-Infinity"; the notes are an array.
 TextOf jsonObjects(Form const& form, bool isForTerminal);
 

@@ -9,7 +9,7 @@ namespace app {
 
 namespace {
 
-// Enough for most records: growing the text step by step would cost more than filling it.
+// Bytes, enough for most records: growing the text step by step would cost more than filling it.
 constexpr std::size_t kUsualObject = 700;
 
 bool needsEscape(std::string const& text) {
@@ -18,12 +18,12 @@ bool needsEscape(std::string const& text) {
 
 /// Appends a value that is not absent. Nearly all texts need no escape; the others are left to the
 /// JSON library. What would steer a terminal is written as \uNNNN when the text goes to one.
-void append(std::string& json, Value const& value, bool isForTerminal) {
+void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && needsEscape(*text)) {
-    bool const isAscii = isForTerminal && escaped(*text) != *text;
-    json += nlohmann::json(*text).dump(-1, ' ', isAscii, nlohmann::json::error_handler_t::replace);
+    bool const asAscii = isForTerminal && escaped(*text) != *text;
+    json += nlohmann::json(*text).dump(-1, ' ', asAscii, nlohmann::json::error_handler_t::replace);
   } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
     json += '"';
     appendExact(json, value);
@@ -35,7 +35,7 @@ void append(std::string& json, Value const& value, bool isForTerminal) {
 
 constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};
 
-/// The notes as JSON members, without what does not apply to them.
+/// The notes as a JSON member; what does not apply to a note is left out.
 std::string notesOf(Outcome const& outcome, bool isForTerminal) {
   auto notes = nlohmann::ordered_json::array();
   for (auto const& note : outcome.notes) {
@@ -57,11 +57,11 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
          (outcome.furtherSteps == 0 ? "" : further);
 }
 
-/// A field, its name as JSON with a comma before it and a colon after it, and the same with "null".
+/// How a field is written in an object.
 struct Member {
   Field const* field;
-  std::string name;
-  std::string absent;
+  std::string name;    // such as `,"iso":`
+  std::string absent;  // such as `,"iso":null`
 };
 
 using Members = std::vector<Member>;
@@ -75,13 +75,13 @@ Members membersOf(Fields const& fields) {
   return members;
 }
 
-void append(std::string& json, Members const& members, Outcome const& outcome, bool showAbsent,
-            bool isForTerminal) {
+void appendMembers(std::string& json, Members const& members, Outcome const& outcome,
+                   bool showAbsent, bool isForTerminal) {
   for (auto const& member : members) {
     Value const value = member.field->value(outcome);
     if (!std::holds_alternative<std::monostate>(value)) {
       json += member.name;
-      append(json, value, isForTerminal);
+      appendValue(json, value, isForTerminal);
     } else if (showAbsent) {
       json += member.absent;
     }
@@ -99,14 +99,14 @@ TextOf jsonObjects(Form const& form, bool isForTerminal) {
           pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
     std::string object;
     object.reserve(kUsualObject);
-    append(object, outcome.record ? ofRecord : ofProblem, outcome, form.showAbsent.value_or(true),
-           isForTerminal);
+    appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome,
+                  form.showAbsent.value_or(true), isForTerminal);
     if (mayAddBytes || !outcome.record) {
-      append(object, pathBytes, outcome, false, isForTerminal);
+      appendMembers(object, pathBytes, outcome, false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
-    object.resize(std::max<std::size_t>(object.size(), 1));
-    object.front() = '{';  // in place of the first comma
+    object.resize(std::max<std::size_t>(object.size(), 1));  // it may have no members
+    object.front() = '{';                                    // in place of the first comma
     return object += form.kind == FormKind::Jsonl ? "}\n" : "}";
   };
 }

@@ -14,7 +14,7 @@ constexpr std::size_t kGap = 2;
 /// can be shortened further.
 void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t line) {
   while (lineWidth(widths) > line) {
-    std::size_t widest = columns.size();
+    std::size_t widest = columns.size();  // none found yet
     for (std::size_t i = 0; i < columns.size(); ++i) {
       bool const canGive = widths[i] > columns[i].least;
       if (canGive && (widest == columns.size() || widths[i] > widths[widest])) {
@@ -28,7 +28,7 @@ void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t lin
   }
 }
 
-/// The shown column of the highest rank, or the number of columns.
+/// The shown column to leave out first; the number of columns when all that are shown must stay.
 std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& widths) {
   std::size_t found = columns.size();
   int highest = 0;
@@ -54,7 +54,7 @@ std::size_t lineWidth(Widths const& widths) {
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
   while (true) {
     Widths widths = natural;
-    // No column needs more than the whole line; this also bounds the loop.
+    // No column needs more than the whole line; this also bounds the steps of `shorten`.
     for (auto& width : widths) {
       width = std::min(width, line);
     }
@@ -68,17 +68,17 @@ Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line)
 }
 
 std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
-                   std::vector<std::string> const& cells) {
+                   std::vector<std::string> const& texts) {
   std::string line;
-  std::size_t gap = 0;
+  std::size_t gap = 0;  // blanks before the next text, so that no line ends with blanks
   for (std::size_t i = 0; i < columns.size(); ++i) {
     if (widths[i] == 0) {
       continue;
     }
     std::string const text =
-        columns[i].keepsEnd ? keepEnd(cells[i], widths[i]) : keepStart(cells[i], widths[i]);
+        columns[i].keepsEnd ? keepEnd(texts[i], widths[i]) : keepStart(texts[i], widths[i]);
     line.append(gap, ' ').append(text);
-    gap = widths[i] - std::min(widths[i], app::cells(text)) + kGap;
+    gap = widths[i] - std::min(widths[i], cells(text)) + kGap;
   }
   return line + '\n';
 }

@@ -2,7 +2,6 @@
 #define QUAVEL_APPS_LAYOUT_H
 
 #include <cstddef>
-#include <limits>
 #include <string>
 #include <vector>
 
@@ -12,11 +11,9 @@ namespace app {
 struct Column {
   std::string label;
   std::size_t least;  ///< Cells that it can be shortened to.
-  int rank;           ///< The column with the highest one is left out first; 0: never.
+  int rank;           ///< The column with the highest rank is left out first; 0: never.
   bool keepsEnd;      ///< Shortened at its start.
 };
-
-constexpr std::size_t kUnlimited = std::numeric_limits<std::size_t>::max();
 
 /// Widths in cells; 0: the column is left out.
 using Widths = std::vector<std::size_t>;
@@ -29,7 +26,7 @@ Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line)
 
 /// One line of the table, with its line end.
 std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
-                   std::vector<std::string> const& cells);
+                   std::vector<std::string> const& texts);
 
 }  // namespace app
 

@@ -31,7 +31,7 @@ std::string linesOf(std::vector<QVNote> const& notes, QVNoteKind kind, char cons
   return lines;
 }
 
-/// A line for each reason for which fields are absent.
+/// A line for each reason why fields are absent.
 std::string absencesOf(std::vector<QVNote> const& notes) {
   std::vector<std::pair<std::string, std::string>> namesByText;
   for (auto const& note : notes) {

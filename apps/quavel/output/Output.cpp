@@ -57,14 +57,14 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes up to PIPE_BUF bytes whole or not at all, so an interrupt never cuts a piece, even
-  // while the reader makes us wait.
+  // A pipe takes up to PIPE_BUF bytes whole or not at all. So an interrupt cuts none of the pieces
+  // in such a write, even while the pipe's reader keeps us waiting.
   std::size_t const most = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::string_view const all = pending_;
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
     bool const isLast = i + 1 == ends_.size();
-    if (isLast || ends_[i + 1] - begin > most) {
+    if (isLast || ends_[i + 1] - begin > most) {  // the next piece would be too much
       interrupt::WriteScope const scope;
       write(all.substr(begin, ends_[i] - begin));
       begin = ends_[i];

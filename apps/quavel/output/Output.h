@@ -26,7 +26,7 @@ class Output {
   void enclose(std::string_view head, char const* tail);
   /// Flushes and writes the tail.
   void finish();
-  /// The same after a failure: throws nothing.
+  /// Does the same after a failure, and throws nothing.
   void giveUp() noexcept;
 
   bool isTerminal() const { return isTerminal_; }
@@ -36,7 +36,7 @@ class Output {
   bool isTerminal_;
   bool isFile_;
   std::string pending_;
-  std::vector<std::size_t> ends_;  // where the pieces end in it
+  std::vector<std::size_t> ends_;  // where each piece ends in `pending_`
   char const* tail_ = nullptr;
 };
 

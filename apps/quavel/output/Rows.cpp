@@ -7,8 +7,8 @@ namespace app::rows {
 
 namespace {
 
-constexpr std::size_t kMinChosen = 3;
-constexpr std::size_t kMinPath = 8;
+constexpr std::size_t kMinChosen = 3;   // cells that the column of a chosen field keeps
+constexpr std::size_t kMinPath = 8;     // the same for the path
 constexpr std::size_t kDateColumn = 1;  // among the default columns
 constexpr std::size_t kDay = 10;        // "2018-02-21"
 constexpr std::size_t kMinute = 16;     // "2018-02-21 12:08"
@@ -19,14 +19,14 @@ std::vector<Column> defaultColumns() {
           {"Exposure", 12, 5, false}};
 }
 
-std::string word(std::string_view name, Outcome const& outcome) {
+std::string wordsOf(std::string_view name, Outcome const& outcome) {
   return inWords(*fieldNamed(name), outcome);
 }
 
 /// The date without its seconds, for which a table has no room.
-std::string minutes(std::string const& date) {
+std::string toTheMinute(std::string const& date) {
   bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
-  return isWellMade ? date.substr(0, 16) : date;
+  return isWellMade ? date.substr(0, kMinute) : date;
 }
 
 std::string withoutVerb(std::string const& orientation) {
@@ -35,9 +35,9 @@ std::string withoutVerb(std::string const& orientation) {
 }
 
 Cells defaultCells(Outcome const& outcome) {
-  return {escapedPath(outcome.path),       minutes(word("captureDate", outcome)),
-          words::size(*outcome.record),    withoutVerb(word("orientation", outcome)),
-          word("model", outcome),          word("lensModel", outcome),
+  return {escapedPath(outcome.path),       toTheMinute(wordsOf("captureDate", outcome)),
+          words::size(*outcome.record),    withoutVerb(wordsOf("orientation", outcome)),
+          wordsOf("model", outcome),       wordsOf("lensModel", outcome),
           words::exposure(*outcome.record)};
 }
 

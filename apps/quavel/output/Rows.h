@@ -12,9 +12,9 @@ namespace app::rows {
 
 using Cells = std::vector<std::string>;
 
-/// The columns of the fields; of none, those that a photographer looks for first.
+/// The columns of the chosen fields; if none are, what a photographer looks for first.
 std::vector<Column> columnsOf(Fields const& fields);
-/// A row of them; an absent value is empty.
+/// The row of a file that gave a record; an absent value is empty.
 Cells cellsOf(Fields const& fields, Outcome const& outcome);
 /// Shortens the date in a row of default columns to the day.
 void dropTime(Cells& cells);

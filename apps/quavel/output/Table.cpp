@@ -15,21 +15,20 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kPage = 500;
+constexpr std::size_t kPage = 500;  // rows
 constexpr auto kFlushInterval = std::chrono::milliseconds(200);
-constexpr auto kFirstFlushInterval = std::chrono::milliseconds(12);  // so that work is seen
+constexpr auto kFirstFlushInterval = std::chrono::milliseconds(12);  // so that rows show soon
 
 /// The folder that all paths of the rows are in, with a "/" at its end; empty when there is none.
 std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std::size_t column) {
   std::string folder = rows.front()[column];
   for (auto const& row : rows) {
     std::string const& path = row[column];
-    auto const limit =
-        folder.begin() + static_cast<std::ptrdiff_t>(std::min(folder.size(), path.size()));
-    folder.erase(std::mismatch(folder.begin(), limit, path.begin()).first, folder.end());
-    folder.erase(folder.rfind('/') + 1);
+    auto const difference = std::mismatch(folder.begin(), folder.end(), path.begin(), path.end());
+    folder.erase(difference.first, folder.end());
+    folder.erase(folder.rfind('/') + 1);  // everything, if there is no "/"
   }
-  return folder.size() <= 2 ? "" : folder;  // "./" and "/" take no room
+  return folder.size() <= 2 ? "" : folder;  // such as "./": too short to save room
 }
 
 class Table : public Writer {
@@ -45,7 +44,7 @@ class Table : public Writer {
   void writePage(bool isLast);
   void widen(bool isLast);
   void fitTerminal();
-  bool isInLayout(std::size_t line) const;
+  bool fitsLayout(std::size_t line) const;
   void writeHeader();
   Widths naturalWidths(bool showAll) const;
   std::vector<std::string> inLayout(std::vector<std::string> cells) const;
@@ -56,14 +55,14 @@ class Table : public Writer {
   std::vector<std::vector<std::string>> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   std::size_t files_ = 0;
-  std::atomic<bool> isCardLikely_{true};  // until a file is added, records are kept for it
-  Outcome first_;
+  std::atomic<bool> isCardLikely_{true};  // false once a file is added; records are kept until then
+  Outcome first_;                         // becomes a card if no other file follows
   bool isTerminal_;
   std::size_t pathColumn_ = 0;  // columns_.size() when there is none
-  std::size_t line_ = 0;
-  std::string folder_;        // of all paths, when it stands above the table
-  bool hasDaysOnly_ = false;  // dates are shown without the time
-  Widths natural_;            // of the layout in use
+  std::size_t line_ = 0;        // the terminal's width in the layout in use
+  std::string folder_;          // of all paths, when it stands above the table
+  bool hasDaysOnly_ = false;    // dates are shown without the time
+  Widths natural_;              // in the layout in use; empty before the first page
   Widths widths_;
 };
 
@@ -92,14 +91,14 @@ void Table::add(Outcome&& outcome) {
     isCardLikely_ = false;
   }
   auto const now = std::chrono::steady_clock::now();
-  if (page_.empty() && !natural_.empty()) {
+  if (page_.empty() && !natural_.empty()) {  // the first page started with the command
     pageStart_ = now;
   }
   if (!outcome.cells.empty()) {
     page_.push_back(std::move(outcome.cells));
   }
   auto const interval = natural_.empty() ? kFirstFlushInterval : kFlushInterval;
-  // Sorted rows come all at once, so no page needs to be short.
+  // Sorted rows come all at once, so no page needs to be short. A first file may become a card.
   bool const isDue =
       isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > interval;
   if (page_.size() == kPage || isDue) {
@@ -138,10 +137,10 @@ void Table::writePage(bool isLast) {
   page_.clear();
 }
 
-/// One header serves all pages: while more may come, an empty column stays, since they may fill it.
+/// One header serves all pages, so an empty column is left out only if there is just one page.
 void Table::widen(bool isLast) {
   bool const isFirst = natural_.empty();
-  Widths const natural = naturalWidths(!isFirst || !isLast);
+  Widths const natural = naturalWidths(!(isFirst && isLast));
   natural_.resize(columns_.size());
   std::transform(natural.begin(), natural.end(), natural_.begin(), natural_.begin(),
                  [](std::size_t a, std::size_t b) { return std::max(a, b); });
@@ -151,10 +150,10 @@ void Table::widen(bool isLast) {
   }
 }
 
-/// Saves width in this order: the common start of the paths, the cells, the time of day, columns.
+/// Leaves out what does not fit: the common folder, then parts of cells, then times, then columns.
 void Table::fitTerminal() {
   std::size_t const line = terminalWidth(STDOUT_FILENO);
-  if (isInLayout(line)) {
+  if (fitsLayout(line)) {
     return;
   }
   output_.add(natural_.empty() ? "" : "\n");
@@ -167,8 +166,8 @@ void Table::fitTerminal() {
     natural_ = naturalWidths(false);
   }
   widths_ = fit(columns_, natural_, line);
-  if (form_.fields.empty() && std::count(widths_.begin(), widths_.end(), 0U) >
-                                  std::count(natural_.begin(), natural_.end(), 0U)) {
+  auto const hidden = [](Widths const& all) { return std::count(all.begin(), all.end(), 0U); };
+  if (form_.fields.empty() && hidden(widths_) > hidden(natural_)) {
     hasDaysOnly_ = true;
     natural_ = naturalWidths(false);
     widths_ = fit(columns_, natural_, line);
@@ -177,14 +176,14 @@ void Table::fitTerminal() {
   writeHeader();
 }
 
-bool Table::isInLayout(std::size_t line) const {
+bool Table::fitsLayout(std::size_t line) const {
   auto const isInFolder = [this](std::vector<std::string> const& row) {
     return folder_.empty() || row[pathColumn_].compare(0, folder_.size(), folder_) == 0;
   };
   Widths const natural = naturalWidths(false);
   return line == line_ && std::all_of(page_.begin(), page_.end(), isInFolder) &&
          std::equal(natural.begin(), natural.end(), natural_.begin(), natural_.end(),
-                    std::less_equal<>());
+                    std::less_equal<>());  // no column is wider than in the layout
 }
 
 void Table::writeHeader() {

@@ -37,7 +37,7 @@ class TextWriter : public Writer {
  private:
   Output& output_;
   TextOf textOf_;
-  std::string start_;
+  std::string start_;  // of the next text
   std::string separator_;
 };
 
@@ -47,7 +47,7 @@ class SortingWriter : public Writer {
   SortingWriter(Form const& form, std::unique_ptr<Writer> next)
       : form_(form), next_(std::move(next)) {}
 
-  void prepare(Outcome&) const override {}
+  void prepare(Outcome&) const override {}  // sorting needs the record
   void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
   void end() override;
 
@@ -70,7 +70,7 @@ void SortingWriter::end() {
   for (auto& outcome : outcomes_) {
     next_->prepareSafely(outcome);
     next_->add(std::move(outcome));
-    outcome = {};
+    outcome = {};  // frees its memory
   }
   next_->end();
 }
@@ -101,7 +101,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
       return writer(paths(form, isTerminal), "", "");
     case FormKind::Card:
       return writer([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
-    default:
+    default:  // Automatic with notes
       return writer(explanationOf, "", "\n");
   }
 }

@@ -8,7 +8,7 @@
 
 namespace app {
 
-/// A form of the output.
+/// Writes the output in one form.
 class Writer {
  public:
   Writer() = default;
@@ -16,15 +16,14 @@ class Writer {
   Writer(Writer const&) = delete;
   Writer& operator=(Writer const&) = delete;
 
-  /// Does the form's part of the work on one file, on any thread. Drops the record.
+  /// Does the form's part of the work on one file, on any thread. Drops what is no longer needed.
   virtual void prepare(Outcome& outcome) const = 0;
-  /// The same, but a failure becomes the error of the file and ends nothing.
+  /// The same, but an exception becomes the file's problem.
   void prepareSafely(Outcome& outcome) const;
   /// Takes the prepared outcomes in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
-  /// Writes what was held back: nothing else may come for a while.
+  /// Writes what is held back, because nothing else may come for a while.
   virtual void pause() {}
-  /// Called at the end.
   virtual void end() {}
 };
 

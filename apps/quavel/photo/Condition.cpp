@@ -87,7 +87,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
   if (!isKnown || text.find_first_of(kSigns) == 0) {
     refuse(whole, "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
   }
-  text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));
+  text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));  // leading blanks
   if (text.empty()) {
     refuse(whole, "lacks the value to compare with");
   }

@@ -16,7 +16,7 @@ namespace {
 using quavel::QVMetadata;
 
 constexpr std::size_t kMaxCells = 200;
-constexpr std::size_t kMaxBytes = 8 * kMaxCells;
+constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // since combining marks take no cells
 
 /// A member of a record or a problem; absent when it holds the value that means absence there.
 template <class T>
@@ -41,7 +41,7 @@ Value captureDate(Outcome const& outcome) {
   return outcome.record ? present(outcome.record->captureDate()) : Value();
 }
 
-/// The same, but never a blank date; the record itself may choose one.
+/// The same, but never a blank date, which the record itself may choose.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -79,7 +79,7 @@ std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-/// A value in words.
+/// Puts a value that is not absent into words.
 struct Said {
   Value const& value;
   template <class T>

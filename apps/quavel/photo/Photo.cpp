@@ -4,7 +4,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cerrno>
 #include <ctime>
 #include <exception>
@@ -103,8 +102,9 @@ void fill(Outcome& outcome, Detail detail, Read read) {
 std::string extensionOf(std::string_view path) {
   auto const dot = path.rfind('.');
   std::string extension(dot == std::string_view::npos ? "" : path.substr(dot + 1));
-  std::transform(extension.begin(), extension.end(), extension.begin(),
-                 [](char c) { return 'A' <= c && c <= 'Z' ? static_cast<char>(c + 32) : c; });
+  for (char& c : extension) {
+    c = 'A' <= c && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+  }
   return extension;
 }
 
@@ -112,8 +112,10 @@ bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");
   // The library answers by making a record, too expensive for each name in a large folder.
   thread_local std::unordered_set<std::string> known;
-  return known.count(extension) != 0 ||
-         (library.createMetadata(extension) != nullptr && known.insert(extension).second);
+  if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
+    known.insert(extension);
+  }
+  return known.count(extension) != 0;
 }
 
 std::string whyUnknown(std::string const& extension) {

@@ -71,11 +71,12 @@ std::string whiteBalance(std::int32_t value) {
 }
 
 std::string exposureTime(float seconds) {
+  bool const isTiny = seconds <= 1e-6F;
   // Cameras show the fraction up to 1/4 s and decimals from 0.3 s on.
-  if (seconds > 1e-6F && seconds < 0.26F) {
+  if (!isTiny && seconds < 0.26F) {
     return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";
   }
-  return decimal(seconds, seconds < 0.1F ? 9 : 1) + " s";
+  return decimal(seconds, isTiny ? 9 : 1) + " s";
 }
 
 std::string fNumber(float value) { return "f/" + decimal(value, value < 1 ? 2 : 1); }
