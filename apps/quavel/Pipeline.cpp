@@ -80,7 +80,7 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * maxThreads()); }
 
-std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_ : busyJobs_; }
+std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_.load() : busyJobs_; }
 
 void Pipeline::startThread() {
   interrupt::BlockSignals const block;
@@ -89,7 +89,7 @@ void Pipeline::startThread() {
   } catch (std::system_error const&) {
     // No further thread can be started: those that run do the work; if none runs, the caller does.
     jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
-    busyJobs_ = std::min(busyJobs_, jobs_);
+    busyJobs_ = std::min(busyJobs_, jobs_.load());
   }
 }
 

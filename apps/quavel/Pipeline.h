@@ -17,10 +17,8 @@
 
 namespace app {
 
-/// Some consecutive files. A caller that keeps more about them derives its own kind of batch.
+/// Some consecutive files.
 struct Batch {
-  virtual ~Batch() = default;
-
   std::vector<Input> inputs;
   std::vector<Outcome> outcomes;
   double seconds = 0;     ///< How long the work took.
@@ -58,7 +56,7 @@ class Pipeline {
   void workOn(Batch& batch);
   void runThread();
 
-  unsigned jobs_;
+  std::atomic<unsigned> jobs_;
   unsigned busyJobs_;
   std::atomic<bool> waitsForDisk_;
   Work work_;

@@ -29,16 +29,14 @@ app::Problem whyUnfit(std::string const& path) {
                                  : app::Problem{app::reason::kSpecialFile, "not a regular file"};
 }
 
-void read(app::Outcome& outcome, bool isPhoto, int& systemError, QVJournal& journal) {
+void read(app::Outcome& outcome, bool isPhoto, QVJournal& journal) {
   try {
     if (!isPhoto) {
       outcome.problem = whyUnfit(outcome.path);
     }
     outcome.record = outcome.problem ? nullptr : journal.read(outcome.path);
     if (!outcome.record && !outcome.problem) {
-      Refusal const refusal = refusalOf(journal);
-      outcome.problem = refusal;
-      systemError = refusal.systemError;
+      outcome.problem = refusalOf(journal);
     }
   } catch (std::bad_alloc const&) {
     outcome.problem = {app::reason::kOutOfMemory, "out of memory"};  // both fit without memory
@@ -54,7 +52,6 @@ void readBatch(app::Batch& batch) {
     unlocked.emplace();
   }
   auto const start = Clock::now();
-  auto& systemErrors = static_cast<Batch&>(batch).systemErrors;
   QVJournal journal(QVJournal::Detail::Refusals);
   batch.outcomes.resize(batch.inputs.size());
   for (std::size_t i = 0; i < batch.inputs.size(); ++i) {
@@ -63,7 +60,7 @@ void readBatch(app::Batch& batch) {
     outcome.path = std::move(input.path);
     outcome.problem = std::move(input.problem);
     if (!outcome.problem) {
-      read(outcome, input.isPhoto, systemErrors[i], journal);
+      read(outcome, input.isPhoto, journal);
     }
   }
   batch.seconds = std::chrono::duration<double>(Clock::now() - start).count();

@@ -6,22 +6,22 @@ namespace binding {
 
 using quavel::QVJournal;
 
-Refusal refusalOf(QVJournal const& journal) {
+app::Problem refusalOf(QVJournal const& journal) {
   quavel::QVNote const& note = *journal.refusal();
-  Refusal refusal = {{QVJournal::reasonName(note.reason), note.text, note.position},
-                     note.systemError};
+  app::Problem problem = {QVJournal::reasonName(note.reason), note.text, note.position,
+                          note.systemError};
   for (auto const& hint : journal.notes()) {
     if (hint.reason == quavel::QVReason::OtherContent) {
-      refusal.text = hint.text + ": " + note.text;
+      problem.text = hint.text + ": " + note.text;
     }
   }
-  return refusal;
+  return problem;
 }
 
-py::object noRecord(Refusal const& refusal, py::handle path) {
+py::object noRecord(app::Problem const& problem, py::handle path) {
   return py::module_::import("quavel._types")
-      .attr("NoRecord")(text(refusal.text), refusal.reason, orNone(refusal.position, -1),
-                        orNone(refusal.systemError, 0), path);
+      .attr("NoRecord")(text(problem.text), problem.reason, orNone(problem.position, -1),
+                        orNone(problem.systemError, 0), path);
 }
 
 void raiseNoRecord(QVJournal const& journal, py::handle path) {

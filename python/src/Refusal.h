@@ -12,16 +12,11 @@ namespace binding {
 
 namespace py = pybind11;
 
-/// Why there is no record.
-struct Refusal : app::Problem {
-  int systemError = 0;
-};
-
 /// The refusal in the journal of a read that gave no record.
-Refusal refusalOf(quavel::QVJournal const& journal);
+app::Problem refusalOf(quavel::QVJournal const& journal);
 
 /// The exception `NoRecord`; `path` is None for a photo that was not read by path.
-py::object noRecord(Refusal const& refusal, py::handle path);
+py::object noRecord(app::Problem const& problem, py::handle path);
 
 /// Throws it.
 [[noreturn]] void raiseNoRecord(quavel::QVJournal const& journal, py::handle path);

@@ -106,11 +106,11 @@ py::list Scanner::nextBatch() {
   auto const batch = pipeline_->take();
   batchSize_ = batch->seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
                                            : std::min(batchSize_ * 2, kMaxBatch);
-  return resultsOf(static_cast<Batch&>(*batch), paths);
+  return resultsOf(*batch, paths);
 }
 
 void Scanner::submitNext() {
-  auto batch = std::make_unique<Batch>();
+  auto batch = std::make_unique<app::Batch>();
   py::list paths;
   if (walk_) {
     takeFound(*batch);
@@ -123,7 +123,7 @@ void Scanner::submitNext() {
   }
 }
 
-void Scanner::takeFound(Batch& batch) {
+void Scanner::takeFound(app::Batch& batch) {
   while (batch.inputs.size() < batchSize_ && !walk_->isAtEnd()) {
     {
       Unlocked const unlocked;
@@ -131,8 +131,7 @@ void Scanner::takeFound(Batch& batch) {
       app::Input input;
       while (batch.inputs.size() < batchSize_ && !walk_->isAtEnd() && Clock::now() < end) {
         if (walk_->step(input)) {
-          int const error = input.problem ? walk_->error : 0;
-          batch.add(std::move(input), error);
+          batch.inputs.push_back(std::move(input));
         }
       }
     }
@@ -145,7 +144,7 @@ void Scanner::takeFound(Batch& batch) {
   }
 }
 
-void Scanner::takePaths(Batch& batch, py::list& paths) {
+void Scanner::takePaths(app::Batch& batch, py::list& paths) {
   try {
     auto const start = Clock::now();
     while (batch.inputs.size() < batchSize_ && (batch.inputs.empty() || !isLong(start))) {
@@ -168,7 +167,7 @@ void Scanner::takePaths(Batch& batch, py::list& paths) {
                          "the path contains a character that no path can contain"};
       }
       paths.append(path);
-      batch.add(std::move(input), 0);
+      batch.inputs.push_back(std::move(input));
     }
   } catch (py::error_already_set& error) {
     source_ = py::object();
@@ -192,15 +191,14 @@ void Scanner::waitForOldest() {
   }
 }
 
-py::list Scanner::resultsOf(Batch& batch, py::list const& paths) {
+py::list Scanner::resultsOf(app::Batch& batch, py::list const& paths) {
   auto const type = py::module_::import("quavel._types").attr("Result");
   auto* const resultType = reinterpret_cast<PyTypeObject*>(type.ptr());
   py::list results(batch.outcomes.size());
   for (std::size_t i = 0; i < batch.outcomes.size(); ++i) {
     app::Outcome& photo = batch.outcomes[i];
     py::object path = walk_ ? decoded(photo.path, isBytes_) : py::object(paths[i]);
-    py::object error =
-        photo.record ? py::none() : noRecord({photo.problem, batch.systemErrors[i]}, path);
+    py::object error = photo.record ? py::none() : noRecord(photo.problem, path);
     results[i] = makeResult(resultType, std::move(path), py::cast(std::move(photo.record)),
                             std::move(error));
   }

@@ -37,10 +37,10 @@ class Scanner {
 
  private:
   void submitNext();
-  void takePaths(Batch& batch, py::list& paths);
-  void takeFound(Batch& batch);
+  void takePaths(app::Batch& batch, py::list& paths);
+  void takeFound(app::Batch& batch);
   void waitForOldest();
-  py::list resultsOf(Batch& batch, py::list const& paths);
+  py::list resultsOf(app::Batch& batch, py::list const& paths);
 
   py::object source_;  // null once it has ended
   std::optional<py::error_already_set> failure_;

@@ -146,12 +146,10 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
   });
 }
 
-void FolderWalk::miss(std::string const& path, int systemError) {
-  error = systemError;
-  missed_ = {path,
-             false,
-             {reason::kUnreadableFolder, "the folder cannot be read: " + reason::systemText(error) +
-                                             "; its photos are missing"}};
+void FolderWalk::miss(std::string const& path, int error) {
+  std::string const text =
+      "the folder cannot be read: " + reason::systemText(error) + "; its photos are missing";
+  missed_ = {path, false, {reason::kUnreadableFolder, text, -1, error}};
 }
 
 }  // namespace app

@@ -42,8 +42,6 @@ class FolderWalk {
   /// One step of `next`; false when it found nothing. Must not be called at the end.
   bool step(Input& input);
 
-  int error = 0;  ///< The `errno` of the last folder that could not be read.
-
  private:
   using Identity = std::pair<dev_t, ino_t>;
   struct Entry {
@@ -61,7 +59,7 @@ class FolderWalk {
   bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
   bool isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const;
   void readEntries(DIR* folder, Level& level);
-  void miss(std::string const& path, int systemError);
+  void miss(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
 

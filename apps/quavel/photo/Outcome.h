@@ -18,6 +18,7 @@ struct Problem {
   std::string reason;          ///< For programs: the name of a QVReason, or a code of Reasons.h.
   std::string text;            ///< For the photo's owner; follows "path: " in a message.
   std::int64_t position = -1;  ///< In the file; -1: no particular place.
+  int systemError = 0;         ///< The `errno` that caused it; 0: none.
 };
 
 /// One file to read.

@@ -60,12 +60,12 @@ std::string systemText(int error) { return std::generic_category().message(error
 
 Problem cannotOpen(int error) {
   return {QVJournal::reasonName(QVReason::CannotOpen),
-          "the file cannot be opened: " + systemText(error) + advice(error)};
+          "the file cannot be opened: " + systemText(error) + advice(error), -1, error};
 }
 
 Problem cannotRead(int error) {
   return {QVJournal::reasonName(QVReason::ReadError),
-          "cannot be read: " + systemText(error) + advice(error)};
+          "cannot be read: " + systemText(error) + advice(error), -1, error};
 }
 
 Problem failure(std::exception const& error) {
@@ -84,7 +84,8 @@ Problem refusal(QVJournal const& journal) {
   }
   char const* const tip =
       note.reason == QVReason::Empty ? "; copy it again from its source" : advice(note.systemError);
-  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + tip, note.position};
+  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + tip, note.position,
+          note.systemError};
 }
 
 }  // namespace app::reason
