@@ -25,41 +25,32 @@ void expectRecord(QVJournal const& journal, std::shared_ptr<QVMetadata> const& r
 /// At the position where a refused seek leaves the stream, each file holds bytes that must not
 /// count.
 TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
-  struct Row {
-    char const* extension;
-    Bytes opening;
-    Bytes beyond;  // at `kFar`
-    char const* expected;
-  };
   Bytes const wrong = loose({{longs(kWidth, 13), ascii(kDateTimeOriginal, "bad")}});
   Bytes const right = loose({{longs(kWidth, 42), ascii(kDateTimeOriginal, "now")}});
   auto const moov = [](int width) {
     return box("moov", uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, width)}}))));
   };
-  Bytes raf = "FUJIFILM";
-  raf.resize(84);
-  raf += u32(kMM, kFar);
-  raf.resize(100);
   Bytes const image = jpegFile(kII, {{shorts(kOrientation, 6)}});
-  Row const rows[] = {
+  // Extension, opening, what lies at `kFar`, record.
+  std::tuple<std::string, Bytes, Bytes, char const*> const rows[] = {
       {"tif", Bytes("II*\0", 4) + u32(kII, kFar) + wrong, right, "width=42"},
       {"tif", tiff(kII, {{longs(kExif, kFar)}}) + wrong, right, "dateTimeOriginal=now"},
       {"tif", tiff(kII, {{claim(kDateTime, kAscii, 6, kFar)}}) + "wrong", "right",
        "dateTime=right"},
       {"cr3", u32(kMM, kFar) + "free" + moov(13), moov(42), "width=42, orientation=1, isRaw"},
-      {"raf", raf + u32(kMM, kFar + image.size()), image + tiff(kII, rafRawSection()),
+      {"raf", rafHeader(kFar, kFar + image.size()), image + tiff(kII, rafRawSection()),
        "width=6160, height=4032, orientation=6, isRaw"},
   };
-  for (Row const& row : rows) {
-    TemporaryFile const file(row.opening, row.extension);
+  for (auto const& [extension, opening, beyond, expected] : rows) {
+    TemporaryFile const file(opening, extension);
     std::fstream(file.path, std::ios::in | std::ios::out | std::ios::binary).seekp(kFar)
-        << row.beyond << Bytes(8, '\0');
+        << beyond << Bytes(8, '\0');
     // A RAF's sections are counted from a base of 64 bits.
-    bool const isInReach = kIsLongLong || row.extension[0] == 'r';
+    bool const isInReach = kIsLongLong || extension == "raf";
     QVJournal journal;
-    expectRecord(journal, journal.read(file.path), isInReach ? row.expected : "none");
+    expectRecord(journal, journal.read(file.path), isInReach ? expected : "none");
     auto const plain = std::make_shared<QVFStream>(file.path);
-    expectRecord(journal, journal.read(plain, row.extension), isInReach ? row.expected : "none");
+    expectRecord(journal, journal.read(plain, extension), isInReach ? expected : "none");
   }
 }
 

@@ -26,16 +26,6 @@ std::vector<std::shared_ptr<QVStream>> streamsOf(Bytes const& memory, std::strin
           detail::openReadAhead(path)};
 }
 
-template <class Check>
-void onEachStream(Bytes const& bytes, Check check) {
-  TemporaryFile const file(bytes, "bin");
-  auto const streams = streamsOf(bytes, file.path);
-  for (auto const& stream : streams) {
-    SCOPED_TRACE(&stream - streams.data());
-    check(*stream);
-  }
-}
-
 /// The next number; NaN when it cannot be read.
 template <class Number>
 double next(QVStream& stream, bool (QVStream::*read)(Number*)) {
@@ -49,7 +39,9 @@ TEST(Stream, ReadsEveryTypeInBothOrders) {
     Bytes const bytes = "\x7e\xfe\xfe" + u16(order, 0x8102) + u16(order, 0x8102) +
                         u32(order, 0x81020304) + u32(order, 0x81020304) + u32(order, 0xbfc00000) +
                         number(order, 0x3ff0000000000000, 8);
-    onEachStream(bytes, [&](QVStream& stream) {
+    TemporaryFile const file(bytes, "bin");
+    for (auto const& each : streamsOf(bytes, file.path)) {
+      QVStream& stream = *each;
       EXPECT_EQ(stream.hostOrder, stream.hostBytesOrder());
       EXPECT_EQ(stream.byteOrder, kMM);
       EXPECT_EQ(stream.getOffset(), 0);
@@ -68,7 +60,7 @@ TEST(Stream, ReadsEveryTypeInBothOrders) {
       stream.setOffset(3);
       stream.byteOrder = static_cast<ByteOrder>(2);  // an unknown order reverses nothing
       EXPECT_EQ(next(stream, &QVStream::readShort), order == stream.hostOrder ? 0x8102 : 0x0281);
-    });
+    }
   }
 }
 

@@ -68,22 +68,6 @@ TEST(Sweep, OfPiecesGivesTheSameRecord) {
   }
 }
 
-TEST(Sweep, OfFailingReadsEndsTheRead) {
-  for (Fixture const& fixture : fixtures()) {
-    bool isEnough = false;
-    for (int allowed = 0; !isEnough; ++allowed) {
-      auto const stream = std::make_shared<TestStream>(fixture.bytes(kMM));
-      stream->onRead = [&](auto* destination, std::size_t count) {
-        return stream->reads > allowed ? -1 : stream->deliver(destination, count);
-      };
-      std::string const result = readStream(stream, fixture.extension);
-      isEnough = stream->reads <= allowed;
-      EXPECT_TRUE((result == fixture.expected) == isEnough || isJpeg(fixture)) << allowed;
-      EXPECT_TRUE((result[0] == '!') != isEnough || isJpeg(fixture)) << allowed;
-    }
-  }
-}
-
 TEST(Threads, ReadTheSameFilesAtOnce) {
   TemporaryFile const file(fixtureOf("nef").bytes(kMM), "nef");
   auto const readAll = [&](bool& isRight) {

@@ -113,15 +113,18 @@ Bytes jpegFile(ByteOrder order, Directory const& image) {
          sof0() + segment(0xffda, Bytes(10, '\x01')) + "scan\xff\xd9";
 }
 
-Bytes rafFile(Bytes const& image, Bytes const& rawSection) {
-  constexpr std::size_t kHeaderSize = 148;
+Bytes rafHeader(std::size_t imageOffset, std::size_t rawSectionOffset) {
   Bytes header = "FUJIFILMCCD-RAW 0201";
   header.resize(84);
-  header += u32(kMM, kHeaderSize);
+  header += u32(kMM, imageOffset);
   header.resize(100);
-  header += u32(kMM, kHeaderSize + image.size());
-  header.resize(kHeaderSize);
-  return header + image + rawSection;
+  header += u32(kMM, rawSectionOffset);
+  header.resize(148);
+  return header;
+}
+
+Bytes rafFile(Bytes const& image, Bytes const& rawSection) {
+  return rafHeader(148, 148 + image.size()) + image + rawSection;
 }
 
 Bytes uuidBox(Bytes const& children, Bytes const& identifier) {

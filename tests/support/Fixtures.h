@@ -42,7 +42,8 @@ Bytes uuidBox(Bytes const& children, Bytes const& identifier = "");
 /// `ftyp`, a `moov` around its children, `mdat`.
 Bytes cr3File(Bytes const& moovChildren);
 
-/// `image` is the embedded JPEG, `rawSection` a TIFF structure.
+/// 148 bytes with the offsets of the embedded JPEG and of the TIFF structure that follows it.
+Bytes rafHeader(std::size_t imageOffset, std::size_t rawSectionOffset);
 Bytes rafFile(Bytes const& image, Bytes const& rawSection);
 
 // Directories of well-made files beside those of the fixtures.
