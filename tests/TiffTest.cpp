@@ -75,13 +75,10 @@ TEST(TiffValue, DividesInTheResultsPrecisionAndIsZeroWithoutAType) {
   ASSERT_TRUE(value.read(stream));
   EXPECT_EQ(value.doubleValue(), 3355443.4);
   EXPECT_EQ(value.floatValue(), 3355443.25F);  // rounding the double would give .5
-  EXPECT_EQ(value.rationalValue().numerator, 16777217U);
-  EXPECT_EQ(value.rationalValue().denominator, 5U);
-  EXPECT_EQ(value.sRationalValue().denominator, 0);
+  auto const isPair = [](auto pair) { return pair.numerator == 16777217 && pair.denominator == 5; };
+  EXPECT_TRUE(isPair(value.rationalValue()) && value.sRationalValue().denominator == 0);
   value.type = Type::SRATIONAL;
-  EXPECT_EQ(value.sRationalValue().numerator, 16777217);
-  EXPECT_EQ(value.sRationalValue().denominator, 5);
-  EXPECT_EQ(value.rationalValue().denominator, 0U);
+  EXPECT_TRUE(isPair(value.sRationalValue()) && value.rationalValue().denominator == 0);
 
   for (int const noType : {6, 12, 255}) {
     value.type = static_cast<Type>(noType);
@@ -165,7 +162,11 @@ TEST(TiffEntry, LeavesTheStreamWhereItsLastReadEnded) {
       {u16(kMM, kShort) + u32(kMM, 3) + u32(kMM, 12) + "..abcdef", true, 18},
       {u16(kMM, kUndefined) + u32(kMM, 0) + "abcd", true, 6},
       {u16(kMM, kUndefined) + u32(kMM, 9) + "abcd", true, 10},
+      {"\1", false, 1},
       {u16(kMM, 99) + u32(kMM, 1) + "abcd", false, 2},
+      {u16(kMM, kLong) + "\1\1\1", false, 5},
+      {u16(kMM, kLong) + u32(kMM, 2) + "\1\1\1", false, 9},
+      {u16(kMM, kUndefined) + u32(kMM, 5) + "\1\1\1", false, 9},
       {u16(kMM, kByte) + u32(kMM, 65536) + u32(kMM, 10) + Bytes(65536, '\7'), true, 65546},
       {u16(kMM, kByte) + u32(kMM, 65537) + u32(kMM, 10) + Bytes(65537, '\7'), false, 6},
   };
@@ -173,14 +174,6 @@ TEST(TiffEntry, LeavesTheStreamWhereItsLastReadEnded) {
     auto stream = streamOf(bytes);
     EXPECT_EQ(Entry().read(stream), isRead);
     EXPECT_EQ(stream->getOffset(), position);
-  }
-  for (Bytes const& whole : {u16(kMM, kLong) + u32(kMM, 2) + u32(kMM, 0),
-                             u16(kMM, kUndefined) + u32(kMM, 5) + u32(kMM, 0)}) {
-    for (std::size_t length = 0; length < whole.size(); ++length) {
-      auto stream = streamOf(whole.substr(0, length));
-      Entry entry;
-      EXPECT_FALSE(entry.read(stream) || entry.values) << length;
-    }
   }
   auto cut = streamOf(u16(kMM, kUndefined) + u32(kMM, 4) + "AB");
   Entry entry;
@@ -244,10 +237,13 @@ TEST(TiffDirectory, StopsOnceAllWantedTagsAreFound) {
   Bytes bytes = tiff(kII, three).substr(0, 46);
   bytes[8] = 20;  // entries that it claims
   EXPECT_EQ(readDirectory(bytes, {4}), "! next 0");
-  for (TagList const& tags : {TagList{1, 3}, {1, 3, 1, 3, 1}, TagList(20, 3)}) {
+  for (int const times : {1, 2, 9}) {
+    TagList tags = {1};
+    for (int i = 0; i < times; ++i) {
+      tags.insert(tags.end(), {3, 1});
+    }
     // All are found; then the next directory's offset is missing.
-    EXPECT_EQ(readDirectory(bytes, tags),
-              tags[0] == 1 ? "! 1: 10, 3: 30, next 0" : "! 3: 30, next 0");
+    EXPECT_EQ(readDirectory(bytes, tags), "! 1: 10, 3: 30, next 0");
   }
   Bytes const whole = tiff(kMM, {{shorts(1, 6)}, 7});
   for (std::size_t length = 8; length < whole.size(); ++length) {
