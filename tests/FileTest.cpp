@@ -25,7 +25,7 @@ struct System {
 
   int reads = 0;
   std::vector<int> advice;
-  off_t advisedFrom = 0;
+  std::pair<off_t, off_t> advised;  // offset and length
 
   bool isBroken(off_t position, std::size_t count) const {
     return position <= brokenByte && brokenByte < position + static_cast<off_t>(count);
@@ -46,8 +46,8 @@ extern "C" ssize_t pread(int fd, void* bytes, std::size_t count, off_t position)
              : ::read(fd, bytes, std::min(count, theSystem.mostAtOnce));
 }
 
-extern "C" int posix_fadvise(int /*fd*/, off_t from, off_t /*length*/, int advice) {
-  theSystem.advisedFrom = from;
+extern "C" int posix_fadvise(int /*fd*/, off_t offset, off_t length, int advice) {
+  theSystem.advised = {offset, length};
   theSystem.advice.push_back(advice);
   return theSystem.takesAdvice ? 0 : EINVAL;
 }
@@ -141,7 +141,8 @@ TEST_F(FileTest, ThatIsWalkedToItsEndIsForeseen) {
   EXPECT_EQ(describePath(file.path), "width=4000, height=3000");
   EXPECT_EQ(theSystem.advice,
             (std::vector<int>{POSIX_FADV_RANDOM, POSIX_FADV_WILLNEED, POSIX_FADV_WILLNEED}));
-  EXPECT_EQ(theSystem.advisedFrom, 2 + 155 * 30004);  // 4 MB after the first time, its 16th read
+  // 4 MB after the first time, its 16th read.
+  EXPECT_EQ(theSystem.advised, std::make_pair(off_t{2 + 155 * 30004}, off_t{4 << 20}));
 }
 
 /// What a journal says of a pipe that others fill.

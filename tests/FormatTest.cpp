@@ -51,6 +51,7 @@ TEST(Tiff, GivesWhatIsThere) {
           {in(kExif, drop(kDateTimeOriginal)),
            in(kExif, characters(kDateTimeOriginal, "2021", kUndefined))}},
          {"orientation=9", {shorts(kOrientation, 9)}},
+         {"", {insert(5, 70)}},  // between a text elsewhere and the pointer to the Exif directory
          {"! width, height, orientation, dateTimeOriginal, dateTime",
           {in(kExif, shorts(kDateTimeDigitized, 2021))}}});
   Bytes const text = Bytes(600, 'a') + Bytes(600, 'b') + "c";

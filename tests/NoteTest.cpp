@@ -248,7 +248,7 @@ TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItToOthers) {
     stream->setOffset(0);
     errno = EIO;
     EXPECT_FALSE(journal.read(stream, "tif"));
-    EXPECT_EQ(shown(*journal.refusal()).substr(0, begin.size()), begin);
+    EXPECT_EQ((shown(*journal.refusal()) + "\n").substr(0, begin.size()), begin);
     EXPECT_EQ(journal.refusal()->systemError, 0);
   };
   Bytes const header = "the TIFF header at 0";
@@ -258,7 +258,7 @@ TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItToOthers) {
   photo->onRead = [&](auto* destination, std::size_t size) {
     return photo->offset >= 4 ? -1 : photo->deliver(destination, size);
   };
-  expectRefusal(photo, "read-error at 4: " + header + ": 4 bytes wanted at 4, but reading fails");
+  expectRefusal(photo, "read-error at 4: " + header + ": 4 bytes wanted at 4, but reading fails\n");
   expectRefusal(std::make_shared<QVReadAheadStream>(photo, 4, 4), "read-error at 4: ");
   photo->onRead = [&](auto* destination, std::size_t size) {  // more than was asked for
     return photo->deliver(destination, size) + (size > 8 ? 1000 : 0);
