@@ -165,7 +165,7 @@ TEST(TiffEntry, LeavesTheStreamWhereItsLastReadEnded) {
       {"\1", false, 1},
       {u16(kMM, 99) + u32(kMM, 1) + "abcd", false, 2},
       {u16(kMM, kLong) + "\1\1\1", false, 5},
-      {u16(kMM, kLong) + u32(kMM, 2) + "\1\1\1", false, 9},
+      {u16(kMM, kLong) + u32(kMM, 1) + "\1\1\1", false, 9},
       {u16(kMM, kUndefined) + u32(kMM, 5) + "\1\1\1", false, 9},
       {u16(kMM, kByte) + u32(kMM, 65536) + u32(kMM, 10) + Bytes(65536, '\7'), true, 65546},
       {u16(kMM, kByte) + u32(kMM, 65537) + u32(kMM, 10) + Bytes(65537, '\7'), false, 6},
