@@ -117,7 +117,7 @@ TEST(Raf, ReadsTheImagesDirectoriesAndTheRawSection) {
 
 TEST(Raf, ReadsWhatItsHeaderLeadsTo) {
   Bytes raf = fixtureOf("raf").bytes(kII);
-  raf[7] = 'm';
+  raf[3] = 'j';
   Bytes const image = fixtureOf("jpg").bytes(kII);
   Bytes const jfif = "\xff\xd8" + segment(0xffe0, "JFIF") + image.substr(2);
   Bytes const section = tiff(kII, rafRawSection());
@@ -188,7 +188,7 @@ TEST(Jpeg, WalksOverOtherSegments) {
           {"\xff\xdb", "\xff\xe1\x01", segment(0xffe1, "Exi"), segment(0xffe1, "Exif\xff"),
            exifSegment("II+"), sof0().substr(0, 8), Bytes(1000, '\0')}}},
         "\xff\xd8");
-  check("jpeg", {{"! ", {"\xff", Bytes("\xff\xd7") + sof0()}}});
+  check("jpeg", {{"! ", {"\xff", "\xff\xd7" + sof0(), "\x7f\xd8" + sof0()}}});
   EXPECT_EQ(QVJPEGImage::markerSkipLengths.size(), 11U);  // the same, for hosts
 
   auto const stream = streamOf("before\xff\xd8" + exif + exif + sof0(), kII, 6);

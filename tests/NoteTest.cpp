@@ -196,6 +196,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
        "hint picture-data at 21: Before the scan at 0x15 (21) no APP1 was met;"},
       {"jpg", kSOI + sof0(), "step none at 2: the SOF0 segment at 2 declares 4000 x 3000\n"},
       {"raf", rafFile(Bytes(40, 'x'), ""), "hint other-opening at 148: The embedded JPEG at "},
+      {"raf", rafFile("\xff\xd8\xff\xe2" + image.substr(4), ""), "hint other-opening at 148: "},
       {"raf", rafFile(image, ""), "- hint other"},
       {"raf", rafFile(jpegFile(kII, {}), tiff(kII, {{pointer(kRafPointer, {Directory()})}})),
        "step none at 308: the vendor directory at 0x134 (308): has 0 of the 2 wanted entries\n"},
