@@ -159,7 +159,7 @@ TEST(Jpeg, WalksOverOtherSegments) {
   std::string const whole = fixtureOf("jpg").expected;
   std::string const frame = "width=4000, height=3000";
   Bytes const exif = exifSegment(tiff(kII, fixtureOf("jpg").directory()));
-  Bytes const other = segment(0xffe1, "http://ns.adobe");
+  Bytes const other = segment(0xffe1, "Exig, another kind");
   auto const oneSide = [&](std::uint16_t tag) {
     return exif + exifSegment(tiff(kMM, {{pointer(kExif, {{{shorts(tag, 3500)}}})}})) + sof0();
   };

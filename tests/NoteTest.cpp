@@ -166,6 +166,7 @@ TEST(Notes, TellWhyAFieldIsAbsent) {
        "height not-in-file: " + noFrame + "declares 4294967280 x 600; only more than 500 a side"},
       {"jpg", jpegWith({{longs(kWidth, 600)}}),
        "width not-in-file: " + noFrame + "does not give both sides\n"},
+      {"jpg", jpegWith({}), "orientation not-in-file: no 0x0112 Orientation in IFD0 of the Exif"},
       {"jpg", kSOI + sof0(), "orientation not-in-file: no Exif segment (APP1) was met\n"},
       {"jpg", kSOI + sof0() + segment(0xffe1, "http"),
        "orientation not-in-file: no Exif segment among those up to SOF0 and an APP1"},
