@@ -239,7 +239,7 @@ TEST(Cr3, FindsTheMetadataWhereverItIs) {
   Bytes const cmt12 = cmt1Box() + cmt2Box(kMM);
   Bytes const noCmt1 = box("CMT1", tiff(kII, {}));
   Bytes almost = uuidBox(cmt12);
-  almost[8 + 15] ^= 1;
+  almost[8 + 5] ^= 1;
   std::string const all = fixtureOf("cr3").expected;
   std::string const ofCmt1 = all.substr(0, all.find(", lensModel"));
   check(
@@ -311,7 +311,8 @@ TEST(Cr3Box, RefusesWhatIsCutOrAnotherBox) {
     auto stream = streamOf(bytes);
     return !box.read(stream);
   };
-  for (Bytes const& bytes : {Bytes("\1\1\1\1moo"), box("free", "")}) {
+  EXPECT_TRUE(refuses(QVCR3Box(), "\1\1\1\1moo"));
+  for (Bytes const& bytes : {Bytes("\1\1\1\1moo"), box("free", Bytes(16, 'x'))}) {
     EXPECT_TRUE(refuses(QVCR3MoovBox(), bytes) && refuses(QVCR3UUIDBox(), bytes) &&
                 refuses(QVCR3CMT1Box(), bytes) && refuses(QVCR3CMT2Box(), bytes));
   }

@@ -131,6 +131,8 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
        "size 1; at least its header's 8 bytes are wanted (1 stands for a 64-bit size"},
       {"cr3", cr3File(uuidBox(box("CMT3", ""))),
        "missing-part at 24: the metadata uuid box at 0x18 (24) has neither a CMT1 nor a CMT2 box"},
+      {"cr3", box("moov", Bytes("\0\0\0\x50uuidshort", 13)),
+       "cut-short at 16: the 16-byte identifier of the uuid box at 8: 16 bytes wanted at 0x10"},
       {"cr3", cr3File(uuidBox("") + uuidBox("", Bytes(16, 'f'))),
        "missing-part at 48: the last uuid box of the moov box at 0x10 (16), the uuid box at 0x30"},
       {"cr3", cr3With("CMT2", ratio(kFocalLength, 1, 1, kSRational)),
@@ -140,6 +142,7 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
        "other-kind at 24: the header of the next box before a moov box was met: 8 bytes wanted"},
       {"png", "x",
        "unknown-extension: the extension \"png\" names no format; these do: tiff tif dng nef "},
+      {"jpg/a", "", "unknown-extension: there is no extension; these name a format: tiff"},
       {"", "x", "unknown-extension: there is no extension; these name a format: tiff"},
       {Bytes(100, 'x') + "y", "",
        "unknown-extension: the extension \"" + Bytes(100, 'x') + "\" names no format;"},
@@ -185,6 +188,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
       {"jpg", box("ftyp", Bytes("he\x1b") + "c"),
        "hint other-content at 0: The file looks like an ISO base media file of brand "
        "\"he\\x1bc\"; its extension has it read as JPEG\n"},
+      {"jpg", Bytes("\0\0\0\14ftyp", 8), "hint ... like an ISO base media file; its"},
       {"dng", "PK\3\4....", "hint other-content at 0: The file looks like a ZIP archive; its"},
       {"tif", shorts(kOrientation, 1, 1), "- hint other"},  // it looks like what it is read as
       {"jpg", kSOI + segment(0xffc2, Bytes(9, '\0')),
