@@ -1,7 +1,7 @@
 // Any bytes as a file of any format: what a record may hold, and that reading leaves no trace.
 
 #include "Fuzzing.h"
-#include "support/JournalInvariants.h"
+#include "support/Fields.h"
 
 namespace quavel::fuzz {
 namespace {

@@ -3,11 +3,10 @@
 #include <gtest/gtest.h>
 #include <malloc.h>
 
-#include <algorithm>
 #include <cstdlib>
 #include <new>
 
-#include "support/Hostile.h"
+#include "support/Fixtures.h"
 
 namespace {
 
@@ -20,14 +19,11 @@ std::size_t peak = 0;           // bytes
 
 // If they were inlined, the compiler would warn of pairs of malloc and free that do not match.
 [[gnu::noinline]] void* operator new(std::size_t size) {
-  if (allocationsLeft == 0) {
-    throw std::bad_alloc();
-  }
-  allocationsLeft -= allocationsLeft > 0 ? 1 : 0;
-  void* const memory = std::malloc(size);
+  void* const memory = allocationsLeft == 0 ? nullptr : std::malloc(size);
   if (memory == nullptr) {
     throw std::bad_alloc();
   }
+  allocationsLeft -= allocationsLeft > 0 ? 1 : 0;
   live += ::malloc_usable_size(memory);
   peak = std::max(peak, live);
   return memory;
@@ -48,7 +44,7 @@ namespace {
 template <class Read>
 long sweepAllocations(Read read) {
   std::size_t const before = live;
-  for (long allowed = 0; allowed < 1000; ++allowed) {
+  for (long allowed = 0;; ++allowed) {
     bool isEnough = true;
     allocationsLeft = allowed;
     try {
@@ -58,11 +54,10 @@ long sweepAllocations(Read read) {
     }
     allocationsLeft = kNever;
     EXPECT_EQ(live, before) << allowed;
-    if (isEnough) {
+    if (isEnough || allowed == 1000) {
       return allowed;
     }
   }
-  return 1000;
 }
 
 TEST(Allocation, FailureLeavesNothingBehindAndAFileTakesFew) {
@@ -73,18 +68,10 @@ TEST(Allocation, FailureLeavesNothingBehindAndAFileTakesFew) {
     TemporaryFile const file(bytes, fixture.extension);
     EXPECT_LE(sweepAllocations([&] { QVReader(data, bytes.size(), fixture.extension); }), 20);
     EXPECT_LE(sweepAllocations([&] { QVReader const reader(file.path); }), 30);
-    EXPECT_LT(sweepAllocations([&] {
-                QVTiffImageFileDirectory directory;
-                std::shared_ptr<QVStream> stream = std::make_shared<QVMStream>(data, bytes.size());
-                QVTiffHeader header;
-                header.read(stream, 42);
-                stream->setOffset(header.firstIFDOffset);
-                directory.read(stream, {});
-              }),
-              1000);
   }
 }
 
+/// The most memory that reading the file takes at a time.
 std::size_t heapOf(Bytes bytes, std::string const& extension) {
   auto* const data = dataOf(bytes);
   std::size_t const before = live;
@@ -94,10 +81,12 @@ std::size_t heapOf(Bytes bytes, std::string const& extension) {
 }
 
 TEST(Allocation, OfOneReadIsBoundedByWhatIsThere) {
-  constexpr std::size_t kMost = 32U << 20U;
-  constexpr Greed kGreed = {1000, 65536};
-  EXPECT_LT(heapOf(widestDirectory(kGreed), "cr3"), kMost);
-  EXPECT_LT(heapOf(repeatedBoxes(kGreed, 2, 1), "cr3"), kMost);
+  Directory widest = cmt2();
+  for (Field& field : widest.fields) {
+    field = claim(field.tag, kRational, 65536, 0);
+  }
+  Bytes const values(8 * 65536, '\1');
+  EXPECT_LT(heapOf(cr3File(uuidBox(box("CMT2", tiff(kII, widest) + values))), "cr3"), 32U << 20U);
   // Not by what is declared.
   Directory const claims = {{claim(kWidth, kRational, 65536, 8), claim(kLength, kByte, 65536, 8)}};
   EXPECT_LT(heapOf(tiff(kII, claims), "tif"), 16384U);

@@ -1,85 +1,120 @@
 #include <gtest/gtest.h>
 
-#include <algorithm>
+#include <fstream>
 
-#include "support/Hostile.h"
-#include "support/Streams.h"
+#include "support/Fixtures.h"
 
 namespace quavel::test {
 namespace {
 
-Bytes repeated(std::size_t count, Bytes const& bytes) {
-  Bytes all;
-  for (std::size_t i = 0; i < count; ++i) {
-    all += bytes;
-  }
-  return all;
+// Files beyond the offsets that a `long` of 32 bits holds.
+
+constexpr bool kIsLongLong = sizeof(long) == 8;
+constexpr std::uint32_t kFar = 0x90000000;  // beyond what a `long` of 32 bits holds
+
+/// A directory that is the same wherever it lies.
+Bytes loose(Directory const& directory) { return tiff(kII, directory).substr(8); }
+
+/// Expects the record, or none for lack of the bytes.
+void expectRecord(QVJournal const& journal, std::shared_ptr<QVMetadata> const& record,
+                  char const* expected) {
+  EXPECT_EQ(describe(record), expected);
+  EXPECT_TRUE(record || journal.refusal()->reason == QVReason::CutShort);
 }
 
-// Nothing in the formats says how many come before the wanted one.
-TEST(Limit, ReadsPastThousandsOfOrdinaryParts) {
-  Directory file = reducedTiff();
-  std::vector<Directory> subIFDs(4999, file[kSubIFDs].subdirectories[0]);
-  subIFDs.push_back(file[kSubIFDs].subdirectories[1]);
-  file[kSubIFDs] = pointer(kSubIFDs, subIFDs);
-  EXPECT_EQ(readBuffer(tiff(kII, file), "dng"), readBuffer(tiff(kII, reducedTiff()), "dng"));
+/// At the position where a refused seek leaves the stream, each file holds bytes that must not
+/// count.
+TEST(LargeFile, IsReadWhereOffsetsReachAndRefusedBeyond) {
+  Bytes const wrong = loose({{longs(kWidth, 13), ascii(kDateTimeOriginal, "bad")}});
+  Bytes const right = loose({{longs(kWidth, 42), ascii(kDateTimeOriginal, "now")}});
+  auto const moov = [](int width) {
+    return box("moov", uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, width)}}))));
+  };
+  Bytes const image = jpegFile(kII, {{shorts(kOrientation, 6)}});
+  // Extension, opening, what lies at `kFar`, record.
+  std::tuple<std::string, Bytes, Bytes, char const*> const rows[] = {
+      {"tif", Bytes("II*\0", 4) + u32(kII, kFar) + wrong, right, "width=42"},
+      {"tif", tiff(kII, {{longs(kExif, kFar)}}) + wrong, right, "dateTimeOriginal=now"},
+      {"tif", tiff(kII, {{claim(kDateTime, kAscii, 6, kFar)}}) + "wrong", "right",
+       "dateTime=right"},
+      {"cr3", u32(kMM, kFar) + "free" + moov(13), moov(42), "width=42, orientation=1, isRaw"},
+      {"raf", rafHeader(kFar, kFar + image.size()), image + tiff(kII, rafRawSection()),
+       "width=6160, height=4032, orientation=6, isRaw"},
+  };
+  for (auto const& [extension, opening, beyond, expected] : rows) {
+    TemporaryFile const file(opening, extension);
+    std::fstream(file.path, std::ios::in | std::ios::out | std::ios::binary).seekp(kFar)
+        << beyond << Bytes(8, '\0');
+    // A RAF's sections are counted from a base of 64 bits.
+    bool const isInReach = kIsLongLong || extension == "raf";
+    QVJournal journal;
+    expectRecord(journal, journal.read(file.path), isInReach ? expected : "none");
+    auto const plain = std::make_shared<QVFStream>(file.path);
+    expectRecord(journal, journal.read(plain, extension), isInReach ? expected : "none");
+  }
+}
 
-  Bytes const exif = exifSegment(tiff(kII, jpegExif()));
-  EXPECT_EQ(readBuffer("\xff\xd8" + repeated(3000, exif) + sof0(), "jpg"),
-            readBuffer("\xff\xd8" + exif + sof0(), "jpg"));
+TEST(LargeFile, IsWalkedAsFarAsOffsetsReach) {
+  // The walk over the boxes of a box must not take "out of reach" for its end.
+  Bytes bytes = box("moov", uuidBox(box("CMT1", tiff(kII, {{shorts(kWidth, 42)}}))));
+  bytes.replace(8, 4, u32(kMM, kFar)).replace(32, 4, u32(kMM, 0x80000000));
+  TemporaryFile const file(bytes, "cr3");
+  QVJournal journal;
+  expectRecord(journal, journal.read(file.path), "none");
 
-  Bytes const one = box("CMT1", tiff(kII, cmt1()));
-  std::string const record = readBuffer(cr3File(uuidBox(one)), "cr3");
-  Bytes const free = repeated(20000, box("free", ""));
-  EXPECT_EQ(readBuffer(cr3File(repeated(3000, uuidBox(one))), "cr3"), record);
-  EXPECT_EQ(readBuffer(cr3File(uuidBox(repeated(3000, one))), "cr3"), record);
-  EXPECT_EQ(readBuffer(free + cr3File(free + uuidBox(free + one)), "cr3"), record);
+  auto const stream = streamOf("\xff\xd8" + sof0());
+  stream->baseOffset = -0x7ff00000;  // what follows is at the end of 32-bit offsets
+  expectRecord(journal, journal.read(stream, "jpg"),
+               kIsLongLong ? "width=4000, height=3000" : "none");
+}
+
+// Files that make a reader do the same again and again.
+
+/// As many SubIFDs, all of them one directory that never says what it is.
+Bytes repeatedSubIFDs(std::uint32_t count, Directory const& shared) {
+  std::uint32_t const end = 38 + 4 * count;  // of a directory of two entries and this list
+  Field const list = {kSubIFDs, kLong, count, 4, std::vector<std::int64_t>(count, end)};
+  return tiff(kII, {{shorts(kNewSubfileType, 1), list}}) + directoryAt(kII, 0, shared) +
+         Bytes(8 * 65536, '\1');
+}
+
+void expectLimit(QVJournal const& journal, std::string const& bound) {
+  ASSERT_NE(journal.refusal(), nullptr) << bound;
+  EXPECT_EQ(journal.refusal()->kind, QVNoteKind::Limit);
+  EXPECT_EQ(journal.refusal()->reason, QVReason::TooMuchWork);
+  EXPECT_EQ(journal.refusal()->text, "the file makes the reader " + bound);
 }
 
 TEST(Limit, GivesUpAtItsBudgetAndSaysSo) {
-  struct Row {
-    Bytes bytes;
-    std::string extension;
-    std::string bound;
+  Directory const wide = {
+      {claim(kWidth, kRational, 65536, 0), claim(kLength, kRational, 65536, 0)}};
+  Directory const deep = {std::vector<Field>(65000)};
+  std::pair<Bytes, std::string> const rows[] = {
+      {repeatedSubIFDs(16384, {}), "open more than 16384 directories"},
+      {repeatedSubIFDs(300, deep), "walk over more than 16777216 directory entries"},
+      {repeatedSubIFDs(9, wide), "take more than 1048576 values of directory entries"},
   };
-  Row const rows[] = {
-      {repeatedSubIFDs({1, 65536}), "tif", "open more than 16384 directories"},
-      {repeatedSubIFDs({65000, 300}), "tif", "walk over more than 16777216 directory entries"},
-      {repeatedExif({1000, 65536}, 8), "jpg", "take more than 1048576 values of directory entries"},
-      {repeatedBoxes({1000, 65536}, 8, 1), "cr3", "take more than 1048576 values"},
-  };
-  for (Row const& row : rows) {
-    Bytes bytes = row.bytes;
+  for (auto const& [content, bound] : rows) {
+    Bytes bytes = content;
     QVJournal journal;
-    journal.read(dataOf(bytes), bytes.size(), row.extension);
-    ASSERT_NE(journal.refusal(), nullptr) << row.bound;
-    EXPECT_EQ(journal.refusal()->kind, QVNoteKind::Limit);
-    EXPECT_EQ(journal.refusal()->reason, QVReason::TooMuchWork);
-    EXPECT_NE(journal.refusal()->text.find(row.bound), std::string::npos)
-        << journal.refusal()->text;
+    journal.read(dataOf(bytes), bytes.size(), "tif");
+    expectLimit(journal, bound);
   }
 }
 
-/// The same 8 bytes without an end.
-struct Endless : TestStream {
-  using TestStream::TestStream;
-  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
-    offset %= length;
-    delivered += static_cast<std::int64_t>(count);
-    return QVMStream::readBuffer(destination, count);
-  }
-  std::int64_t delivered = 0;
-};
-
 TEST(Limit, EndsAWalkAfter16777216Steps) {
   for (bool const isJpeg : {true, false}) {  // SOI without an end, or empty boxes
-    auto const stream = std::make_shared<Endless>(isJpeg ? "\xff\xd8\xff\xd8\xff\xd8\xff\xd8"
-                                                         : Bytes("\0\0\0\10free", 8));
+    auto const stream = std::make_shared<TestStream>(isJpeg ? "\xff\xd8" : box("free", ""));
+    std::size_t delivered = 0;
+    stream->onRead = [&](auto* destination, std::size_t count) {
+      stream->offset %= stream->length;
+      delivered += count;
+      return stream->deliver(destination, count);
+    };
     QVJournal journal(QVJournal::Detail::Refusals);
     EXPECT_FALSE(journal.read(stream, isJpeg ? "jpg" : "cr3"));
-    EXPECT_EQ(journal.refusal()->reason, QVReason::TooMuchWork);
-    EXPECT_NE(journal.refusal()->text.find("16777216 segments or boxes"), std::string::npos);
-    EXPECT_GE(stream->delivered, isJpeg ? 1 << 25 : 1 << 27);
+    expectLimit(journal, "step over more than 16777216 segments or boxes");
+    EXPECT_GE(delivered, isJpeg ? 1U << 25U : 1U << 27U);
   }
 }
 

@@ -1,38 +1,29 @@
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <climits>
 #include <cmath>
 #include <filesystem>
-#include <random>
 #include <stdexcept>
 
 #include "stream/PositionedFile.h"
-#include "support/Streams.h"
+#include "support/Fixtures.h"
 
 namespace quavel::test {
 namespace {
 
 /// The same bytes as memory, as a file, and as a file read ahead in several ways.
 std::vector<std::shared_ptr<QVStream>> streamsOf(Bytes const& memory, std::string const& path) {
-  auto const plain = [&] { return std::make_shared<QVFStream>(path); };
+  auto const ahead = [&](std::size_t firstBlockSize, std::size_t nextBlockSize) {
+    return std::make_shared<QVReadAheadStream>(std::make_shared<QVFStream>(path), firstBlockSize,
+                                               nextBlockSize);
+  };
   return {streamOf(memory),
-          plain(),
+          std::make_shared<QVFStream>(path),
           std::make_shared<detail::PositionedFile>(path),
-          std::make_shared<QVReadAheadStream>(plain(), 16384, 4096),
-          std::make_shared<QVReadAheadStream>(plain(), 0, 3),
-          std::make_shared<QVReadAheadStream>(plain(), 3, 0),
+          ahead(16384, 4096),
+          ahead(0, 3),
+          ahead(3, 0),
           detail::openReadAhead(path)};
-}
-
-template <class Check>
-void onEachStream(Bytes const& bytes, Check check) {
-  TemporaryFile const file(bytes, "bin");
-  auto const streams = streamsOf(bytes, file.path);
-  for (auto const& stream : streams) {
-    SCOPED_TRACE(&stream - streams.data());
-    check(*stream);
-  }
 }
 
 /// The next number; NaN when it cannot be read.
@@ -44,14 +35,13 @@ double next(QVStream& stream, bool (QVStream::*read)(Number*)) {
 }
 
 TEST(Stream, ReadsEveryTypeInBothOrders) {
-  Bytes const big =
-      Bytes("\x7e\xfe\xfe\x81\x02\x81\x02\x81\x02\x03\x04\x81\x02\x03\x04\xbf\xc0\x00\x00", 19) +
-      Bytes("\x3f\xf0\x00\x00\x00\x00\x00\x00", 8);
-  Bytes const little =
-      Bytes("\x7e\xfe\xfe\x02\x81\x02\x81\x04\x03\x02\x81\x04\x03\x02\x81\x00\x00\xc0\xbf", 19) +
-      Bytes("\x00\x00\x00\x00\x00\x00\xf0\x3f", 8);
   for (ByteOrder const order : kOrders) {
-    onEachStream(order == kMM ? big : little, [&](QVStream& stream) {
+    Bytes const bytes = "\x7e\xfe\xfe" + u16(order, 0x8102) + u16(order, 0x8102) +
+                        u32(order, 0x81020304) + u32(order, 0x81020304) + u32(order, 0xbfc00000) +
+                        number(order, 0x3ff0000000000000, 8);
+    TemporaryFile const file(bytes, "bin");
+    for (auto const& each : streamsOf(bytes, file.path)) {
+      QVStream& stream = *each;
       EXPECT_EQ(stream.hostOrder, stream.hostBytesOrder());
       EXPECT_EQ(stream.byteOrder, kMM);
       EXPECT_EQ(stream.getOffset(), 0);
@@ -70,63 +60,30 @@ TEST(Stream, ReadsEveryTypeInBothOrders) {
       stream.setOffset(3);
       stream.byteOrder = static_cast<ByteOrder>(2);  // an unknown order reverses nothing
       EXPECT_EQ(next(stream, &QVStream::readShort), order == stream.hostOrder ? 0x8102 : 0x0281);
-    });
+    }
   }
 }
 
-TEST(Stream, CountsOffsetsFromTheBaseAndDeliversWhatIsLeft) {
-  onEachStream("0123456789", [](QVStream& stream) {
-    stream.baseOffset = 4;
-    EXPECT_EQ(stream.getOffset(), -4);
-    stream.setOffset(2);
-    EXPECT_EQ(next(stream, &QVStream::readChar), '6');
-    EXPECT_EQ(stream.getOffset(), 3);
-    stream.setOffset(-3);
-    EXPECT_EQ(next(stream, &QVStream::readChar), '1');
-
-    stream.setOffset(5);
-    EXPECT_TRUE(std::isnan(next(stream, &QVStream::readShort)));
-    EXPECT_EQ(stream.getOffset(), 6);
-    EXPECT_TRUE(std::isnan(next(stream, &QVStream::readChar)));
-    stream.setOffset(4);
-    std::uint8_t bytes[8] = {};
-    EXPECT_EQ(stream.readBuffer(bytes, sizeof(bytes)), 2);
-    EXPECT_EQ(bytes[1], '9');
-  });
+template <class Number>
+Number swapped(QVStream const& stream, void (QVStream::*swap)(Number*) const, Number number) {
+  (stream.*swap)(&number);
+  return number;
 }
 
 TEST(Stream, SwapsOnlyWhatTheHostDoesNotHave) {
   QVMStream stream(nullptr, 0);
-  unsigned short number = 0x1234;
-  unsigned int longNumber = 0x12345678;
-  unsigned long long longest = 0x123456789abcdef0;
-  auto const expectSwapped = [&](bool isSwapped) {
-    EXPECT_EQ(number, isSwapped ? 0x3412 : 0x1234);
-    EXPECT_EQ(longNumber, isSwapped ? 0x78563412U : 0x12345678U);
-    EXPECT_EQ(longest, isSwapped ? 0xf0debc9a78563412U : 0x123456789abcdef0U);
-  };
-  stream.swapS(&number), stream.swapL(&longNumber), stream.swapLL(&longest);
-  expectSwapped(true);
   stream.hostOrder = kII;
-  stream.swapSLittleToHost(&number), stream.swapLLittleToHost(&longNumber);
-  stream.swapLLLitleToHost(&longest);
-  expectSwapped(true);
-  stream.swapSBigToHost(&number), stream.swapLBigToHost(&longNumber);
-  stream.swapLLBigToHost(&longest);
-  expectSwapped(false);
-}
-
-TEST(MemoryStream, EndsEverySeekOutsideAtTheEnd) {
-  unsigned char data[12] = {};
-  QVMStream stream(data, sizeof(data));
-  stream.baseOffset = 10;
-  stream.setOffset(5);
-  EXPECT_EQ(stream.offset, 12U);
-  EXPECT_EQ(stream.getOffset(), 2);
-  stream.setOffset(-11);
-  EXPECT_EQ(stream.offset, 12U);
-  stream.setOffset(-10);
-  EXPECT_EQ(stream.offset, 0U);
+  unsigned short const small = 0x1234;
+  unsigned long long const large = 0x123456789abcdef0;
+  EXPECT_EQ(swapped(stream, &QVStream::swapS, small), 0x3412);
+  EXPECT_EQ(swapped(stream, &QVStream::swapL, 0x12345678U), 0x78563412U);
+  EXPECT_EQ(swapped(stream, &QVStream::swapLL, large), 0xf0debc9a78563412U);
+  EXPECT_EQ(swapped(stream, &QVStream::swapSLittleToHost, small), small);
+  EXPECT_EQ(swapped(stream, &QVStream::swapLLittleToHost, 0x12345678U), 0x12345678U);
+  EXPECT_EQ(swapped(stream, &QVStream::swapLLLitleToHost, large), large);
+  EXPECT_EQ(swapped(stream, &QVStream::swapSBigToHost, small), 0x3412);
+  EXPECT_EQ(swapped(stream, &QVStream::swapLBigToHost, 0x12345678U), 0x78563412U);
+  EXPECT_EQ(swapped(stream, &QVStream::swapLLBigToHost, large), 0xf0debc9a78563412U);
 }
 
 TEST(FileStream, SeeksAlikeHoweverItIsRead) {
@@ -152,16 +109,14 @@ TEST(FileStream, SeeksAlikeHoweverItIsRead) {
 TEST(FileStream, IsEmptyWhenTheFileCannotBeOpened) {
   QVFStream plain("/nonexistent/photo.jpg");
   detail::PositionedFile positioned("/nonexistent/photo.jpg");
+  std::uint8_t byte = 0;
   for (QVFStream* const stream : {&plain, static_cast<QVFStream*>(&positioned)}) {
     EXPECT_EQ(stream->fd, -1);
-    std::uint8_t byte = 0;
     stream->baseOffset = 7;
     stream->setOffset(3);
     EXPECT_EQ(stream->readBuffer(&byte, 1), 0);
   }
   EXPECT_EQ(plain.getOffset(), -7);
-
-  std::uint8_t byte = 0;
   detail::PositionedFile folder(".");
   EXPECT_LE(folder.readBuffer(&byte, 1), 0);
   EXPECT_EQ(folder.getOffset(), 0);
@@ -169,9 +124,8 @@ TEST(FileStream, IsEmptyWhenTheFileCannotBeOpened) {
 
 TEST(ReadAheadStream, AnswersFromItsBlocksAndMovesByOneSeekAndOneRead) {
   Bytes bytes(100000, '\0');
-  for (std::size_t i = 0; i < bytes.size(); ++i) {
-    bytes[i] = static_cast<char>(i % 251);
-  }
+  std::generate(bytes.begin(), bytes.end(),
+                [i = 0]() mutable { return static_cast<char>(i++ % 251); });
   auto const source = std::make_shared<TestStream>(bytes);
   QVReadAheadStream stream(source, 16384, 4096);
   auto const expectAt = [&](long offset, int reads, int seeks) {
@@ -189,78 +143,47 @@ TEST(ReadAheadStream, AnswersFromItsBlocksAndMovesByOneSeekAndOneRead) {
   expectAt(10, 3, 2);  // the first block is kept
   expectAt(20000, 4, 3);
   expectAt(50000, 5, 4);
-
-  Bytes whole(bytes.size(), '\1');
-  stream.setOffset(0);
-  EXPECT_EQ(stream.readBuffer(dataOf(whole), whole.size()),
-            static_cast<std::int64_t>(bytes.size()));
-  EXPECT_EQ(whole, bytes);
   stream.setOffset(16382);  // across the two blocks
   EXPECT_EQ(next(stream, &QVStream::readLong), 0x43444546U);
 }
 
-TEST(ReadAheadStream, DeliversTheSourcesBytesWhateverTheBlocks) {
-  constexpr long kFar = sizeof(long) == 8 ? static_cast<long>(0xfffffff0) : 0x7fffff00;
-  constexpr std::size_t kSizes[] = {0, 1, 3, 64, 1000};
-  std::mt19937 random;
-  Bytes bytes(300, '\0');
-  std::generate(bytes.begin(), bytes.end(), [&] { return static_cast<char>(random()); });
-  for (std::size_t i = 0; i < 25 * 100; ++i) {
-    QVReadAheadStream stream(std::make_shared<TestStream>(bytes), kSizes[i % 5], kSizes[i / 5 % 5]);
-    for (int step = 0; step < 6; ++step) {
-      bool const isFar = random() % 6 == 0;  // memory stops at its end and refuses nothing
-      auto const offset = isFar ? kFar : static_cast<long>(random() % 310);
-      auto const start = std::min(static_cast<std::size_t>(offset), bytes.size());
-      Bytes read(random() % 20, '\0');
-      Bytes const expected = bytes.substr(start, read.size());
-      stream.setOffset(offset);
-      read.resize(static_cast<std::size_t>(stream.readBuffer(dataOf(read), read.size())));
-      ASSERT_EQ(read, expected);
-      ASSERT_EQ(stream.getOffset(), offset + static_cast<long>(read.size()));
-    }
-  }
-}
-
-TEST(ReadAheadStream, ReadsWhatIsWholeAndStaysWhereTheSourceRefusesToGo) {
-  auto const source = std::make_shared<TestStream>(Bytes(20000, 'x'));
-  source->onRead = [&](auto* destination, std::size_t count) {
-    return source->offset + count > 9000 ? -1 : source->deliver(destination, count);
+TEST(ReadAheadStream, TakesWhatIsWholeFromASourceThatMisbehaves) {
+  auto const source = std::make_shared<TestStream>("\x12\x34\x56\x78\x9a\xbc" + Bytes(20000, 'x'));
+  QVReadAheadStream stream(source, 2, 4096);
+  auto const at = [&](long offset) {
+    stream.setOffset(offset);
+    return next(stream, &QVStream::readShort);
   };
-  QVReadAheadStream stream(source, 16384, 4096);
-  stream.setOffset(100);
-  source->onSeek = [&](long target) { return source->baseOffset + target <= 0x7fffffff; };
-  stream.baseOffset = 0x70000000;
-  stream.setOffset(0x10000000);
-  stream.baseOffset = 0;
-  EXPECT_EQ(stream.getOffset(), 100);
-  EXPECT_EQ(next(stream, &QVStream::readLong), 0x78787878U);
-  stream.setOffset(8998);
-  EXPECT_TRUE(std::isnan(next(stream, &QVStream::readLong)));
-  EXPECT_EQ(stream.getOffset(), 8998);
-}
-
-TEST(ReadAheadStream, TakesNothingFromASourceThatOverstatesOrThrows) {
-  auto const source = std::make_shared<TestStream>("\x12\x34\x56\x78\x9a\xbc");
   source->mostAtOnce = 1;
-  QVReadAheadStream stream(source, 2, 2);
   EXPECT_EQ(next(stream, &QVStream::readLong), 0x12345678U);
   source->mostAtOnce = SIZE_MAX;
   source->onRead = [&](auto* destination, std::size_t count) {
     return source->deliver(destination, count) + 1;
   };
-  EXPECT_TRUE(std::isnan(next(stream, &QVStream::readShort)));
+  EXPECT_TRUE(std::isnan(at(4)));
+  // What lies beyond the bytes that are wanted cannot be read.
+  source->onRead = [&](auto* destination, std::size_t count) {
+    return source->offset + count > 999 ? -1 : source->deliver(destination, count);
+  };
+  EXPECT_EQ(at(4), 0x9abc);
+  EXPECT_TRUE(std::isnan(at(998)));
+  EXPECT_EQ(stream.getOffset(), 998);
+  source->onSeek = [&](long target) { return source->baseOffset + target <= 0x7fffffff; };
+  stream.baseOffset = 0x70000000;
+  stream.setOffset(0x10000000);
+  stream.baseOffset = 0;
+  EXPECT_EQ(stream.getOffset(), 998);  // it stays where the source refuses to go
+
   source->onRead = nullptr;
-  EXPECT_EQ(next(stream, &QVStream::readShort), 0x9abc);
+  EXPECT_EQ(at(3), 0x789a);
   source->onRead = [](auto* destination, std::size_t) -> std::int64_t {
     destination[0] = 0xff;
     throw std::runtime_error("the connection is lost");
   };
-  stream.setOffset(3);
-  EXPECT_THROW(next(stream, &QVStream::readShort), std::runtime_error);
-  EXPECT_EQ(stream.getOffset(), 3);
+  EXPECT_THROW(at(5000), std::runtime_error);
+  EXPECT_EQ(stream.getOffset(), 5000);
   source->onRead = nullptr;
-  stream.setOffset(5);  // was in the block that the throwing read has overwritten
-  EXPECT_EQ(next(stream, &QVStream::readByte), 0xbc);
+  EXPECT_EQ(at(3), 0x789a);  // was in the block that the throwing read has overwritten
 }
 
 }  // namespace

@@ -5,7 +5,6 @@
 #include <cstdint>
 #include <functional>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include "quavel/QVStream.h"
@@ -16,18 +15,19 @@ namespace quavel::test {
 
 using Bytes = std::string;
 
+constexpr ByteOrder kII = ByteOrder::LittleEndian;
+constexpr ByteOrder kMM = ByteOrder::BigEndian;
+constexpr ByteOrder kOrders[] = {kII, kMM};
+
 /// The number's low `size` bytes.
 inline Bytes number(ByteOrder order, std::uint64_t value, int size) {
   Bytes bytes;
   for (int i = 0; i < size; ++i) {
-    bytes.push_back(static_cast<char>(value >> (8 * i) & 0xffU));
-  }
-  if (order == ByteOrder::BigEndian) {
-    std::reverse(bytes.begin(), bytes.end());
+    int const place = order == kII ? i : size - 1 - i;
+    bytes.push_back(static_cast<char>(value >> (8 * place) & 0xffU));
   }
   return bytes;
 }
-
 inline Bytes u16(ByteOrder order, std::uint64_t value) { return number(order, value, 2); }
 inline Bytes u32(ByteOrder order, std::uint64_t value) { return number(order, value, 4); }
 
@@ -39,8 +39,8 @@ enum Type : std::uint16_t { kByte = 1, kAscii, kShort, kLong, kRational, kSByte,
 struct Directory;
 
 /// A directory entry. What is written is `count` and then `numbers`, each `numberSize` bytes wide
-/// (a rational is two of them), out of line when they exceed 4 bytes; or one pointer for each of
-/// `subdirectories`; or `rawField` as it stands, where an entry is to lie about its values.
+/// (a rational is two of them), or a pointer to each of `subdirectories`; out of line when they
+/// exceed 4 bytes.
 struct Field {
   std::uint16_t tag = 0;
   std::uint16_t type = 0;
@@ -48,7 +48,9 @@ struct Field {
   int numberSize = 1;
   std::vector<std::int64_t> numbers = {};
   std::vector<Directory> subdirectories = {};
-  std::int64_t rawField = -1;
+
+  /// As an edit, it replaces the field of its tag, or adds itself.
+  void operator()(Directory& directory) const;
 };
 
 struct Directory {
@@ -57,25 +59,25 @@ struct Directory {
 
   /// The field of the tag, which is added unless it is there.
   Field& operator[](std::uint16_t tag) {
-    for (Field& field : fields) {
-      if (field.tag == tag) {
-        return field;
-      }
-    }
-    return fields.emplace_back(Field{tag});
+    auto const found = std::find_if(fields.begin(), fields.end(),
+                                    [tag](Field const& field) { return field.tag == tag; });
+    return found == fields.end() ? fields.emplace_back(Field{tag}) : *found;
   }
 };
 
-inline Field values(std::uint16_t tag, std::uint16_t type, int size,
-                    std::vector<std::int64_t> numbers) {
-  auto const count = static_cast<std::uint32_t>(numbers.size());
-  return {tag, type, count, size, std::move(numbers)};
+inline void Field::operator()(Directory& directory) const { directory[tag] = *this; }
+
+template <class... Numbers>
+Field values(std::uint16_t tag, std::uint16_t type, int size, Numbers... numbers) {
+  return {tag, type, sizeof...(numbers), size, {static_cast<std::int64_t>(numbers)...}};
 }
-inline Field shorts(std::uint16_t tag, std::vector<std::int64_t> numbers) {
-  return values(tag, kShort, 2, std::move(numbers));
+template <class... Numbers>
+Field shorts(std::uint16_t tag, Numbers... numbers) {
+  return values(tag, kShort, 2, numbers...);
 }
-inline Field longs(std::uint16_t tag, std::vector<std::int64_t> numbers) {
-  return values(tag, kLong, 4, std::move(numbers));
+template <class... Numbers>
+Field longs(std::uint16_t tag, Numbers... numbers) {
+  return values(tag, kLong, 4, numbers...);
 }
 inline Field ratio(std::uint16_t tag, std::int64_t numerator, std::int64_t denominator,
                    std::uint16_t type = kRational) {
@@ -83,25 +85,20 @@ inline Field ratio(std::uint16_t tag, std::int64_t numerator, std::int64_t denom
 }
 /// Characters as they stand, or with the NUL that ends a well-made text.
 inline Field characters(std::uint16_t tag, Bytes const& text, std::uint16_t type = kAscii) {
-  return values(tag, type, 1, std::vector<std::int64_t>(text.begin(), text.end()));
+  return {tag, type, static_cast<std::uint32_t>(text.size()), 1, {text.begin(), text.end()}};
 }
 inline Field ascii(std::uint16_t tag, Bytes const& text) { return characters(tag, text + '\0'); }
-inline Field pointer(std::uint16_t tag, std::vector<Directory> subdirectories) {
-  auto const count = static_cast<std::uint32_t>(subdirectories.size());
-  return {tag, kLong, count, 4, {}, std::move(subdirectories)};
+inline Field pointer(std::uint16_t tag, std::vector<Directory> const& subdirectories) {
+  return {tag, kLong, static_cast<std::uint32_t>(subdirectories.size()), 4, {}, subdirectories};
 }
 /// An entry that claims any type and count, whatever its field holds.
 inline Field claim(std::uint16_t tag, std::uint16_t type, std::uint32_t count,
                    std::uint32_t valueField) {
-  return {tag, type, count, 4, {}, {}, valueField};
+  return {tag, type, count, 4, {valueField}};
 }
 
 using Edit = std::function<void(Directory&)>;
 
-/// Replaces the field of the same tag, or adds the field.
-inline Edit put(Field const& field) {
-  return [field](Directory& directory) { directory[field.tag] = field; };
-}
 inline Edit drop(std::uint16_t tag) {
   return [tag](Directory& directory) {
     auto& all = directory.fields;
@@ -116,7 +113,7 @@ inline Edit in(std::uint16_t tag, Edit const& edit, std::size_t index = 0) {
 inline Edit both(Edit const& one, Edit const& other) {
   return [=](Directory& directory) { one(directory), other(directory); };
 }
-inline void noEdit(Directory& /*directory*/) {}
+inline void clear(Directory& directory) { directory = {}; }
 
 /// The directory as it stands `start` bytes after the TIFF header's first byte, followed by its
 /// values and sub-directories.
@@ -133,24 +130,20 @@ inline Bytes directoryAt(ByteOrder order, std::size_t start, Directory const& di
       data += u32(order, end + rest.size());
       rest += directoryAt(order, end + rest.size(), subdirectory);
     }
-    if (field.rawField >= 0) {
-      data = u32(order, static_cast<std::uint64_t>(field.rawField));
-    }
     entries += u16(order, field.tag) + u16(order, field.type) + u32(order, field.count);
-    if (data.size() <= 4) {
-      entries += data + Bytes(4 - data.size(), '\0');
-    } else {
-      entries += u32(order, end + rest.size());
+    if (data.size() > 4) {
       rest += data;
+      data = u32(order, end + rest.size() - data.size());
     }
+    entries += data + Bytes(4 - data.size(), '\0');
   }
   return entries + u32(order, directory.next) + rest;
 }
 
 /// A whole TIFF structure.
 inline Bytes tiff(ByteOrder order, Directory const& first) {
-  Bytes const mark = order == ByteOrder::LittleEndian ? "II" : "MM";
-  return mark + u16(order, 42) + u32(order, 8) + directoryAt(order, 8, first);
+  return (order == kII ? "II" : "MM") + u16(order, 42) + u32(order, 8) +
+         directoryAt(order, 8, first);
 }
 
 }  // namespace quavel::test

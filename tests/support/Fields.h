@@ -1,13 +1,16 @@
 #ifndef QUAVEL_TESTS_FIELDS_H
 #define QUAVEL_TESTS_FIELDS_H
 
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
+#include <set>
 #include <string>
 
 #include "quavel/quavel.h"
 
-// Includes nothing but the library: the fuzz targets use it too.
+// The fields of a record, and what a journal must say of them. Includes nothing but the library:
+// the fuzz targets use it too.
 namespace quavel::test {
 
 /// Calls `take` with the name and the value of each field of the record, in their order.
@@ -42,6 +45,44 @@ inline bool isAbsent(bool /*flag*/) { return false; }
 inline bool isAbsent(std::int32_t number) { return number == -1; }
 inline bool isAbsent(float number) { return std::isnan(number); }
 inline bool isAbsent(std::string const& text) { return text.empty(); }
+
+inline std::multiset<std::string> absentFields(QVMetadata const& record) {
+  std::multiset<std::string> absent;
+  eachField(record, [&](char const* name, auto const& value) {
+    if (isAbsent(value)) {
+      absent.insert(name);
+    }
+  });
+  return absent;
+}
+
+inline bool isPrintable(std::string const& text) {
+  return !text.empty() && text.size() <= 500 &&
+         std::all_of(text.begin(), text.end(), [](char c) { return c >= ' ' && c <= '~'; });
+}
+
+/// The invariant that a journal's notes break after a read from memory that gave the record, or
+/// null; empty when they break none. A failure leaves one refusal or limit and a success none;
+/// after a success, each absent field has one absence, and no other field has; texts are short and
+/// printable.
+inline std::string brokenInvariant(QVJournal const& journal, QVMetadata const* record) {
+  std::multiset<std::string> absences;
+  int refusals = 0;
+  for (QVNote const& note : journal.notes()) {
+    refusals += note.kind == QVNoteKind::Refusal || note.kind == QVNoteKind::Limit ? 1 : 0;
+    if (note.kind == QVNoteKind::Absence) {
+      absences.insert(note.field);
+    }
+    if (!isPrintable(note.text) || QVJournal::reasonName(note.reason)[0] == '\0') {
+      return "a text: " + note.text;
+    }
+  }
+  if (refusals != (record == nullptr ? 1 : 0)) {
+    return "refusals";
+  }
+  bool const areRight = record == nullptr ? absences.empty() : absences == absentFields(*record);
+  return areRight && journal.notes().size() <= 48 ? "" : "absences";
+}
 
 }  // namespace quavel::test
 

@@ -9,70 +9,97 @@
 
 namespace quavel::test {
 
+namespace {
+
+std::string const kOriginal = "2021:05:01 10:00:00";
+Field const kDigitized = ascii(kDateTimeDigitized, "2021:05:01 10:00:01");
+Field const kFileDate = ascii(kDateTime, "2022:06:02 11:00:00");
+
 Directory plainTiff() {
-  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
-                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
+  Directory const exif = {{ascii(kDateTimeOriginal, kOriginal), kDigitized,
                            characters(kMakerNote, "not a directory", kUndefined)}};
-  return {{longs(kWidth, {6000}), longs(kLength, {4000}), ascii(kModel, "Camera"),
-           shorts(kOrientation, {6}), ascii(kDateTime, "2022:06:02 11:00:00"),
-           pointer(kExif, {exif})}};
+  return {{longs(kWidth, 6000), longs(kLength, 4000), ascii(kModel, "Camera"),
+           shorts(kOrientation, 6), kFileDate, pointer(kExif, {exif})}};
 }
 
+/// Its full image is in the second SubIFD.
 Directory reducedTiff() {
-  Directory const preview = {
-      {longs(kNewSubfileType, {1}), longs(kWidth, {1024}), longs(kLength, {683})}};
-  Directory const full = {{longs(kNewSubfileType, {0}), longs(kWidth, {6000}),
-                           longs(kLength, {4000}), shorts(kOrientation, {3})}};
+  Directory const preview = {{longs(kNewSubfileType, 1), longs(kWidth, 1024), longs(kLength, 683)}};
+  Directory const full = {{longs(kNewSubfileType, 0), longs(kWidth, 6000), longs(kLength, 4000),
+                           shorts(kOrientation, 3)}};
   Directory file = plainTiff();
-  for (Field const& field : {longs(kNewSubfileType, {1}), longs(kWidth, {256}),
-                             longs(kLength, {171}), pointer(kSubIFDs, {preview, full, preview})}) {
-    file[field.tag] = field;
+  for (Field const& field : {longs(kNewSubfileType, 1), longs(kWidth, 256), longs(kLength, 171),
+                             pointer(kSubIFDs, {preview, full, preview})}) {
+    field(file);
   }
   return file;
 }
 
 Directory nef() {
-  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
-                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
-                           ascii(kOffsetTimeOriginal, "+02:00")}};
-  Directory const preview = {{longs(kNewSubfileType, {1}), longs(kWidth, {570})}};
-  Directory const raw = {
-      {longs(kNewSubfileType, {0}), longs(kWidth, {6032}), longs(kLength, {4032})}};
-  return {{longs(kNewSubfileType, {1}), longs(kWidth, {160}), longs(kLength, {120}),
-           shorts(kOrientation, {8}), ascii(kDateTime, "2022:06:02 11:00:00"),
-           pointer(kSubIFDs, {preview, raw, preview}), pointer(kExif, {exif})}};
+  Directory const exif = {
+      {ascii(kDateTimeOriginal, kOriginal), kDigitized, ascii(kOffsetTimeOriginal, "+02:00")}};
+  Directory const preview = {{longs(kNewSubfileType, 1), longs(kWidth, 570)}};
+  Directory const raw = {{longs(kNewSubfileType, 0), longs(kWidth, 6032), longs(kLength, 4032)}};
+  return {{longs(kNewSubfileType, 1), longs(kWidth, 160), longs(kLength, 120),
+           shorts(kOrientation, 8), kFileDate, pointer(kSubIFDs, {preview, raw, preview}),
+           pointer(kExif, {exif})}};
 }
 
 Directory arw() {
   Directory file = nef();
-  file[kWidth] = longs(kWidth, {1616});
-  file[kSubIFDs] = pointer(kSubIFDs, {file[kSubIFDs].subdirectories[1]});
+  longs(kWidth, 1616)(file);
+  pointer(kSubIFDs, {file[kSubIFDs].subdirectories[1]})(file);
   return file;
 }
 
 Directory jpegExif() {
-  Directory const exif = {{ascii(kDateTimeOriginal, "2021:05:01 10:00:00"),
-                           ascii(kDateTimeDigitized, "2021:05:01 10:00:01"),
-                           shorts(kPixelX, {3000}), shorts(kPixelY, {4000})}};
-  return {
-      {shorts(kOrientation, {6}), ascii(kDateTime, "2022:06:02 11:00:00"), pointer(kExif, {exif})}};
-}
-
-Directory rafRawSection() {
-  Directory const vendor = {{longs(kRafWidth, {6160}), longs(kRafLength, {4032})}};
-  return {{pointer(kRafPointer, {vendor})}};
+  Directory const exif = {{ascii(kDateTimeOriginal, kOriginal), kDigitized, shorts(kPixelX, 3000),
+                           shorts(kPixelY, 4000)}};
+  return {{shorts(kOrientation, 6), kFileDate, pointer(kExif, {exif})}};
 }
 
 Directory cmt1() {
-  return {{shorts(kWidth, {6000}), shorts(kLength, {4000}), ascii(kModel, "Camera R"),
-           shorts(kOrientation, {6}), ascii(kDateTime, "2021:05:01 10:00:00")}};
+  return {{shorts(kWidth, 6000), shorts(kLength, 4000), ascii(kModel, "Camera R"),
+           shorts(kOrientation, 6), ascii(kDateTime, kOriginal)}};
+}
+
+Bytes rafAround(ByteOrder order, Directory const& image) {
+  return rafFile(jpegFile(order, image), tiff(order, rafRawSection()));
+}
+
+Bytes cr3Around(ByteOrder order, Directory const& main) {
+  return cr3File(box("mvhd", Bytes(100, '\0')) +
+                 uuidBox(box("free", "filler") + box("CMT1", tiff(order, main)) +
+                         box("CMT2", tiff(order, cmt2())) + box("CMT3", tiff(order, main))) +
+                 box("trak", Bytes(40, '\0')));
+}
+
+std::string const kDate = "dateTimeOriginal=" + kOriginal;
+std::string const kDates =
+    kDate + ", dateTimeDigitized=2021:05:01 10:00:01, dateTime=2022:06:02 11:00:00";
+std::string const kTiff = "width=6000, height=4000, orientation=6, " + kDates;
+std::string const kRawTiff = "width=6000, height=4000, orientation=6, isRaw, " + kDates;
+std::string const kNef = "width=6032, height=4032, orientation=8, isRaw, " + kDate;
+std::string const kJpeg = "width=3000, height=4000, orientation=6, " + kDate;
+std::string const kRaf = "width=6160, height=4032, orientation=6, isRaw, " + kDate;
+std::string const kCr3 =
+    "width=6000, height=4000, orientation=6, isRaw, dateTime=2021:05:01 10:00:00, "
+    "hasShootingInfo, model=Camera R, lensModel=Lens 35mm F1.8, iso=400, apexFNumber=4, "
+    "apexExposureTime=0.0078125, apertureValue=4, shutterSpeedValue=7, focalLength=35, "
+    "whiteBalance=0, meteringMode=5, exposureBiasValue=-0.5, focalLengthIn35mmFilm=56, "
+    "exposureTime=0.00499999989, fNumber=5.5999999";
+
+}  // namespace
+
+Directory rafRawSection() {
+  return {{pointer(kRafPointer, {{{longs(kRafWidth, 6160), longs(kRafLength, 4032)}}})}};
 }
 
 Directory cmt2() {
-  return {{ratio(kExposureTime, 1, 200), ratio(kFNumber, 56, 10), shorts(kIso, {400}),
+  return {{ratio(kExposureTime, 1, 200), ratio(kFNumber, 56, 10), shorts(kIso, 400),
            ratio(kShutterSpeed, 7, 1, kSRational), ratio(kAperture, 4, 1),
-           ratio(kExposureBias, -1, 2, kSRational), shorts(kMeteringMode, {5}),
-           ratio(kFocalLength, 35, 1), shorts(kWhiteBalance, {0}), shorts(kFocal35, {56}),
+           ratio(kExposureBias, -1, 2, kSRational), shorts(kMeteringMode, 5),
+           ratio(kFocalLength, 35, 1), shorts(kWhiteBalance, 0), shorts(kFocal35, 56),
            ascii(kLensModel, "Lens 35mm F1.8")}};
 }
 
@@ -81,24 +108,23 @@ Bytes sof0(unsigned width, unsigned height) {
                              Bytes("\x03\x01\x22\x00\x02\x11\x01\x03\x11\x01", 10));
 }
 
-Bytes exifSegment(Bytes const& tiffStructure) {
-  return segment(0xffe1, Bytes("Exif\0\0", 6) + tiffStructure);
+Bytes jpegFile(ByteOrder order, Directory const& image) {
+  return "\xff\xd8" + exifSegment(tiff(order, image)) + segment(0xffdb, Bytes(65, '\x10')) +
+         sof0() + segment(0xffda, Bytes(10, '\x01')) + "scan\xff\xd9";
 }
 
-Bytes jpegFile(Bytes const& tiffStructure) {
-  return "\xff\xd8" + exifSegment(tiffStructure) + segment(0xffdb, Bytes(65, '\x10')) + sof0() +
-         segment(0xffda, Bytes(10, '\x01')) + "scan\xff\xd9";
+Bytes rafHeader(std::size_t imageOffset, std::size_t rawSectionOffset) {
+  Bytes header = "FUJIFILMCCD-RAW 0201";
+  header.resize(84);
+  header += u32(kMM, imageOffset);
+  header.resize(100);
+  header += u32(kMM, rawSectionOffset);
+  header.resize(148);
+  return header;
 }
 
 Bytes rafFile(Bytes const& image, Bytes const& rawSection) {
-  constexpr std::size_t kHeaderSize = 148;
-  Bytes header = "FUJIFILMCCD-RAW 0201";
-  header.resize(84);
-  header += u32(kMM, kHeaderSize);
-  header.resize(100);
-  header += u32(kMM, kHeaderSize + image.size());
-  header.resize(kHeaderSize);
-  return header + image + rawSection;
+  return rafHeader(148, 148 + image.size()) + image + rawSection;
 }
 
 Bytes uuidBox(Bytes const& children, Bytes const& identifier) {
@@ -110,60 +136,27 @@ Bytes cr3File(Bytes const& moovChildren) {
   return box("ftyp", "crx isom") + box("moov", moovChildren) + box("mdat", Bytes(64, '\x7f'));
 }
 
-namespace {
-
-Bytes plainTiffBytes(ByteOrder order) { return tiff(order, plainTiff()); }
-Bytes reducedTiffBytes(ByteOrder order) { return tiff(order, reducedTiff()); }
-Bytes nefBytes(ByteOrder order) { return tiff(order, nef()); }
-Bytes arwBytes(ByteOrder order) { return tiff(order, arw()); }
-Bytes jpegBytes(ByteOrder order) { return jpegFile(tiff(order, jpegExif())); }
-Bytes rafBytes(ByteOrder order) {
-  return rafFile(jpegFile(tiff(order, jpegExif())), tiff(order, rafRawSection()));
-}
-Bytes cr3Bytes(ByteOrder order) {
-  return cr3File(box("mvhd", Bytes(100, '\0')) +
-                 uuidBox(box("free", "filler") + box("CMT1", tiff(order, cmt1())) +
-                         box("CMT2", tiff(order, cmt2())) + box("CMT3", tiff(order, cmt1()))) +
-                 box("trak", Bytes(40, '\0')));
-}
-
-std::string const kPlainTiff =
-    "width=6000 height=4000 orientation=6 dateTimeOriginal=2021:05:01 10:00:00 "
-    "dateTimeDigitized=2021:05:01 10:00:01 dateTime=2022:06:02 11:00:00";
-std::string const kRawTiff =
-    "width=6000 height=4000 orientation=6 isRaw dateTimeOriginal=2021:05:01 10:00:00 "
-    "dateTimeDigitized=2021:05:01 10:00:01 dateTime=2022:06:02 11:00:00";
-std::string const kNef =
-    "width=6032 height=4032 orientation=8 isRaw dateTimeOriginal=2021:05:01 10:00:00";
-std::string const kJpeg =
-    "width=3000 height=4000 orientation=6 dateTimeOriginal=2021:05:01 10:00:00";
-std::string const kRaf =
-    "width=6160 height=4032 orientation=6 isRaw dateTimeOriginal=2021:05:01 10:00:00";
-std::string const kCr3 =
-    "width=6000 height=4000 orientation=6 isRaw dateTime=2021:05:01 10:00:00 hasShootingInfo "
-    "model=Camera R lensModel=Lens 35mm F1.8 iso=400 apexFNumber=4 apexExposureTime=0.0078125 "
-    "apertureValue=4 shutterSpeedValue=7 focalLength=35 whiteBalance=0 meteringMode=5 "
-    "exposureBiasValue=-0.5 focalLengthIn35mmFilm=56 exposureTime=0.00499999989 "
-    "fNumber=5.5999999";
-
-}  // namespace
-
 std::vector<Fixture> const& fixtures() {
   static std::vector<Fixture> const all = {
-      {"plain", "tif", plainTiffBytes, kPlainTiff},
-      {"scan", "tiff", reducedTiffBytes, kPlainTiff},
-      {"negative", "dng", reducedTiffBytes, kRawTiff},
-      {"canyon", "cr2", plainTiffBytes, kRawTiff},
-      {"pocket", "nrw", reducedTiffBytes, kRawTiff},
-      {"studio", "3fr", reducedTiffBytes, kRawTiff},
-      {"night", "nef", nefBytes, kNef},
-      {"alley", "arw", arwBytes, kNef},
-      {"field", "raf", rafBytes, kRaf},
-      {"portrait", "jpg", jpegBytes, kJpeg},
-      {"postcard", "jpeg", jpegBytes, kJpeg},
-      {"river", "cr3", cr3Bytes, kCr3},
+      {"plain", "tif", plainTiff, tiff, kTiff},
+      {"scan", "tiff", reducedTiff, tiff, kTiff},
+      {"negative", "dng", reducedTiff, tiff, kRawTiff},
+      {"canyon", "cr2", plainTiff, tiff, kRawTiff},
+      {"pocket", "nrw", reducedTiff, tiff, kRawTiff},
+      {"studio", "3fr", reducedTiff, tiff, kRawTiff},
+      {"night", "nef", nef, tiff, kNef},
+      {"alley", "arw", arw, tiff, kNef},
+      {"field", "raf", jpegExif, rafAround, kRaf},
+      {"portrait", "jpg", jpegExif, jpegFile, kJpeg},
+      {"postcard", "jpeg", jpegExif, jpegFile, kJpeg},
+      {"river", "cr3", cmt1, cr3Around, kCr3},
   };
   return all;
+}
+
+Fixture const& fixtureOf(std::string const& extension) {
+  return *std::find_if(fixtures().begin(), fixtures().end(),
+                       [&](Fixture const& fixture) { return fixture.extension == extension; });
 }
 
 std::string describe(QVMetadata const& record) {
@@ -171,16 +164,12 @@ std::string describe(QVMetadata const& record) {
   out.precision(9);
   eachField(record, [&](char const* name, auto const& value) {
     if constexpr (std::is_same_v<decltype(value), bool const&>) {
-      out << (value ? name + std::string(" ") : "");
+      out << (value ? name + std::string(", ") : "");
     } else if (!isAbsent(value)) {
-      out << name << '=' << value << ' ';
+      out << name << '=' << value << ", ";
     }
   });
-  std::string text = out.str();
-  if (!text.empty()) {
-    text.pop_back();
-  }
-  return text;
+  return out.str().substr(0, std::max<std::size_t>(out.str().size(), 2) - 2);
 }
 
 std::string describe(std::shared_ptr<QVMetadata> const& record) {

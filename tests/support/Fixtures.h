@@ -2,8 +2,6 @@
 #define QUAVEL_TESTS_FIXTURES_H
 
 #include <memory>
-#include <string>
-#include <vector>
 
 #include "quavel/quavel.h"
 #include "support/ByteBuilder.h"
@@ -24,54 +22,49 @@ enum Tag : std::uint16_t {
 };
 // clang-format on
 
-constexpr ByteOrder kII = ByteOrder::LittleEndian;
-constexpr ByteOrder kMM = ByteOrder::BigEndian;
-constexpr ByteOrder kOrders[] = {kII, kMM};
-
-// The directories of one well-made file each, to be edited and laid out.
-Directory plainTiff();
-Directory reducedTiff();  // its full image is in the second SubIFD
-Directory nef();
-Directory arw();
-Directory jpegExif();
-Directory rafRawSection();
-Directory cmt1();
-Directory cmt2();
-
-constexpr unsigned kFrameWidth = 4000;
-constexpr unsigned kFrameHeight = 3000;
-
 /// A JPEG segment: marker, length, payload.
 inline Bytes segment(std::uint16_t marker, Bytes const& payload) {
   return u16(kMM, marker) + u16(kMM, payload.size() + 2) + payload;
 }
+inline Bytes exifSegment(Bytes const& tiffStructure) {
+  return segment(0xffe1, Bytes("Exif\0\0", 6) + tiffStructure);
+}
+Bytes sof0(unsigned width = 4000, unsigned height = 3000);
+/// SOI, the Exif segment and the frame header, followed by the start of a scan.
+Bytes jpegFile(ByteOrder order, Directory const& image);
 
 /// An ISO base media box: size, type, payload.
 inline Bytes box(Bytes const& type, Bytes const& payload) {
   return u32(kMM, payload.size() + 8) + type + payload;
 }
-
-Bytes sof0(unsigned width = kFrameWidth, unsigned height = kFrameHeight);
-Bytes exifSegment(Bytes const& tiffStructure);
-/// SOI, the Exif segment and the frame header, followed by the start of a scan.
-Bytes jpegFile(Bytes const& tiffStructure);
-/// `image` is the embedded JPEG, `rawSection` a TIFF structure.
-Bytes rafFile(Bytes const& image, Bytes const& rawSection);
 /// The metadata `uuid` box, or one of another identifier, around its children.
 Bytes uuidBox(Bytes const& children, Bytes const& identifier = "");
 /// `ftyp`, a `moov` around its children, `mdat`.
 Bytes cr3File(Bytes const& moovChildren);
 
-/// One well-made file of each extension, in either byte order, and the record it must give.
+/// 148 bytes with the offsets of the embedded JPEG and of the TIFF structure that follows it.
+Bytes rafHeader(std::size_t imageOffset, std::size_t rawSectionOffset);
+Bytes rafFile(Bytes const& image, Bytes const& rawSection);
+
+// Directories of well-made files beside those of the fixtures.
+Directory rafRawSection();
+Directory cmt2();
+
+/// A well-made file of each extension: a directory, which tests edit, what is laid out around it in
+/// either byte order, and the record that the file must give.
 struct Fixture {
   std::string name;
   std::string extension;
-  Bytes (*bytes)(ByteOrder order);
+  Directory (*directory)();
+  Bytes (*layOut)(ByteOrder order, Directory const& directory);
   std::string expected;
+
+  Bytes bytes(ByteOrder order) const { return layOut(order, directory()); }
 };
 std::vector<Fixture> const& fixtures();
+Fixture const& fixtureOf(std::string const& extension);
 
-/// The fields that are there, in their order: "width=160 isRaw"; "none" without a record.
+/// The fields that are there, in their order: "width=160, isRaw"; "none" without a record.
 std::string describe(QVMetadata const& record);
 std::string describe(std::shared_ptr<QVMetadata> const& record);
 
@@ -86,6 +79,46 @@ std::string readBuffer(Bytes bytes, std::string const& extension);
 /// The record that the stream gives, described; if it is refused, after "! " what was stored
 /// before.
 std::string readStream(std::shared_ptr<QVStream> stream, std::string const& extension);
+
+struct OwnBytes {
+  Bytes bytes;
+};
+
+/// A stream over bytes of its own that counts the calls and can be told to misbehave.
+struct TestStream : OwnBytes, QVMStream {
+  explicit TestStream(Bytes const& content, ByteOrder order = kMM)
+      : OwnBytes{content}, QVMStream(dataOf(bytes), sizeOf(bytes)) {
+    byteOrder = order;
+  }
+
+  std::int64_t readBuffer(std::uint8_t* destination, std::size_t count) override {
+    ++reads;
+    return onRead ? onRead(destination, count) : deliver(destination, count);
+  }
+  void setOffset(long const& target) override {
+    ++seeks;
+    if (!onSeek || onSeek(target)) {
+      QVMStream::setOffset(target);
+    }
+  }
+  std::int64_t deliver(std::uint8_t* destination, std::size_t count) {
+    return QVMStream::readBuffer(destination, std::min(count, mostAtOnce));
+  }
+
+  std::function<std::int64_t(std::uint8_t*, std::size_t)> onRead;  ///< Instead of `deliver`.
+  std::function<bool(long)> onSeek;                                ///< False: the seek is refused.
+  std::size_t mostAtOnce = SIZE_MAX;
+  int reads = 0;
+  int seeks = 0;
+};
+
+/// The same for the readers, which take the stream as a base.
+inline std::shared_ptr<QVStream> streamOf(Bytes const& bytes, ByteOrder order = kMM,
+                                          long position = 0) {
+  auto stream = std::make_shared<TestStream>(bytes, order);
+  stream->setOffset(position);
+  return stream;
+}
 
 /// A file of its own in the temporary folder, removed at the end of its life.
 class TemporaryFile {
