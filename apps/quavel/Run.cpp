@@ -45,9 +45,9 @@ class Runner {
   std::unique_ptr<Writer> writer_;
   Detail detail_;
   Progress progress_;
-  Pipeline pipeline_;  // destroyed first: its threads use the members above
+  Pipeline pipeline_;  // destroyed before the members above, which its threads use
   std::size_t batchSize_ = 1;
-  bool isErrorHintDue_;  // the CSV has no error column, and no message has said so yet
+  bool isErrorHintDue_;  // the chosen columns of CSV lack error, and no message has said so yet
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -125,6 +125,7 @@ void Runner::work(Batch& batch) const {
 
 void Runner::prepare(Outcome& outcome) const {
   Form const& form = options_.form;
+  // Programs get the dates as they are in the file, unless they ask for ISO 8601.
   if (outcome.record && (form.hasIsoDates || !form.isForMachines())) {
     tidyDates(*outcome.record, form.hasIsoDates);
   }
@@ -156,8 +157,8 @@ void Runner::emitOldest() {
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
   progress_.count(!outcome.problem, outcome.isShown);
-  // An explanation states the problem itself. A row or an object for programs does so too, but
-  // replaces the message only with --quiet.
+  // With --why, the output for people states the problem already. Output for programs replaces the
+  // message only with --quiet.
   bool const isOutputEnough =
       outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
   if (outcome.problem && !isOutputEnough) {

@@ -18,8 +18,9 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
       findEntry(exifIFD, tag::ImageLength) || findEntry(exifIFD, tag::PixelYDimension);
   noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
              hasWidth && hasHeight
-                 ? "{} declares {} x {}; only more than 500 a side counts, and less than 2^31"
+                 ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
                  : "{} does not give both sides",
+             // As the file has them: an `int` above 2^31 would be negative.
              placed(exifIFD), static_cast<std::uint32_t>(width),
              static_cast<std::uint32_t>(height));
 }
@@ -28,8 +29,9 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;
   }
-  QVNote const* const exif = journal->absenceOf("width");
-  std::string const exifText = exif == nullptr ? "no Exif IFD gives a size" : exif->text;
+  // What `noteSize` said of the last Exif directory; the note made here replaces it.
+  QVNote const* const ofExif = journal->absenceOf("width");
+  std::string const exifText = ofExif == nullptr ? "no Exif IFD gives a size" : ofExif->text;
   std::string const frameText =
       walk.sawSOF0 ? composed("the SOF0 segment at {} declares {} x {}",
                               {Offset{walk.frame}, walk.frameWidth, walk.frameHeight})
@@ -38,7 +40,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!walk.sawExif) {
     noteAbsent(journal, {"orientation", "dateTimeOriginal"}, QVReason::NotInFile,
                walk.sawSOF0 && walk.sawAPP1
-                   ? "no Exif segment among those up to SOF0 and an APP1, where the walk ends"
+                   ? "no Exif segment was met; the walk ends once SOF0 and an APP1 were"
                    : "no Exif segment (APP1) was met");
   }
 }
@@ -51,9 +53,9 @@ void QVJPEGImage::noteHints(Journal* journal, WalkState const& walk) {
   }
   if (walk.scan >= 0) {
     noteHint(journal, QVReason::PictureData, walk.scan,
-             "Before the scan at {} no {} was met; the walk goes on through picture data, taken as "
-             "segments",
-             Offset{walk.scan}, walk.missingAtScan);
+             "No {} was met before the scan at {}; the walk goes on through the picture data and "
+             "takes it for segments",
+             walk.missingAtScan, Offset{walk.scan});
   }
 }
 

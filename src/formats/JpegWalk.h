@@ -6,17 +6,17 @@
 
 namespace quavel {
 
-/// What the walk over the segments has met so far. The members from `start` on are for notes only:
-/// positions in the file, -1 where nothing was met.
+/// What the walk over the segments has met so far. The members from `start` on are for notes only;
+/// their numbers are positions in the file, -1 where no such segment was met.
 struct QVJPEGImage::WalkState {
-  bool sawAPP1 = false;  ///< An APP1 segment with any content.
+  bool sawAPP1 = false;  ///< An APP1 segment, Exif or not.
   bool sawSOF0 = false;
   bool sawExif = false;
-  unsigned short frameWidth = 0;
-  unsigned short frameHeight = 0;
-  std::int64_t next = 0;           ///< Offset of the segment after the one being read.
-  std::int64_t start = 0;          ///< Of the segment being read.
-  std::int64_t frame = -1;         ///< The last SOF0 segment that enlarged a side.
+  unsigned short frameWidth = 0;   ///< The greatest that an SOF0 segment has declared.
+  unsigned short frameHeight = 0;  ///< Likewise.
+  std::int64_t next = 0;           ///< Where the next segment begins, as an offset of the stream.
+  std::int64_t start = 0;          ///< Where the segment being read begins.
+  std::int64_t frame = -1;         ///< The first SOF0 segment, or the last with a greater side.
   std::int64_t otherFrame = -1;    ///< The last SOF2 segment before the scan.
   std::int64_t scan = -1;          ///< The first SOS segment.
   char const* missingAtScan = "";  ///< Which segments were not met before `scan`.
@@ -24,10 +24,11 @@ struct QVJPEGImage::WalkState {
 
 namespace detail {
 
-/// Notes that no marker can be read at a position. The data may end even before it.
+/// Notes that the walk ends because no marker can be read at a position, which may lie beyond the
+/// end of the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes why the size in the Exif directory does not count, in case it is not used.
+/// Notes what size an Exif directory gives. The note is shown only if the record gets no size.
 void noteSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

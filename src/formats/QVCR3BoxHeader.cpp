@@ -9,7 +9,8 @@
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // Both numbers in one read, since walks do little but read headers.
+  // Both numbers in one read, since walks do little but read headers. A size whose type is cut off
+  // is stored, as if the numbers were read one after the other.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);

@@ -22,7 +22,8 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
-    if (!stepOverBox(stream, {" before a moov box was met"}, header)) {
+    BoxPlace const place = {" before a moov box was met"};
+    if (!stepOverBox(stream, place, header)) {
       return false;
     }
     PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};
@@ -47,9 +48,9 @@ bool QVCR3Image::storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& m
   PlacedBox const uuid = {box::Uuid, uuidBox.position_};
   if (uuidBox.userType != metadataUUID) {
     return refuse(journal, QVReason::MissingPart, uuid.position,
-                  "the last uuid box of the {}, the {}, is not the metadata's: its identifier is "
-                  "another one",
-                  moov, uuid);
+                  "the {} is the last uuid box in the {} and has another identifier than the "
+                  "metadata's",
+                  uuid, moov);
   }
   if (!uuidBox.cmt1Box && !uuidBox.cmt2Box) {
     return refuse(journal, QVReason::MissingPart, uuid.position,
@@ -78,6 +79,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
+  // A CMT1 box leaves these two dates empty, but a host's class derived from it may fill them.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

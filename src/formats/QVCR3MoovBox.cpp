@@ -16,6 +16,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   if (!QVCR3Box::read(stream)) {
     return false;
   }
+  // Back into the box, which the base class has stepped over.
   stream->setOffset(start + static_cast<long>(box::kHeaderSize));
   PlacedBox const moov = {boxHeader->type(), stream->baseOffset + start};
   if (moov.type != box::Moov) {
@@ -40,7 +41,7 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, l
       continue;
     }
     stream->setOffset(childStart);
-    uuidBox = std::make_shared<QVCR3UUIDBox>();
+    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last one counts, whatever its identifier
     if (!uuidBox->read(stream)) {
       return false;
     }

@@ -12,7 +12,8 @@ Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : exists_(true) {
 }
 
 bool Entry::convertToString(std::string& out) const {
-  // Resized to the greatest possible length, then cut: each append would check the capacity.
+  // Sized for the longest possible text and cut afterwards: appending would check the capacity for
+  // every character.
   out.resize(size_);
   char* const text = out.data();
   std::size_t length = 0;
@@ -20,10 +21,10 @@ bool Entry::convertToString(std::string& out) const {
   for (; length < size_; ++length) {
     auto const* const value = (*this)[length];
     isText = value->type == EntryValueType::ASCII;
-    text[length] = static_cast<char>(value->value[0]);
-    if (!isText || text[length] == '\0') {
+    if (!isText || value->value[0] == '\0') {
       break;
     }
+    text[length] = static_cast<char>(value->value[0]);
   }
   out.resize(length);
   return isText;

@@ -1,5 +1,6 @@
 #include "tiff/RawEntry.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 
@@ -28,13 +29,13 @@ void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, En
       return storeNumber<std::uint16_t>(bytes, isReversed, value.value);
     case 4:
       return storeNumber<std::uint32_t>(bytes, isReversed, value.value);
-    default:
+    default:  // 8: a double, or a fraction, which is two numbers
       break;
   }
   if (value.type == EntryValueType::DOUBLE) {
     return storeNumber<std::uint64_t>(bytes, isReversed, value.value);
   }
-  storeNumber<std::uint32_t>(bytes, isReversed, value.value);  // a fraction is two numbers
+  storeNumber<std::uint32_t>(bytes, isReversed, value.value);
   storeNumber<std::uint32_t>(bytes + 4, isReversed, value.value + 4);
 }
 
@@ -51,11 +52,11 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
 
   std::array<std::uint8_t, kPartSize> part;
   for (std::size_t left = entry.count; left > 0;) {
-    std::size_t const partCount = left * size <= kPartSize ? left : kPartSize / size;
+    std::size_t const partCount = std::min(left, kPartSize / size);
     if (!isInField && readUpTo(stream, part.data(), partCount * size) < partCount * size) {
       return false;
     }
-    std::uint8_t const* bytes = isInField ? entry.field : part.data();
+    std::uint8_t const* bytes = isInField ? entry.field : part.data();  // a field is a single part
     values.resize(values.size() + partCount);
     EntryValue* value = values.data() + (values.size() - partCount);
     for (std::size_t i = 0; i < partCount; ++i, ++value, bytes += size) {

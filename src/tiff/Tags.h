@@ -3,7 +3,7 @@
 
 #include <array>
 
-// The tags read from TIFF 6.0 and Exif directories, under their standard names.
+// The tags read from directories, those of TIFF and Exif under their standard names.
 namespace quavel::tag {
 
 /// A tag, its name for notes, and the record's field that is filled from its entry, if any.

@@ -14,8 +14,9 @@ constexpr char kNamesByTypeCode[][10] = {"",          "BYTE",  "ASCII",     "SHO
                                          "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
 
 tag::Tag const* known(unsigned short number) {
-  auto const* const found = std::find_if(std::begin(tag::kAll), std::end(tag::kAll),
-                                         [number](auto const& tag) { return tag == number; });
+  auto const* const found =
+      std::find_if(std::begin(tag::kAll), std::end(tag::kAll),
+                   [number](tag::Tag const& row) { return row.number == number; });
   return found == std::end(tag::kAll) ? nullptr : found;
 }
 
