@@ -38,7 +38,6 @@ struct QuotedBytes {
 void append(std::string& out, char const* text);
 void append(std::string& out, std::string const& text);
 void append(std::string& out, std::int64_t number);
-inline void append(std::string& out, int number) { append(out, std::int64_t{number}); }
 inline void append(std::string& out, std::uint16_t number) { append(out, std::int64_t{number}); }
 inline void append(std::string& out, std::uint32_t number) { append(out, std::int64_t{number}); }
 void append(std::string& out, Offset offset);
