@@ -34,7 +34,11 @@ int main(int argc, char** argv) {
   bool const hasData = quavel::metadataUUID[0] == 0x85c0b687 &&
                        quavel::QVJPEGImage::markerSkipLengths.count(0xffd8) == 1 &&
                        quavel::fieldTypeToValueType[13] == quavel::EntryValueType::LONG;
-  std::cout << "record: " << isNef << ", by a stream of one's own: " << isRead
-            << ", constants: " << hasData << '\n';
-  return isNef && isRead && hasData ? 0 : 1;
+  if (!isNef || !isRead || !hasData) {
+    std::cerr << "record: " << isNef << ", by a stream of one's own: " << isRead
+              << ", constants: " << hasData << '\n';
+    return 1;
+  }
+  std::cout << image.width << 'x' << image.height << '\n';
+  return 0;
 }
