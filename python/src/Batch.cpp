@@ -45,16 +45,25 @@ void read(app::Outcome& outcome, bool isPhoto, QVJournal& journal) {
 
 }  // namespace
 
-void readBatch(app::Batch& batch) {
+void readBatch(app::Batch& batch, std::atomic<bool> const& isClosing) {
   // Before it has threads, the pipeline works on the caller's thread, which holds the GIL.
   std::optional<Unlocked> unlocked;
   if (PyGILState_GetThisThreadState() != nullptr) {
     unlocked.emplace();
   }
   auto const start = Clock::now();
+  auto nextCheck = start + kSignalInterval;
   QVJournal journal(QVJournal::Detail::Refusals);
   batch.outcomes.resize(batch.inputs.size());
-  for (std::size_t i = 0; i < batch.inputs.size(); ++i) {
+  for (std::size_t i = 0; i < batch.inputs.size() && !isClosing; ++i) {
+    if (unlocked && Clock::now() > nextCheck) {
+      unlocked.reset();
+      if (PyErr_CheckSignals() != 0) {
+        throw py::error_already_set();
+      }
+      unlocked.emplace();
+      nextCheck = Clock::now() + kSignalInterval;
+    }
     app::Input& input = batch.inputs[i];
     app::Outcome& outcome = batch.outcomes[i];
     outcome.path = std::move(input.path);

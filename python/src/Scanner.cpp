@@ -20,13 +20,12 @@ constexpr std::size_t kMaxBatch = 64;  // photos
 constexpr double kLongBatch = 0.002;  // seconds
 // For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
 constexpr unsigned kUncachedJobs = 32;
-// How long Ctrl-C may go unnoticed.
-constexpr std::chrono::milliseconds kSignalInterval{50};
 
-std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs) {
+std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs, std::atomic<bool> const& isClosing) {
   unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
   unsigned const most = jobs != 0 ? jobs : std::max(processors, kUncachedJobs);
-  return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, readBatch);
+  auto const work = [&isClosing](app::Batch& batch) { readBatch(batch, isClosing); };
+  return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, work);
 }
 
 /// The path of a photo in a folder: the bytes, or what os.fsdecode gives for them.
@@ -70,7 +69,7 @@ py::object nextOf(py::handle iterator) {
 }  // namespace
 
 Scanner::Scanner(py::object source, bool isFolder, unsigned jobs)
-    : source_(std::move(source)), process_(::getpid()), pipeline_(makePipeline(jobs)) {
+    : source_(std::move(source)), process_(::getpid()), pipeline_(makePipeline(jobs, isClosing_)) {
   if (isFolder) {
     isBytes_ = py::isinstance<py::bytes>(source_);
     std::string const folder = pathOf(source_, "paths_or_folder");
@@ -219,6 +218,7 @@ void Scanner::close() {
     // A fork has no threads to join, and their work may be half done: the pipeline is abandoned.
     static_cast<void>(pipeline_.release());
   } else {
+    isClosing_ = true;
     Unlocked const unlocked;
     pipeline_.reset();
   }

@@ -4,6 +4,7 @@
 #include <pybind11/pybind11.h>
 #include <sys/types.h>
 
+#include <atomic>
 #include <cstddef>
 #include <deque>
 #include <memory>
@@ -47,6 +48,7 @@ class Scanner {
   std::optional<app::FolderWalk> walk_;
   bool isBytes_ = false;
   pid_t process_;  // which started the threads
+  std::atomic<bool> isClosing_{false};
   std::unique_ptr<app::Pipeline> pipeline_;
   // The paths of each batch under way, as the iterator gave them; no paths for a folder.
   std::deque<py::list> paths_;

@@ -8,6 +8,7 @@ import re
 import signal
 import subprocess
 import sys
+import time
 
 import pytest
 from conftest import NIGHT, PHOTOS, ROOT, resident_bytes, threads
@@ -95,6 +96,30 @@ def test_ends_its_threads():
 def test_one_job_takes_no_thread():
     for paths in ([], [NIGHT] * 500, PHOTOS):
         assert {threads() for _ in quavel.scan(paths, 1)} <= {1}
+
+
+@pytest.mark.parametrize("jobs", [1, 2])
+def test_leaves_slow_photos_unread(tmp_path, jobs):
+    slow = tmp_path / "slow.jpg"
+    slow.write_bytes(b"\xff\xd8" * 2_000_000)
+    start = time.monotonic()
+    assert quavel.get(slow)
+    one = time.monotonic() - start
+    quick = 63 + 64 * 40  # batches have grown to 64 then, and the next one is all slow
+    scan = quavel.scan(itertools.chain([NIGHT] * quick, itertools.repeat(slow)), jobs)
+    assert sum(1 for _ in itertools.islice(scan, quick - 100)) == quick - 100
+    signal.setitimer(signal.ITIMER_REAL, 5 * one + 0.2)
+    previous = signal.signal(signal.SIGALRM, signal.default_int_handler)
+    try:
+        start = time.monotonic()
+        with pytest.raises(KeyboardInterrupt):
+            for _ in scan:
+                pass
+        scan.close()
+        assert time.monotonic() - start < 12 * one + 1
+    finally:
+        signal.setitimer(signal.ITIMER_REAL, 0)
+        signal.signal(signal.SIGALRM, previous)
 
 
 def test_constant_memory():
