@@ -1,4 +1,4 @@
-"""What a session cannot show of the command: odd bytes, many files, signals, terminals, permissions."""
+"""What a transcript cannot show of the command: odd bytes, many files, signals, terminals, permissions."""
 
 import contextlib
 import csv
@@ -137,8 +137,8 @@ class Documents(CommandTest):
             self.assertRegex(text, rf"\b{extensions}\b", name)
             for option in options:
                 self.assertRegex(text, rf"(--| -l ){option}(?![\w-])", name)
-        sessions = "".join(file.read_text(encoding="utf-8") for file in HERE.glob("sessions/*.txt"))
-        for reason in set(re.findall(r'"error":.*?"reason":"([a-z-]+)"', sessions)):
+        transcripts = "".join(file.read_text(encoding="utf-8") for file in HERE.glob("transcripts/*.txt"))
+        for reason in set(re.findall(r'"error":.*?"reason":"([a-z-]+)"', transcripts)):
             self.assertIn(f"\n{reason}\t", text)
 
     def test_bash_completes_values_and_names(self):

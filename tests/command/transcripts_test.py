@@ -1,4 +1,4 @@
-"""Plays the sessions of sessions/*.txt, each file in an empty folder, and compares what is shown.
+"""Plays the transcripts of transcripts/*.txt, each file in an empty folder, and compares what is shown.
 
   # A remark.
   @ NAME FIELD=VALUE...    A photo is made, see photos.py. FIELD=- leaves the field out.
@@ -20,10 +20,10 @@ from command import CommandTest
 from photos import photo
 
 STEP = re.compile(r"^(@|\d*\$) (.*(?:\n> .*)*)\n((?:(?!@ |\d*\$ |# ).*\n)*)", re.M)
-USAGE_END = "! Try 'quavel --help'.\n[2]\n"  # of all sessions of usage.txt, which leave it out
+USAGE_END = "! Try 'quavel --help'.\n[2]\n"  # of all transcripts of usage.txt, which leave it out
 
 
-class Sessions(CommandTest):
+class Transcripts(CommandTest):
     maxDiff = None
 
     def make(self, name, *fields):
@@ -56,8 +56,8 @@ class Sessions(CommandTest):
                     self.assertEqual(shown, expected)
 
 
-for file in Path(__file__).with_name("sessions").glob("*.txt"):
-    setattr(Sessions, "test_" + file.stem, lambda self, file=file: self.play(file))
+for file in Path(__file__).with_name("transcripts").glob("*.txt"):
+    setattr(Transcripts, "test_" + file.stem, lambda self, file=file: self.play(file))
 
 if __name__ == "__main__":
     unittest.main()
