@@ -4,8 +4,8 @@
 #include <sys/stat.h>
 
 #include <chrono>
+#include <memory>
 #include <new>
-#include <optional>
 #include <utility>
 
 #include "Refusal.h"
@@ -47,9 +47,9 @@ void read(app::Outcome& outcome, bool isPhoto, QVJournal& journal) {
 
 void readBatch(app::Batch& batch, std::atomic<bool> const& isClosing) {
   // Before it has threads, the pipeline works on the caller's thread, which holds the GIL.
-  std::optional<Unlocked> unlocked;
+  std::unique_ptr<Unlocked> unlocked;
   if (PyGILState_GetThisThreadState() != nullptr) {
-    unlocked.emplace();
+    unlocked = std::make_unique<Unlocked>();
   }
   auto const start = Clock::now();
   auto nextCheck = start + kSignalInterval;
@@ -61,7 +61,7 @@ void readBatch(app::Batch& batch, std::atomic<bool> const& isClosing) {
       if (PyErr_CheckSignals() != 0) {
         throw py::error_already_set();
       }
-      unlocked.emplace();
+      unlocked = std::make_unique<Unlocked>();
       nextCheck = Clock::now() + kSignalInterval;
     }
     app::Input& input = batch.inputs[i];
