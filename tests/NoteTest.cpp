@@ -172,7 +172,7 @@ TEST(Notes, TellWhyAFieldIsAbsent) {
       {"jpg", jpegWith({}), "orientation not-in-file: no 0x0112 Orientation in IFD0 of the Exif"},
       {"jpg", kSOI + sof0(), "orientation not-in-file: no Exif segment (APP1) was met\n"},
       {"jpg", kSOI + sof0() + segment(0xffe1, "http"),
-       "orientation not-in-file: no Exif segment was met; the walk ends once"},
+       "orientation not-in-file: no Exif segment was met; the walk ends after"},
       {"cr3", cr3With("CMT1", shorts(kWidth, 1)),
        "fNumber not-in-file: no CMT2 box in the metadata uuid box at 0x18 (24)\n"},
       {"cr3", cr3With("CMT2", ratio(kAperture, 0, 0)),

@@ -5,15 +5,13 @@
 #include <thread>
 
 #include "OptionValues.h"
+#include "Pipeline.h"
 #include "photo/Photo.h"
 #include "terminal/Text.h"
 
 namespace app {
 
 namespace {
-
-// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
-constexpr unsigned kUncachedJobs = 32;
 
 constexpr char kFooter[] =
     "Examples:\n"

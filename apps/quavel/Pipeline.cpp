@@ -24,7 +24,15 @@ constexpr bool kCanCountWaits = false;  // so all reading is taken to wait for t
 long countWaits() { return 0; }
 #endif
 
+constexpr std::size_t kMaxBatch = 64;                      // files
+constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
+
 }  // namespace
+
+std::size_t nextBatchSize(Batch const& batch, std::size_t size) {
+  bool const isTooLarge = batch.seconds > kLongBatch || batch.bytes > kLargeBatch;
+  return isTooLarge ? std::max<std::size_t>(size / 2, 1) : std::min(size * 2, kMaxBatch);
+}
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
     : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kCanCountWaits), work_(std::move(work)) {}

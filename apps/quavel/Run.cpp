@@ -17,11 +17,6 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kMaxBatch = 64;  // files
-// A batch should be short enough for the output to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;                       // seconds
-constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
-
 /// One run over the files of a source.
 class Runner {
  public:
@@ -149,9 +144,7 @@ void Runner::emitOldest() {
   }
   output_.flush();
   progress_.tick();
-  bool const isTooLarge = batch->seconds > kLongBatch || batch->bytes > kLargeBatch;
-  batchSize_ =
-      isTooLarge ? std::max<std::size_t>(batchSize_ / 2, 1) : std::min(batchSize_ * 2, kMaxBatch);
+  batchSize_ = nextBatchSize(*batch, batchSize_);
 }
 
 void Runner::emit(Outcome&& outcome) {

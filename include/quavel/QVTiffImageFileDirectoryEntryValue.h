@@ -87,7 +87,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectoryEntryValue {
   /// @name As stored
   /// @{
 
-  /// The fraction of a RATIONAL or of an SRATIONAL, respectively; any other type gives 0/0.
+  /// The fraction as the file has it. 0/0 unless the type is RATIONAL, or SRATIONAL for the second.
   Rational rationalValue() const;
   SRational sRationalValue() const;
   /// @}

@@ -15,15 +15,9 @@ namespace binding {
 
 namespace {
 
-constexpr std::size_t kMaxBatch = 64;  // photos
-// A batch should be short enough for results to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;  // seconds
-// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
-constexpr unsigned kUncachedJobs = 32;
-
 std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs, std::atomic<bool> const& isClosing) {
   unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
-  unsigned const most = jobs != 0 ? jobs : std::max(processors, kUncachedJobs);
+  unsigned const most = jobs != 0 ? jobs : std::max(processors, app::kUncachedJobs);
   auto const work = [&isClosing](app::Batch& batch) { readBatch(batch, isClosing); };
   return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, work);
 }
@@ -54,7 +48,7 @@ py::object makeResult(PyTypeObject* type, py::object path, py::object record, py
 using Clock = std::chrono::steady_clock;
 
 bool isLong(Clock::time_point start) {
-  return std::chrono::duration<double>(Clock::now() - start).count() > kLongBatch;
+  return std::chrono::duration<double>(Clock::now() - start).count() > app::kLongBatch;
 }
 
 /// Null at the end; null, with the exception set, when the iterator raises one.
@@ -103,8 +97,7 @@ py::list Scanner::nextBatch() {
   py::list const paths = std::move(paths_.front());
   paths_.pop_front();
   auto const batch = pipeline_->take();
-  batchSize_ = batch->seconds > kLongBatch ? std::max<std::size_t>(batchSize_ / 2, 1)
-                                           : std::min(batchSize_ * 2, kMaxBatch);
+  batchSize_ = app::nextBatchSize(*batch, batchSize_);
   return resultsOf(*batch, paths);
 }
 

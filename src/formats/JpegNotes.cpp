@@ -40,7 +40,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!walk.sawExif) {
     noteAbsent(journal, {"orientation", "dateTimeOriginal"}, QVReason::NotInFile,
                walk.sawSOF0 && walk.sawAPP1
-                   ? "no Exif segment was met; the walk ends once SOF0 and an APP1 were"
+                   ? "no Exif segment was met; the walk ends after SOF0 and an APP1"
                    : "no Exif segment (APP1) was met");
   }
 }

@@ -69,8 +69,8 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   ++reads_;
-  std::int64_t delivered =
-      reads_ == 1 ? readFirst(destination, count) : readFurther(destination, count);
+  std::int64_t delivered = reads_ == 1 && file::kTakesAdvice ? readFirst(destination, count)
+                                                             : readFurther(destination, count);
   if (delivered == -1 && errno == ESPIPE) {
     delivered = readPipe(destination, count);
   }

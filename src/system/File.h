@@ -24,7 +24,8 @@ std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::i
 std::int64_t position(int fd);
 std::int64_t seek(int fd, std::int64_t position);
 std::int64_t size(int fd);
-inline void expectFewReads(int /*fd*/) {}  // Windows takes no such advice
+inline constexpr bool kTakesAdvice = false;
+inline void expectFewReads(int /*fd*/) {}
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 
 #else
@@ -57,13 +58,15 @@ inline std::int64_t size(int fd) {
 }
 
 #ifdef POSIX_FADV_RANDOM
+inline constexpr bool kTakesAdvice = true;
 /// Advises the system not to read ahead: reads will be few and far apart.
 inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
 /// Advises the system to fetch these bytes now: they will be read soon.
 inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
   ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
 }
-#else  // the system takes no advice
+#else
+inline constexpr bool kTakesAdvice = false;
 inline void expectFewReads(int /*fd*/) {}
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 #endif
