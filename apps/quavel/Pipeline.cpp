@@ -24,7 +24,7 @@ constexpr bool kCanCountWaits = false;  // so all reading is taken to wait for t
 long countWaits() { return 0; }
 #endif
 
-constexpr std::size_t kMaxBatch = 64;                      // files
+constexpr std::size_t kMaxBatch = 128;                     // files
 constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
 
 }  // namespace
@@ -86,7 +86,7 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
          (patience.count() == 0 ? isDone() : batchDone_.wait_for(lock, patience, isDone));
 }
 
-bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 2 * maxThreads()); }
+bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 3 * maxThreads()); }
 
 std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_.load() : busyJobs_; }
 
@@ -128,7 +128,9 @@ void Pipeline::runThread() {
     workOn(*batch);
     lock.lock();
     batch->isDone = true;
+    lock.unlock();  // first, because the thread that is notified locks it at once
     batchDone_.notify_one();
+    lock.lock();
   }
 }
 

@@ -53,7 +53,7 @@ class Pipeline {
   /// Waits for the oldest batch and returns it, or throws what its work threw. There must be one.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
-  /// Whether enough batches are under way to keep the threads busy: two for each.
+  /// Whether enough batches are under way to keep the threads busy: three for each.
   bool isFull() const;
   /// Waits up to `patience` for the oldest batch; false if it is still not done or there is none.
   bool isOldestDone(std::chrono::milliseconds patience = {});
