@@ -183,7 +183,9 @@ TEST(Jpeg, WalksOverOtherSegments) {
            Bytes("\xff\xc0\xff\xff") + sof0().substr(4),
            segment(0xffe1, Bytes(65533, 'x')) + segment(0xffe2, Bytes(32766, 'x')) + sof0()}},
          // The data may end between two segments, or in what is skipped of one.
-         {"", {"", "\xff", segment(0xffdb, "quantization").substr(0, 8), sof0(0, 9) + other}},
+         {"",
+          {"", "\xff", segment(0xffdb, "quantization").substr(0, 8), sof0(0, 9) + other,
+           sof0(7, 0) + other}},
          {"! ",
           {"\xff\xdb", "\xff\xe1\x01", segment(0xffe1, "Exi"), segment(0xffe1, "Exif\xff"),
            exifSegment("II+"), sof0().substr(0, 8), Bytes(1000, '\0')}}},

@@ -197,7 +197,8 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
       {"jpg", afterScan + segment(0xffe1, "http") + sof0(), "- hint not-baseline"},
       {"jpg", kSOI + segment(0xffc2, "ab") + segment(0xffda, "cd") + "\xff\xe2\1",
        "hint not-baseline at 2: The frame at 2 is progressive"},  // though it is refused
-      {"jpg", kSOI + sof0() + segment(0xffda, "cd") + segment(0xffe1, "http"),
+      {"jpg",
+       kSOI + sof0() + segment(0xffda, "cd") + segment(0xffda, "ef") + segment(0xffe1, "http"),
        "hint picture-data at 21: No APP1 was met before the scan at 0x15 (21);"},
       {"jpg", kSOI + sof0(), "step none at 2: the SOF0 segment at 2 declares 4000 x 3000\n"},
       {"raf", rafFile(Bytes(40, 'x'), ""), "hint other-opening at 148: The embedded JPEG at "},
@@ -235,6 +236,8 @@ TEST(Journal, TellsWhyAFileOnDiskCannotBeRead) {
   TemporaryFile const photo(fixtureOf("tif").bytes(kII), "tif");
   EXPECT_EQ(describe(journal.read(photo.path)), fixtureOf("tif").expected);
   EXPECT_TRUE(journal.notes().empty());  // the earlier read's are gone, and no others are wanted
+  EXPECT_EQ(journal.refusal(), nullptr);
+  EXPECT_EQ(QVJournal::reasonName(static_cast<QVReason>(99)), std::string());
 }
 
 TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItToOthers) {

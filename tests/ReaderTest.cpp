@@ -113,6 +113,18 @@ TEST(Metadata, TakesWhatAHostsDirectoryHas) {
             "dateTimeDigitized=digitized");
 }
 
+TEST(Metadata, RefusesWhatAHostsDirectoryHasWrong) {
+  auto const stores = [](auto&& record, Field const& field) {
+    auto const ifd = std::make_shared<QVTiffImageFileDirectory>();
+    auto stream = streamOf(tiff(kMM, {{longs(kWidth, 160), field}}), kMM, 8);
+    return ifd->read(stream, {}) && record.storeInfoFromMainIFD(ifd);
+  };
+  EXPECT_FALSE(stores(QVRafImage(), shorts(kLength, 1, 2)));
+  EXPECT_FALSE(stores(QVRafImage(), shorts(kOrientation, 1, 2)));
+  EXPECT_FALSE(stores(QVNefImage(), longs(kLength, 106)));
+  EXPECT_TRUE(stores(QVNefImage(), longs(kLength, 120)));
+}
+
 TEST(Metadata, PrefersTheOriginalDate) {
   QVTiffImage record;
   EXPECT_EQ(record.captureDate(), "");

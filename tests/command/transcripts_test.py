@@ -2,7 +2,7 @@
 
   # A remark.
   @ NAME FIELD=VALUE...    A photo is made, see photos.py. FIELD=- leaves the field out.
-  $ COMMAND                The shell runs this; "quavel" is the command under test.
+  $ COMMAND                The shell runs this: "quavel" is the command under test, $PHOTOS the bundled photos.
   80$ COMMAND              The same with its output on a terminal of 80 columns.
   > MORE                   The line above goes on.
 
@@ -20,6 +20,7 @@ from command import CommandTest
 from photos import photo
 
 STEP = re.compile(r"^(@|\d*\$) (.*(?:\n> .*)*)\n((?:(?!@ |\d*\$ |# ).*\n)*)", re.M)
+PHOTOS = Path(__file__).parents[2] / "examples/photos"
 USAGE_END = "! Try 'quavel --help'.\n[2]\n"  # of all transcripts of usage.txt, which leave it out
 
 
@@ -32,7 +33,7 @@ class Transcripts(CommandTest):
         self.put(name, photo(name.rpartition(".")[2], **dict(value.split("=", 1) for value in values)))
 
     def shown(self, width, line):
-        shell = ["sh", "-c", 'quavel() { timeout 50 "$QUAVEL_COMMAND" "$@"; }\n' + line]
+        shell = ["sh", "-c", f'PHOTOS="{PHOTOS}"; quavel() {{ timeout 50 "$QUAVEL_COMMAND" "$@"; }}\n{line}']
         if width:
             output, errors, status = self.on_terminal(*shell, width=int(width))
         else:
