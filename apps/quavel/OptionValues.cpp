@@ -10,7 +10,7 @@ namespace app::values {
 
 namespace {
 
-Field const* wantedField(std::string const& option, std::string const& name) {
+Field const* requireField(std::string const& option, std::string const& name) {
   Field const* const field = fieldNamed(name);
   if (field == nullptr) {
     auto const nameOf = [](Field const& known) { return std::string(known.name); };
@@ -22,11 +22,11 @@ Field const* wantedField(std::string const& option, std::string const& name) {
 
 }  // namespace
 
-/// Splits the list itself: the parser would skip empty names instead of refusing them.
+/// Splits the list here, because the parser would skip empty names instead of refusing them.
 void addFields(std::string const& list, Fields& fields) {
-  std::istringstream names(list + ',');  // ends the last name too, even an empty one
+  std::istringstream names(list + ',');  // without the comma, an empty last name would be lost
   for (std::string name; std::getline(names, name, ',');) {
-    auto const* const field = wantedField("--fields", name);
+    auto const* const field = requireField("--fields", name);
     if (std::count(fields.begin(), fields.end(), field) > 0) {
       throw CLI::ValidationError("--fields: '" + name + "' is named twice");
     }
@@ -40,15 +40,15 @@ std::string refuseEmpty(std::string const& argument) {
 
 void setSort(Form& form, std::string const& name) {
   form.isDescending = name.substr(0, 1) == "-";
-  form.sort = wantedField("--sort", name.substr(form.isDescending ? 1 : 0));
+  form.sort = requireField("--sort", name.substr(form.isDescending ? 1 : 0));
 }
 
 void addConditions(std::vector<std::string> const& texts, Form& form) {
   for (auto const& text : texts) {
     std::string name = text.substr(0, text.find_first_of(Condition::kSigns));
     auto const comparison = std::string_view(text).substr(name.size());
-    name.erase(name.find_last_not_of(' ') + 1);
-    auto const* const field = wantedField("--where", name);
+    name.erase(name.find_last_not_of(' ') + 1);  // blanks before the sign
+    auto const* const field = requireField("--where", name);
     try {
       form.conditions.emplace_back(*field, comparison);
     } catch (std::invalid_argument const& error) {
@@ -60,7 +60,7 @@ void addConditions(std::vector<std::string> const& texts, Form& form) {
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded) {
   for (std::string glob : globs) {
     while (glob.size() > 1 && glob.back() == '/') {
-      glob.pop_back();  // completion adds one to the name of a folder
+      glob.pop_back();  // the shell's completion puts a slash after a folder's name
     }
     excluded.push_back(glob);
     if (glob.find('/') != std::string::npos) {

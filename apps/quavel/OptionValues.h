@@ -6,7 +6,7 @@
 
 #include "output/Form.h"
 
-/// What options' arguments mean. A wrong one is refused with a CLI::ValidationError that names it.
+/// What the options' arguments mean. A CLI::ValidationError names an argument that is wrong.
 namespace app::values {
 
 constexpr unsigned kMaxJobs = 256;
@@ -14,12 +14,12 @@ constexpr unsigned kMaxJobs = 256;
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
-/// A glob with a slash in it (not only at its end) matches whole paths, and the ends of paths.
+/// Drops slashes at a glob's end. A glob with another slash matches whole paths and ends of paths.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
-/// Whether the choice is `yes`.
+/// True for the choice `yes`, false for `no`; any other is wrong.
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);
-/// For the parser: why the argument is wrong; empty if it is not.
+/// A check that the parser calls: returns why the argument is wrong, or an empty text.
 std::string refuseEmpty(std::string const& argument);
 
 }  // namespace app::values

@@ -23,7 +23,7 @@ constexpr char kFooter[] =
     "Fields, such as model, path, captureDate or reason, are listed in quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
-/// Shows only an option's argument, not the options that it excludes: an error message names those.
+/// Help without the options that an option excludes or needs: an error message names those.
 class ShortFormatter : public CLI::Formatter {
  public:
   std::string make_option_opts(CLI::Option const* option) const override {
@@ -72,7 +72,7 @@ void addForms(CLI::App& command, Form& form) {
   auto* const why =
       command.add_flag("--why", form.hasNotes, "Tell why files give no record, or lack fields");
   std::vector<CLI::Option*> forms;
-  auto const add = [&](char const* name, FormKind kind, char const* text) {
+  auto const addForm = [&](char const* name, FormKind kind, char const* text) {
     auto* const flag = command.add_flag_callback(
         name, [&form, kind] { form.kind = kind; }, text);
     flag->group("Forms (otherwise a table, or a card when there is one photo)");
@@ -82,13 +82,13 @@ void addForms(CLI::App& command, Form& form) {
     forms.push_back(flag);
     return flag;
   };
-  add("--table", FormKind::Table, "A table, for one photo too")->excludes(why);
-  add("--card", FormKind::Card, "A labelled card for every photo")->excludes(why);
-  add("--json", FormKind::Json, "One JSON array, exact values");
-  add("--jsonl", FormKind::Jsonl, "One JSON object a line, as they come");
-  auto* const csv = add("--csv", FormKind::Csv, "CSV (RFC 4180) with a header row");
+  addForm("--table", FormKind::Table, "A table, for one photo too")->excludes(why);
+  addForm("--card", FormKind::Card, "A labelled card for every photo")->excludes(why);
+  addForm("--json", FormKind::Json, "One JSON array, exact values");
+  addForm("--jsonl", FormKind::Jsonl, "One JSON object a line, as they come");
+  auto* const csv = addForm("--csv", FormKind::Csv, "CSV (RFC 4180) with a header row");
   csv->excludes(why);
-  add("--print0", FormKind::Paths, "The paths of the photos, NUL-ended")->excludes(why);
+  addForm("--print0", FormKind::Paths, "The paths of the photos, NUL-ended")->excludes(why);
   command.add_flag("--lf", form.endsWithLf, "End the lines of CSV with LF, not CRLF")->needs(csv);
 }
 
@@ -126,14 +126,14 @@ void addChoices(CLI::App& command, Options& options) {
 /// Refuses what the parser cannot judge, and normalizes the extension.
 void finish(Options& options) {
   if (options.fromStdin) {
-    options.extension = extensionOf("." + options.extension);  // so that "nef" and ".nef" both do
+    options.extension = extensionOf("." + options.extension);  // takes "nef" and ".nef"
     std::string const unknown = whyUnknown(options.extension);
     if (!unknown.empty()) {
       throw CLI::ValidationError("--extension: " + unknown);
     }
   }
   Form const& form = options.form;
-  if (form.isExplanation() && (!form.fields.empty() || form.showAbsent)) {
+  if (form.isExplanation() && (!form.fields.empty() || form.showAbsent.has_value())) {
     throw CLI::ValidationError("--fields and --absent: with --why, add --json or --jsonl");
   }
   bool const hasPaths = !options.inputs.paths.empty() || !options.inputs.list.empty();
@@ -150,11 +150,12 @@ void refuseOddValues(CLI::App const& command, int argc, char const* const* argv)
     std::string const word = argv[i];
     auto const equals = word.find('=');
     auto const* const option = command.get_option_no_throw(word.substr(0, equals));
-    bool const isAssignment = equals != std::string::npos && option != nullptr;
+    // Without a dash, it is a file, even if it begins with "PATH=", a name that the parser knows.
+    bool const isAssignment = word[0] == '-' && equals != std::string::npos && option != nullptr;
     if (isAssignment && option->get_items_expected_max() == 0) {
       throw CLI::ValidationError("'" + word + "': this option takes no value");
     }
-    if (isAssignment && equals + 1 == word.size() && word[0] == '-') {  // "PATH=" may be a file
+    if (isAssignment && equals + 1 == word.size()) {
       throw CLI::ValidationError("'" + word + "': give a value after the =");
     }
   }

@@ -9,21 +9,20 @@
 
 namespace app {
 
-constexpr int kSuccess = 0;
-constexpr int kSomeFailed = 1;
-constexpr int kWrongUsage = 2;
+constexpr int kSuccess = 0;     ///< Exit status: all went well.
+constexpr int kSomeFailed = 1;  ///< Exit status: a file gave no record, or the run broke off.
+constexpr int kWrongUsage = 2;  ///< Exit status: the arguments cannot be used.
 
 struct Options {
   Inputs inputs;
-  bool fromStdin = false;
-  std::string extension;  ///< Of the image on standard input, in lower case.
+  bool fromStdin = false;  ///< One image is read from standard input.
+  std::string extension;   ///< Of that image, in lower case.
   Form form;
   unsigned jobs = 1;        ///< Files read at a time when reading waits for the disk.
   unsigned cachedJobs = 1;  ///< The same while the files are cached; at most `jobs`.
   bool isQuiet = false;
 };
 
-/// What the arguments ask for.
 struct ParsedOptions {
   Options options;
   std::optional<int> status;  ///< If set, the command only prints `text` and exits with this.

@@ -20,7 +20,7 @@ long countWaits() {
   return usage.ru_nvcsw;
 }
 #else
-constexpr bool kCanCountWaits = false;  // so all reading is taken to wait for the disk
+constexpr bool kCanCountWaits = false;  // all reading is then taken to wait for the disk
 long countWaits() { return 0; }
 #endif
 
@@ -29,8 +29,8 @@ constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
 
 }  // namespace
 
-std::size_t nextBatchSize(Batch const& batch, std::size_t size) {
-  bool const isTooLarge = batch.seconds > kLongBatch || batch.bytes > kLargeBatch;
+std::size_t nextBatchSize(Batch const& done, std::size_t size) {
+  bool const isTooLarge = done.seconds > kLongBatch || done.bytes > kLargeBatch;
   return isTooLarge ? std::max<std::size_t>(size / 2, 1) : std::min(size * 2, kMaxBatch);
 }
 
@@ -49,21 +49,22 @@ Pipeline::~Pipeline() {
 }
 
 void Pipeline::submit(std::unique_ptr<Batch> batch) {
-  Batch* const work = batch.get();
+  Batch* const submitted = batch.get();
   order_.push_back(std::move(batch));
-  // Threads start with the second batch, because a single file is not worth one.
-  if (jobs_ > 1 && hasBegun_ && threads_.size() < std::min(maxThreads(), order_.size())) {
+  // The first batch may be all there is, often a single file: it is not worth starting a thread.
+  std::size_t const usefulThreads = std::min(maxThreads(), order_.size());
+  if (jobs_ > 1 && hasSubmitted_ && threads_.size() < usefulThreads) {
     startThread();
   }
-  hasBegun_ = true;
+  hasSubmitted_ = true;
   if (threads_.empty()) {
-    workOn(*work);
-    work->isDone = true;
+    workOn(*submitted);
+    submitted->isDone = true;
     return;
   }
   {
     std::lock_guard<std::mutex> const lock(mutex_);
-    waiting_.push_back(work);
+    waiting_.push_back(submitted);
   }
   hasWork_.notify_one();
 }
@@ -83,7 +84,7 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
   std::unique_lock<std::mutex> lock(mutex_);
   auto const isDone = [this] { return order_.front()->isDone; };
   return !order_.empty() &&
-         (patience.count() == 0 ? isDone() : batchDone_.wait_for(lock, patience, isDone));
+         (isDone() || (patience.count() > 0 && batchDone_.wait_for(lock, patience, isDone)));
 }
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 3 * maxThreads()); }
@@ -95,7 +96,7 @@ void Pipeline::startThread() {
   try {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
-    // No further thread can be started: those that run do the work; if none runs, the caller does.
+    // No more threads can be started: the running ones do the work, or `submit` if there is none.
     jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
     busyJobs_ = std::min(busyJobs_, jobs_.load());
   }
@@ -103,15 +104,15 @@ void Pipeline::startThread() {
 
 void Pipeline::workOn(Batch& batch) {
   bool const isMeasured = kCanCountWaits && jobs_ > 1;
-  long const before = isMeasured ? countWaits() : 0;
+  long const waitsBefore = isMeasured ? countWaits() : 0;
   try {
     work_(batch);
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file does not wait; any other waits at least once. The majority decides.
+  // Reading a cached file does not wait, reading any other does. The majority decides.
   if (isMeasured) {
-    waitsForDisk_ = 2 * (countWaits() - before) > static_cast<long>(batch.inputs.size());
+    waitsForDisk_ = 2 * (countWaits() - waitsBefore) > static_cast<long>(batch.inputs.size());
   }
 }
 
@@ -128,7 +129,7 @@ void Pipeline::runThread() {
     workOn(*batch);
     lock.lock();
     batch->isDone = true;
-    lock.unlock();  // first, because the thread that is notified locks it at once
+    lock.unlock();  // or the notified thread would wake up only to wait for it
     batchDone_.notify_one();
     lock.lock();
   }

@@ -17,7 +17,7 @@
 
 namespace app {
 
-/// Some consecutive files.
+/// Consecutive files, worked on by one thread.
 struct Batch {
   std::vector<Input> inputs;
   std::vector<Outcome> outcomes;
@@ -29,28 +29,28 @@ struct Batch {
 
 // A batch should be short enough for results to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;  ///< In seconds.
-/// How many files the next batch should have, after this one and those of `size` files.
-std::size_t nextBatchSize(Batch const& batch, std::size_t size);
+/// How many files the next batch should have, when the last one had `size` and `done` is finished.
+std::size_t nextBatchSize(Batch const& done, std::size_t size);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
 constexpr unsigned kUncachedJobs = 32;
 
-/// Works on batches on several threads and returns them in the order in which they were submitted.
-/// Up to `jobs` threads are started while the work waits for the disk, so that the disk is never
-/// idle, and up to `busyJobs` while it keeps the processors busy. A thread runs until the end.
+/// Works on batches on several threads and returns them in the order of submission. Starts up to
+/// `jobs` threads while the work waits for the disk, so that the disk is never idle, and up to
+/// `busyJobs` while the work keeps the processors busy. The threads run until the destructor.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
-  /// The first batch is worked on in `submit`, by its caller; with one job, every batch is.
   Pipeline(unsigned jobs, unsigned busyJobs, Work work);
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
   Pipeline(Pipeline const&) = delete;
   Pipeline& operator=(Pipeline const&) = delete;
 
+  /// Works on the first batch itself, and on every batch if there is only one job.
   void submit(std::unique_ptr<Batch> batch);
-  /// Waits for the oldest batch and returns it, or throws what its work threw. There must be one.
+  /// Waits for the oldest batch, which must exist, and returns it or throws what its work threw.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
   /// Whether enough batches are under way to keep the threads busy: three for each.
@@ -69,8 +69,8 @@ class Pipeline {
   std::atomic<bool> waitsForDisk_;
   Work work_;
   std::vector<std::thread> threads_;
-  std::deque<std::unique_ptr<Batch>> order_;  // used by the caller's thread only
-  bool hasBegun_ = false;
+  std::deque<std::unique_ptr<Batch>> order_;  // as submitted; only the caller's thread uses it
+  bool hasSubmitted_ = false;
   std::mutex mutex_;  // guards `waiting_`, `isEnding_` and each batch's `isDone`
   std::condition_variable hasWork_;
   std::condition_variable batchDone_;

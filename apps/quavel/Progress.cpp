@@ -16,20 +16,20 @@ namespace app {
 
 namespace {
 
-constexpr auto kQuietStart = std::chrono::milliseconds(500);
-constexpr auto kInterval = std::chrono::milliseconds(100);
+constexpr auto kQuietStart = std::chrono::milliseconds(500);  // without a progress line
+constexpr auto kInterval = std::chrono::milliseconds(100);    // between updates of the line
 constexpr auto kCountingSpell = std::chrono::milliseconds(1);
-constexpr int kRests = 4;  // each as long as a spell of counting
+constexpr int kRestFactor = 4;  // a rest is this many times as long as the spell before it
 
 double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-/// A list from standard input or in a pipe can be read only once.
+/// Whether the list, if any, can be read twice: not from standard input or a pipe.
 bool isRereadable(std::string const& list) {
   struct stat status = {};
   bool const isFile = ::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode);
-  return list.empty() || (list != "-" && isFile);  // empty: there is no list
+  return list.empty() || (list != "-" && isFile);
 }
 
 std::string rate(std::size_t files, double seconds) {
@@ -94,20 +94,20 @@ void Progress::startCountingAhead() {
 }
 
 void Progress::countAhead() {
-  Source source(options_.inputs, [](auto&&...) {});
+  Source source(options_.inputs, [](auto&&...) {});  // the run itself reports what is skipped
   Input input;
   std::size_t count = 0;
-  auto start = Clock::now();
+  auto spellStart = Clock::now();
   while (source.next(input)) {
     ++count;
     // Reading photos comes first: counting keeps the disk busy for a fifth of the time at most.
-    auto const spell = Clock::now() - start;
+    auto const spell = Clock::now() - spellStart;
     if (spell >= kCountingSpell) {
       std::unique_lock<std::mutex> lock(mutex_);
-      if (hasEnded_.wait_for(lock, kRests * spell, [this] { return isEnding_; })) {
+      if (hasEnded_.wait_for(lock, kRestFactor * spell, [this] { return isEnding_; })) {
         return;
       }
-      start = Clock::now();
+      spellStart = Clock::now();
     }
   }
   total_ = count;
@@ -116,24 +116,23 @@ void Progress::countAhead() {
 std::string Progress::line(double seconds) const {
   std::size_t const files = records_ + failures_;
   std::size_t const total = total_;
-  bool const isTotalKnown = total > 0 && total >= files;  // new files may make it too low
+  bool const isTotalKnown = total > 0 && total >= files;  // files added since make it too low
   std::string text = std::to_string(files);
   if (isTotalKnown) {
     text += " of " + std::to_string(total);
   }
   text += " files, " + rate(files, seconds) + " files/s";
   if (isTotalKnown && files > 0) {
-    text += ", " +
-            duration(seconds / static_cast<double>(files) * static_cast<double>(total - files)) +
-            " left";
+    double const secondsPerFile = seconds / static_cast<double>(files);
+    text += ", " + duration(secondsPerFile * static_cast<double>(total - files)) + " left";
   }
   return text;
 }
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  bool const isOutputEnough = failures_ == 0 || options_.form.isExplanation();
-  if (options_.isQuiet || (files == 1 && isOutputEnough)) {
+  bool const isOutputEnough = files == 1 && (failures_ == 0 || options_.form.isExplanation());
+  if (options_.isQuiet || isOutputEnough) {
     return;
   }
   double const seconds = secondsSince(start_);

@@ -17,7 +17,7 @@ class Console;
 /// Counts the files read, shows progress once the work takes long, and sums it up at the end.
 class Progress {
  public:
-  /// `options` must outlive this.
+  /// Both arguments must outlive it.
   Progress(Console& console, Options const& options);
   ~Progress();
   Progress(Progress const&) = delete;
@@ -48,11 +48,11 @@ class Progress {
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
   std::size_t shown_ = 0;
-  std::thread counter_;  // counts ahead
-  std::mutex mutex_;
+  std::thread counter_;  // runs `countAhead`
+  std::mutex mutex_;     // guards `isEnding_`
   std::condition_variable hasEnded_;
   bool isEnding_ = false;
-  std::atomic<std::size_t> total_{0};  // of all files; 0 until it is known
+  std::atomic<std::size_t> total_{0};  // of all files, by `countAhead`; 0: unknown
 };
 
 }  // namespace app

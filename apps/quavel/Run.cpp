@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <chrono>
-#include <new>
 #include <optional>
 #include <system_error>
 #include <utility>
@@ -17,7 +16,6 @@ namespace app {
 
 namespace {
 
-/// One run over the files of a source.
 class Runner {
  public:
   Runner(Options const& options, Output& output, Console& console);
@@ -42,7 +40,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;  // destroyed before the members above, which its threads use
   std::size_t batchSize_ = 1;
-  bool isErrorHintDue_;  // the chosen columns of CSV lack error, and no message has said so yet
+  bool isErrorHintDue_;  // the fields chosen for CSV lack `error`, and no message has said so yet
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -65,8 +63,8 @@ int Runner::run() {
   }
   std::optional<Source> source;
   try {
-    source.emplace(options_.inputs, [this](std::string const& path, std::string const& why) {
-      console_.printFileMessage(path, why);
+    source.emplace(options_.inputs, [this](std::string const& path, std::string const& remark) {
+      console_.printFileMessage(path, remark);
     });
   } catch (std::system_error const& error) {
     console_.printFileMessage(options_.inputs.list,

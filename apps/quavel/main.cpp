@@ -19,14 +19,15 @@
 
 namespace {
 
-/// Opens /dev/null in place of each closed standard stream, so that no photo gets its descriptor.
-/// The mode is the wrong one for the stream, so that using it still fails.
+/// Opens /dev/null in place of each closed standard stream, so that no photo gets the stream's
+/// descriptor. The mode is the wrong one, so that using the stream still fails: a standard input
+/// that could be read would look like an empty list.
 void holdStandardStreams() {
+  // Each `open` takes the lowest free descriptor.
   if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
-    // Not for reading, because an empty input would look like an empty list.
     static_cast<void>(::open("/dev/null", O_WRONLY | O_CLOEXEC));
   }
-  int fd = -1;  // each open takes the lowest descriptor that is free
+  int fd = -1;
   do {
     fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);

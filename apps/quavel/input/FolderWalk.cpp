@@ -15,7 +15,7 @@ namespace app {
 
 FolderWalk::FolderWalk(std::string const& folder, Filter const& filter, Report report)
     : filter_(filter), report_(std::move(report)) {
-  enter(folder, false);
+  enter(folder, /*mayBeLink=*/false);
 }
 
 bool FolderWalk::next(Input& input) {
@@ -27,9 +27,9 @@ bool FolderWalk::next(Input& input) {
 }
 
 bool FolderWalk::step(Input& input) {
-  if (missed_) {
-    input = std::move(*missed_);
-    missed_.reset();
+  if (unreadable_) {
+    input = std::move(*unreadable_);
+    unreadable_.reset();
     return true;
   }
   Level& level = levels_.back();
@@ -49,10 +49,10 @@ bool FolderWalk::step(Input& input) {
 bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
     case DT_REG:  // a photo: other files never get here
-      input = {std::move(path), true, {}};
+      input = {std::move(path), /*isPhoto=*/true, {}};
       return true;
     case DT_DIR:
-      enter(path, false);
+      enter(path, /*mayBeLink=*/false);
       return false;
     case DT_LNK:
     case DT_UNKNOWN:  // not every file system gives the type here
@@ -70,27 +70,28 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    input = {std::move(path), false, {}};  // reading it will show what is wrong
+    input = {std::move(path), /*isPhoto=*/false, {}};  // reading it will show what is wrong
     return isPhotoExtension(extensionOf(input.path));
   }
   if (S_ISDIR(status.st_mode)) {
-    if (!isLeftOut({}, path.substr(path.rfind('/') + 1), true)) {  // again, now as a folder
-      enter(path, true);
+    std::string const name = path.substr(path.rfind('/') + 1);
+    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` took it for a file
+      enter(path, /*mayBeLink=*/true);
     }
     return false;
   }
-  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR: any other type
+  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // stands for all others
   return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
 }
 
-void FolderWalk::enter(std::string const& path, bool isLink) {
+void FolderWalk::enter(std::string const& path, bool mayBeLink) {
   std::unique_ptr<DIR, int (*)(DIR*)> const folder(::opendir(path.c_str()), ::closedir);
   struct stat status = {};
   if (!folder || ::fstat(::dirfd(folder.get()), &status) == -1) {
-    return miss(path, errno);
+    return setUnreadable(path, errno);
   }
   Identity const identity(status.st_dev, status.st_ino);
-  if (isRepeated(path, identity, isLink)) {
+  if (isRepeated(path, identity, mayBeLink)) {
     return;
   }
   Level level = {path.back() == '/' ? path : path + '/', identity, {}, {}};
@@ -98,29 +99,30 @@ void FolderWalk::enter(std::string const& path, bool isLink) {
   levels_.push_back(std::move(level));
 }
 
-bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool isLink) {
+bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool mayBeLink) {
   bool const isLoop = std::any_of(levels_.begin(), levels_.end(),
                                   [&](Level const& level) { return level.identity == identity; });
   if (isLoop) {
     report_(path, "symbolic-link loop, back to a folder above; skipped");
     return true;
   }
-  if (isLink && !linked_.insert(identity).second) {
+  if (mayBeLink && !linked_.insert(identity).second) {
     report_(path, "another symbolic link led to this folder before; skipped");
     return true;
   }
   return false;
 }
 
-bool FolderWalk::isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const {
+bool FolderWalk::isHidden(std::string_view name, bool isFolder) const {
   // On foreign file systems, macOS keeps some data about IMG.JPG in ._IMG.JPG: not a photo.
-  if (!filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_")) {
-    return true;
-  }
+  return !filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_");
+}
+
+bool FolderWalk::isExcluded(std::string const& folder, std::string_view name) const {
   return std::any_of(filter_.excluded.begin(), filter_.excluded.end(), [&](auto const& glob) {
-    bool const isOfPath = glob.find('/') != std::string::npos;
-    std::string const whole = (isOfPath ? folder : std::string()) + std::string(name);
-    return ::fnmatch(glob.c_str(), whole.c_str(), 0) == 0;
+    bool const isForPaths = glob.find('/') != std::string::npos;
+    std::string const candidate = (isForPaths ? folder : std::string()) + std::string(name);
+    return ::fnmatch(glob.c_str(), candidate.c_str(), 0) == 0;
   });
 }
 
@@ -131,14 +133,15 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
     unsigned char const type = entry->d_type;
     bool const isWanted = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN ||
                           isPhotoExtension(extensionOf(name));
-    if (isWanted && name != "." && name != ".." && !isLeftOut(level.path, name, type == DT_DIR)) {
+    if (isWanted && name != "." && name != ".." && !isHidden(name, type == DT_DIR) &&
+        !isExcluded(level.path, name)) {
       level.entries.push_back({level.names.size(), type});
       level.names.append(name).append(1, '\0');
     }
     errno = 0;
   }
   if (errno != 0) {
-    miss(level.path, errno);
+    setUnreadable(level.path, errno);
   }
   char const* const names = level.names.data();
   std::sort(level.entries.begin(), level.entries.end(), [names](Entry const& a, Entry const& b) {
@@ -146,10 +149,10 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
   });
 }
 
-void FolderWalk::miss(std::string const& path, int error) {
-  std::string const text =
+void FolderWalk::setUnreadable(std::string const& path, int error) {
+  std::string const why =
       "the folder cannot be read: " + reason::systemText(error) + "; its photos are missing";
-  missed_ = {path, false, {reason::kUnreadableFolder, text, -1, error}};
+  unreadable_ = {path, /*isPhoto=*/false, {reason::kUnreadableFolder, why, /*position=*/-1, error}};
 }
 
 }  // namespace app

@@ -17,8 +17,8 @@
 
 namespace app {
 
-/// Takes a path that is skipped, and why.
-using Report = std::function<void(std::string const& path, std::string const& why)>;
+/// Takes a path and a remark about it, such as why it is skipped.
+using Report = std::function<void(std::string const& path, std::string const& remark)>;
 
 /// What a walk leaves out, besides files that are not photos.
 struct Filter {
@@ -29,8 +29,8 @@ struct Filter {
 
 /// Finds the photos in a folder and its subfolders, in the order of their names' bytes. Symbolic
 /// links are followed; one that leads back to a folder above it, or to a folder that another link
-/// led to before, is reported and skipped. Of all entries, only those still to be visited in the
-/// current folder and the folders above it are kept in memory.
+/// led to before, is reported and skipped. Memory holds only the entries still to be visited in the
+/// current folder and in the folders above it.
 class FolderWalk {
  public:
   /// The filter must outlive it.
@@ -38,36 +38,37 @@ class FolderWalk {
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
-  bool isAtEnd() const { return !missed_ && levels_.empty(); }
+  bool isAtEnd() const { return !unreadable_ && levels_.empty(); }
   /// One step of `next`; false when it found nothing. Must not be called at the end.
   bool step(Input& input);
 
  private:
   using Identity = std::pair<dev_t, ino_t>;
   struct Entry {
-    std::size_t name;    // where it starts in `names`
+    std::size_t name;    // where it starts in the level's `names`
     unsigned char type;  // the system's, such as DT_REG
   };
   struct Level {
     std::string path;  // with a "/" at the end
     Identity identity;
     std::string names;           // each ends with a NUL
-    std::vector<Entry> entries;  // still to be visited, the last one first
+    std::vector<Entry> entries;  // still to be visited, from the back
   };
 
-  void enter(std::string const& path, bool isLink);
-  bool isRepeated(std::string const& path, Identity const& identity, bool isLink);
-  bool isLeftOut(std::string const& folder, std::string_view name, bool isFolder) const;
+  void enter(std::string const& path, bool mayBeLink);
+  bool isRepeated(std::string const& path, Identity const& identity, bool mayBeLink);  // reports it
+  bool isHidden(std::string_view name, bool isFolder) const;
+  bool isExcluded(std::string const& folder, std::string_view name) const;
   void readEntries(DIR* folder, Level& level);
-  void miss(std::string const& path, int error);
+  void setUnreadable(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);
   bool visitUnknown(std::string path, Input& input);
 
   Filter const& filter_;
   Report report_;
-  std::vector<Level> levels_;
-  std::set<Identity> linked_;    // folders that a symbolic link led to
-  std::optional<Input> missed_;  // a folder that cannot be read, to be found next
+  std::vector<Level> levels_;        // from the walked folder down to the current one
+  std::set<Identity> linked_;        // folders that a symbolic link led to
+  std::optional<Input> unreadable_;  // a folder, with its problem; the next step returns it
 };
 
 }  // namespace app

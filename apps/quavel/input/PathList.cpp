@@ -16,11 +16,11 @@ namespace {
 constexpr std::size_t kReadSize = std::size_t{1} << 16;
 constexpr std::size_t kMaxPathLength = 4096;  // Linux's PATH_MAX
 
-/// The `errno` of a read of 0 bytes, which fails for a folder, for example; 0 when it succeeds. So
-/// an error is reported before anything is written.
+/// Tries to read 0 bytes, so that a list that cannot be read, such as a folder, is reported before
+/// anything is written. Returns the `errno`, or 0 if the list can be read.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
-Input entryOf(std::string const& path) {
+Input inputFor(std::string const& path) {
   Input input;
   if (path.find('\0') != std::string::npos) {
     input.problem = {reason::kBadPath,
@@ -38,12 +38,12 @@ Input entryOf(std::string const& path) {
 PathList::PathList(std::string const& name, char separator)
     : fd_(name == "-" ? STDIN_FILENO : ::open(name.c_str(), O_RDONLY | O_CLOEXEC)),
       separator_(separator) {
-  int const problem = fd_ == -1 ? errno : whyUnreadable(fd_);
-  if (problem != 0) {
+  int const openError = fd_ == -1 ? errno : whyUnreadable(fd_);
+  if (openError != 0) {
     if (fd_ > STDIN_FILENO) {
       ::close(fd_);
     }
-    throw std::system_error(problem, std::generic_category());
+    throw std::system_error(openError, std::generic_category());
   }
 }
 
@@ -66,13 +66,13 @@ bool PathList::next(Input& input) {
   while (path.empty() && (start_ < buffer_.size() || refill())) {
     auto const end = buffer_.find(separator_, start_);
     if (end == std::string::npos && refill()) {
-      continue;  // the path goes on
+      continue;  // the path goes on in what was just read
     }
-    path = buffer_.substr(start_, end - start_);
+    path = buffer_.substr(start_, end - start_);  // all the rest if the last separator is missing
     start_ = end == std::string::npos ? buffer_.size() : end + 1;
   }
-  input = entryOf(path);
-  return !input.path.empty();
+  input = inputFor(path);
+  return !path.empty();
 }
 
 bool PathList::refill() {
@@ -81,8 +81,8 @@ bool PathList::refill() {
   }
   buffer_.erase(0, start_);
   start_ = 0;
-  if (buffer_.size() > 2 * kMaxPathLength) {
-    buffer_.resize(kMaxPathLength + 1);  // enough to tell that the path is too long
+  if (buffer_.size() > 2 * kMaxPathLength) {  // all of it one path, which is too long
+    buffer_.resize(kMaxPathLength + 1);       // enough for `inputFor` to see that
   }
   std::size_t const size = buffer_.size();
   buffer_.resize(size + kReadSize);

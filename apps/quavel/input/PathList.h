@@ -18,11 +18,11 @@ class PathList {
 
   /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
-  /// The next path that is not empty. False: the list has ended, and `error` is 0, or a read
-  /// failed, and `error` is its `errno`.
+  /// The next path that is not empty, with a problem if no file can have it. False: the list has
+  /// ended, or a read failed.
   bool next(Input& input);
 
-  int error = 0;
+  int error = 0;  ///< The `errno` of a read that failed.
 
  private:
   bool refill();
@@ -30,8 +30,8 @@ class PathList {
   int fd_;
   char separator_;
   std::string buffer_;
-  std::size_t start_ = 0;  // of the part not returned yet
-  bool atEnd_ = false;
+  std::size_t start_ = 0;  // in `buffer_`, of what `next` has not returned yet
+  bool atEnd_ = false;     // or a read failed
 };
 
 }  // namespace app

@@ -28,12 +28,11 @@ bool Source::nextOfPaths(Input& input) {
       }
       walk_.reset();
       if (isWalkEmpty_) {
-        std::string const extensions = whyUnknown({});
-        std::string const& folder = inputs_.paths[nextPath_ - 1];
-        report_(folder,
+        std::string const refusal = whyUnknown({});  // ends with ": " and the known extensions
+        report_(inputs_.paths[nextPath_ - 1],
                 "no photos found in it; hidden and excluded names are "
                 "skipped, and others must end in" +
-                    extensions.substr(extensions.rfind(':') + 1));
+                    refusal.substr(refusal.rfind(':') + 1));
       }
       continue;
     }
@@ -45,26 +44,25 @@ bool Source::nextOfPaths(Input& input) {
       isWalkEmpty_ = true;
       continue;
     }
-    bool const isFile = exists && S_ISREG(status.st_mode);
-    input = {path, isFile && isPhotoExtension(extensionOf(path)), {}};
+    bool const isRegular = exists && S_ISREG(status.st_mode);
+    input = {path, isRegular && isPhotoExtension(extensionOf(path)), {}};
     return true;
   }
   return false;
 }
 
-/// Drops the CR that a list from another system leaves at the end of a path, unless it belongs to
-/// the file's name. True: the line is now empty.
-bool Source::dropCarriageReturn(std::string& path) {
+/// Drops the CR that lists from other systems have after each path, unless a file's name has it.
+void Source::dropCarriageReturn(std::string& path) {
   struct stat status = {};
-  if (path.back() != '\r' || ::lstat(path.c_str(), &status) == 0) {
-    return false;
+  bool const mayDrop = !inputs_.isNulSeparated && path.back() == '\r';
+  if (!mayDrop || ::lstat(path.c_str(), &status) == 0) {
+    return;
   }
   path.pop_back();
   if (!hasCrlf_) {
     report_(inputs_.list, "its lines end with CRLF; each CR counts as part of the line end");
     hasCrlf_ = true;
   }
-  return path.empty();
 }
 
 bool Source::nextOfList(Input& input) {
@@ -72,15 +70,18 @@ bool Source::nextOfList(Input& input) {
     return false;
   }
   while (list_->next(input)) {
-    if (inputs_.isNulSeparated || !dropCarriageReturn(input.path)) {
+    dropCarriageReturn(input.path);
+    if (!input.path.empty()) {
       return true;
     }
   }
-  int const error = list_->error;  // if it is 0, nobody looks at the input below
+  int const error = list_->error;
   list_.reset();
-  input = {inputs_.list,
-           false,
-           {reason::kUnreadableList, "reading the list fails: " + reason::systemText(error)}};
+  if (error != 0) {
+    input.path = inputs_.list;
+    input.problem = {reason::kUnreadableList,
+                     "reading the list fails: " + reason::systemText(error)};
+  }
   return error != 0;
 }
 

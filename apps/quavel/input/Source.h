@@ -26,20 +26,20 @@ class Source {
 
   /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
-  /// The next file. False: there are no more.
+  /// The next file, or a folder or list that cannot be read, with its problem. False: the end.
   bool next(Input& input);
 
  private:
   bool nextOfPaths(Input& input);
   bool nextOfList(Input& input);
-  bool dropCarriageReturn(std::string& path);
+  void dropCarriageReturn(std::string& path);
 
   Inputs const& inputs_;
   Report report_;
   std::size_t nextPath_ = 0;
-  std::optional<FolderWalk> walk_;
-  bool isWalkEmpty_ = true;
-  bool hasCrlf_ = false;  // the lines of the list end with CR LF
+  std::optional<FolderWalk> walk_;  // of the folder at `nextPath_ - 1`
+  bool isWalkEmpty_ = true;         // so far
+  bool hasCrlf_ = false;            // the lines of the list end with CR LF
   std::optional<PathList> list_;
 };
 

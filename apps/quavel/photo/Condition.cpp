@@ -7,7 +7,6 @@
 #include <stdexcept>
 #include <system_error>
 #include <type_traits>
-#include <utility>
 
 #include "photo/Words.h"
 
@@ -35,12 +34,12 @@ constexpr Relation kRelations[] = {
     {"!=", meets<std::not_equal_to<>>},  {"==", meets<std::equal_to<>>},
     {"=", meets<std::equal_to<>>},       {">", meets<std::greater<>>},
     {"<", meets<std::less<>>},           {"~", containsText}};
-// By the index of the type in Words.
+// What a value must be, by the index of its type in Words.
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// The whole text as a value of a field's type; absent when it is not such a value.
-struct Parsed {
+/// Parses the whole text as the type that a field's function takes; absent if it is no such value.
+struct ParseFor {
   std::string_view text;
 
   template <class T>
@@ -62,8 +61,8 @@ struct Parsed {
 /// Dates compare alike in every notation: as files have them, as people see them and in ISO 8601.
 Value comparable(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
-  auto const* const words = std::get_if<std::string (*)(std::string const&)>(&field.words);
-  if (text != nullptr && words != nullptr && *words == words::date) {
+  auto const* const function = std::get_if<std::string (*)(std::string const&)>(&field.words);
+  if (text != nullptr && function != nullptr && *function == words::date) {
     std::replace(text->begin(), text->end(), ':', '-');
     std::replace(text->begin(), text->end(), 'T', ' ');
   }
@@ -84,7 +83,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
       });
   bool const isKnown = relation != std::end(kRelations);
   std::string_view text = comparison.substr(isKnown ? relation->sign.size() : 0);
-  if (!isKnown || text.find_first_of(kSigns) == 0) {
+  if (!isKnown || text.find_first_of(kSigns) == 0) {  // a second sign, as in "=>5"
     refuse(whole, "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
   }
   text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));  // leading blanks
@@ -92,7 +91,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
     refuse(whole, "lacks the value to compare with");
   }
   isMet_ = relation->isMet;
-  wanted_ = comparable(field, std::visit(Parsed{text}, field.words));
+  wanted_ = comparable(field, std::visit(ParseFor{text}, field.words));
   if (std::holds_alternative<std::monostate>(wanted_)) {
     refuse(text, std::string("is not ") + kTypes[field.words.index()]);
   }

@@ -11,7 +11,7 @@ namespace app {
 /// A comparison that the photos shown must meet.
 class Condition {
  public:
-  /// What may begin the comparison after a field's name.
+  /// The characters that may begin a comparison, and so end the field's name before it.
   static constexpr char kSigns[] = "<>=!~";
 
   /// `comparison` is a relation and a value, such as ">=3200". If it is malformed or does not suit

@@ -16,11 +16,11 @@ namespace {
 using quavel::QVMetadata;
 
 constexpr std::size_t kMaxCells = 200;
-constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // since combining marks take no cells
+constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // combining marks take bytes, but no cells
 
-/// A member of a record or a problem; absent when it holds the value that means absence there.
+/// A member's value; absent when the member holds -1, NaN or an empty text, which stand for that.
 template <class T>
-Value present(T value) {
+Value presentOrAbsent(T value) {
   if constexpr (std::is_same_v<T, std::string>) {
     return value.empty() ? Value() : Value(textAsUtf8(std::move(value)));
   } else if constexpr (std::is_same_v<T, float>) {
@@ -34,18 +34,18 @@ Value present(T value) {
 
 template <auto member>
 Value valueOf(Outcome const& outcome) {
-  return outcome.record ? present((*outcome.record).*member) : Value();
+  return outcome.record ? presentOrAbsent((*outcome.record).*member) : Value();
 }
 
 Value captureDate(Outcome const& outcome) {
-  return outcome.record ? present(outcome.record->captureDate()) : Value();
+  return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The same, but never a blank date, which the record itself may choose.
+/// The same, but skips blank dates; QVMetadata::captureDate does not.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
-      return present(*date);
+      return presentOrAbsent(*date);
     }
   }
   return {};
@@ -54,11 +54,11 @@ Value usableCaptureDate(QVMetadata const& record) {
 Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 
 template <auto member>
-Value problem(Outcome const& outcome) {
-  return present(outcome.problem.*member);
+Value valueOfProblem(Outcome const& outcome) {
+  return presentOrAbsent(outcome.problem.*member);
 }
 
-/// The bytes in hexadecimal of a path that is not valid UTF-8.
+/// The bytes in hexadecimal of a path that is not valid UTF-8; absent for other paths.
 Value pathBytes(Outcome const& outcome) {
   if (isPlain(outcome.path) || pathAsUtf8(outcome.path) == outcome.path) {
     return {};
@@ -79,8 +79,8 @@ std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-/// Puts a value that is not absent into words.
-struct Said {
+/// Puts a value, which must not be absent, into words by the function of a field.
+struct PutIntoWords {
   Value const& value;
   template <class T>
   std::string operator()(std::string (*words)(T)) const {
@@ -135,9 +135,9 @@ std::vector<Field> const& allFields() {
       {"focalLengthIn35mmFilm", "In 35 mm film", valueOf<&M::focalLengthIn35mmFilm>, millimetres},
       {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, words::exposureTime},
       {"fNumber", "F-number", valueOf<&M::fNumber>, words::fNumber},
-      {"error", "Error", problem<&Problem::text>, plain},
-      {"reason", "Reason", problem<&Problem::reason>, plain},
-      {"position", "At byte", problem<&Problem::position>, bytes},
+      {"error", "Error", valueOfProblem<&Problem::text>, plain},
+      {"reason", "Reason", valueOfProblem<&Problem::reason>, plain},
+      {"position", "At byte", valueOfProblem<&Problem::position>, bytes},
       {"pathBytes", "File (hex)", pathBytes, plain},
   };
   return fields;
@@ -170,7 +170,7 @@ std::string inWords(Field const& field, Outcome const& outcome) {
   if (isAbsent(value)) {
     return {};
   }
-  std::string text = std::visit(Said{value}, field.words);
+  std::string text = std::visit(PutIntoWords{value}, field.words);
   text.erase(text.find_last_not_of(' ') + 1);  // cameras pad their texts
   return keepStart(escaped(text), kMaxCells, kMaxBytes);
 }

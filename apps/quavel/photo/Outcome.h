@@ -31,15 +31,14 @@ struct Input {
 /// The result of reading one file.
 struct Outcome {
   std::string path;
-  /// Null when there is none, or it is no longer needed.
-  std::shared_ptr<quavel::QVMetadata> record;
-  Problem problem;                    ///< Why there is no record.
-  char const* format = "";            ///< As the journal gives it.
-  std::vector<quavel::QVNote> notes;  ///< Empty unless they are wanted.
-  std::uint64_t furtherSteps = 0;     ///< How many steps the notes leave out.
-  bool isShown = true;                ///< It meets all conditions.
-  std::string text;                   ///< The output for it in the chosen form, once prepared.
-  std::vector<std::string> cells;     ///< The same for the table.
+  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: there is none, or it was dropped.
+  Problem problem;                             ///< Why there is no record.
+  char const* format = "";                     ///< As the journal gives it.
+  std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
+  std::uint64_t furtherSteps = 0;              ///< How many steps the notes leave out.
+  bool isShown = true;                         ///< It meets all conditions.
+  std::string text;                            ///< Its output in the chosen form, once prepared.
+  std::vector<std::string> cells;              ///< The same for the table.
 };
 
 }  // namespace app

@@ -20,14 +20,14 @@ namespace {
 using quavel::QVJournal;
 
 constexpr std::size_t kDateSize = 19;
-constexpr std::size_t kMaxInput = std::size_t{1} << 30;
+constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
 Problem irregular(mode_t mode) {
   if (S_ISDIR(mode)) {
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
-  char const* const other = S_ISSOCK(mode) ? "socket" : "device";
-  char const* const kind = S_ISFIFO(mode) ? "FIFO" : other;
+  char const* const socketOrDevice = S_ISSOCK(mode) ? "socket" : "device";
+  char const* const kind = S_ISFIFO(mode) ? "FIFO" : socketOrDevice;
   return {reason::kSpecialFile,
           std::string("a ") + kind + ", not a regular file; give a photo, or use --stdin"};
 }
@@ -70,12 +70,13 @@ bool isDate(std::string const& text) {
   day.tm_mon = time.tm_mon;
   day.tm_mday = time.tm_mday;
   ::timegm(&day);  // turns a day that does not exist, such as 30 February, into a later one
+  bool const isWhole = text.size() == kDateSize && end == text.c_str() + kDateSize;
   // strptime accepts any number of blanks before a number.
-  return text.size() == kDateSize && end == text.c_str() + kDateSize && text.find(' ') == 10 &&
-         text.rfind(' ') == 10 && day.tm_mday == time.tm_mday && time.tm_sec <= 60;
+  bool const hasOneBlank = text.find(' ') == 10 && text.rfind(' ') == 10;
+  return isWhole && hasOneBlank && day.tm_mday == time.tm_mday && time.tm_sec <= 60;
 }
 
-/// Fills the outcome with what `read` gives, unless there is a problem already or `read` sets one.
+/// Calls `read` to fill the outcome, unless it has a problem. `read` itself may set a problem.
 template <class Read>
 void fill(Outcome& outcome, Detail detail, Read read) {
   if (outcome.problem) {
@@ -109,8 +110,8 @@ std::string extensionOf(std::string_view path) {
 }
 
 bool isPhotoExtension(std::string const& extension) {
-  static quavel::QVReader const library("");
-  // The library answers by making a record, too expensive for each name in a large folder.
+  static quavel::QVReader const library("");  // reads no file; is only asked for formats
+  // `createMetadata` makes a record, which is too expensive for each name in a large folder.
   thread_local std::unordered_set<std::string> known;
   if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
     known.insert(extension);
@@ -123,7 +124,7 @@ std::string whyUnknown(std::string const& extension) {
     return {};
   }
   QVJournal journal(Detail::Refusals);
-  journal.read(nullptr, 0, extension);
+  journal.read(nullptr, 0, extension);  // refused for its extension, before the bytes matter
   return journal.refusal()->text;
 }
 

@@ -11,7 +11,6 @@ namespace {
 using quavel::QVJournal;
 using quavel::QVReason;
 
-/// What the owner can do about a system's error.
 char const* advice(int error) {
   switch (error) {
     case ENOENT:
@@ -30,7 +29,7 @@ char const* advice(int error) {
   }
 }
 
-/// What a reason means, to be put before the facts; empty when the facts alone are clear.
+/// What to put before the text of a refusal; empty when the text is clear by itself.
 char const* leadOf(QVReason reason) {
   switch (reason) {
     case QVReason::ReadError:
@@ -59,13 +58,13 @@ char const* leadOf(QVReason reason) {
 std::string systemText(int error) { return std::generic_category().message(error); }
 
 Problem cannotOpen(int error) {
-  return {QVJournal::reasonName(QVReason::CannotOpen),
-          "the file cannot be opened: " + systemText(error) + advice(error), -1, error};
+  std::string const text = "the file cannot be opened: " + systemText(error) + advice(error);
+  return {QVJournal::reasonName(QVReason::CannotOpen), text, /*position=*/-1, error};
 }
 
 Problem cannotRead(int error) {
-  return {QVJournal::reasonName(QVReason::ReadError),
-          "cannot be read: " + systemText(error) + advice(error), -1, error};
+  std::string const text = "cannot be read: " + systemText(error) + advice(error);
+  return {QVJournal::reasonName(QVReason::ReadError), text, /*position=*/-1, error};
 }
 
 Problem failure(std::exception const& error) {

@@ -21,14 +21,13 @@ inline constexpr char kTooLong[] = "too-long";
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 
-/// The system's text for an error number.
 std::string systemText(int error);
 
 Problem cannotOpen(int error);
 Problem cannotRead(int error);
-/// For an exception thrown during the read.
+/// For an exception thrown while the file was read or its output was made.
 Problem failure(std::exception const& error);
-/// The library's refusal. Its text first says so when the file is plainly of another kind.
+/// The library's refusal. If the file looks like another format, the text says that first.
 Problem refusal(quavel::QVJournal const& journal);
 
 }  // namespace app::reason

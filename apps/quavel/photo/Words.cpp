@@ -15,7 +15,7 @@ std::string decimal(float value, int digits) {
   }
   char text[32];
   if (std::fabs(value) >= 1e7F) {
-    std::snprintf(text, sizeof text, "%g", static_cast<double>(value));
+    std::snprintf(text, sizeof text, "%g", static_cast<double>(value));  // as "1e+07"
     return text;
   }
   std::snprintf(text, sizeof text, "%.*f", digits, static_cast<double>(value));
@@ -27,7 +27,7 @@ std::string decimal(float value, int digits) {
   return result == "-0" ? "0" : result;
 }
 
-/// The name of a value; `names[0]` is that of the value `first`.
+/// The name of a value; `names` begins with the name of the value `first`.
 template <std::size_t count>
 std::string named(char const* const (&names)[count], std::int32_t value, std::int32_t first = 0) {
   if (value < first || static_cast<std::size_t>(value - first) >= count) {
@@ -56,7 +56,7 @@ std::string orientation(std::int32_t value) {
   static constexpr char const* kNames[] = {"upright",         "mirrored",         "turn 180",
                                            "mirrored, 180",   "mirrored, 270 CW", "turn 90 CW",
                                            "mirrored, 90 CW", "turn 270 CW"};
-  return named(kNames, value, 1);
+  return named(kNames, value, /*first=*/1);
 }
 
 std::string meteringMode(std::int32_t value) {
@@ -72,7 +72,7 @@ std::string whiteBalance(std::int32_t value) {
 
 std::string exposureTime(float seconds) {
   bool const isTiny = seconds <= 1e-6F;
-  // Cameras show the fraction up to 1/4 s and decimals from 0.3 s on.
+  // As on cameras: a fraction up to 1/4 s, decimals from 0.3 s on.
   if (!isTiny && seconds < 0.26F) {
     return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";
   }
