@@ -62,6 +62,12 @@ TEST(LargeFile, IsWalkedAsFarAsOffsetsReach) {
   QVJournal journal;
   expectRecord(journal, journal.read(file.path), "none");
 
+  std::uint32_t const last = 0x7feffff0;  // offsets of 32 bits end before a directory that is here
+  TemporaryFile const atTheEnd("II*" + Bytes(1, '\0') + u32(kII, last), "tif");
+  std::fstream(atTheEnd.path, std::ios::in | std::ios::out | std::ios::binary).seekp(last)
+      << loose({{longs(kWidth, 42), longs(kMakerNote, 7)}});
+  expectRecord(journal, journal.read(atTheEnd.path), kIsLongLong ? "width=42" : "none");
+
   auto const stream = streamOf("\xff\xd8" + sof0());
   stream->baseOffset = -0x7ff00000;  // what follows is at the end of 32-bit offsets
   expectRecord(journal, journal.read(stream, "jpg"),

@@ -1,6 +1,7 @@
 #include <cerrno>
 #include <stdexcept>
 
+#include "journal/Words.h"
 #include "support/Checks.h"
 
 namespace quavel::test {
@@ -218,6 +219,7 @@ TEST(Notes, AreFewWhateverTheFileHolds) {
   EXPECT_FALSE(journal.read(dataOf(bytes), bytes.size(), "tif"));
   EXPECT_EQ(journal.notes().size(), 8 + 8 + 1U);  // steps, hints and the refusal
   EXPECT_EQ(journal.furtherSteps(), 22 - 8U);     // of a header and 21 directories
+  EXPECT_EQ(detail::composed("{}{}", {Bytes(300, 'x'), Bytes(300, 'y')}).size(), 500U);
 }
 
 TEST(Journal, TellsWhyAFileOnDiskCannotBeRead) {

@@ -114,15 +114,16 @@ TEST(Metadata, TakesWhatAHostsDirectoryHas) {
 }
 
 TEST(Metadata, RefusesWhatAHostsDirectoryHasWrong) {
-  auto const stores = [](auto&& record, Field const& field) {
+  auto const stores = [](auto&& record, Directory const& directory) {
     auto const ifd = std::make_shared<QVTiffImageFileDirectory>();
-    auto stream = streamOf(tiff(kMM, {{longs(kWidth, 160), field}}), kMM, 8);
+    auto stream = streamOf(tiff(kMM, directory), kMM, 8);
     return ifd->read(stream, {}) && record.storeInfoFromMainIFD(ifd);
   };
-  EXPECT_FALSE(stores(QVRafImage(), shorts(kLength, 1, 2)));
-  EXPECT_FALSE(stores(QVRafImage(), shorts(kOrientation, 1, 2)));
-  EXPECT_FALSE(stores(QVNefImage(), longs(kLength, 106)));
-  EXPECT_TRUE(stores(QVNefImage(), longs(kLength, 120)));
+  for (std::uint16_t const tag : {kWidth, kLength, kOrientation}) {
+    EXPECT_FALSE(stores(QVRafImage(), {{shorts(tag, 1, 2)}})) << tag;
+  }
+  EXPECT_FALSE(stores(QVNefImage(), {{longs(kWidth, 160), longs(kLength, 106)}}));
+  EXPECT_TRUE(stores(QVNefImage(), {{longs(kWidth, 160), longs(kLength, 120)}}));
 }
 
 TEST(Metadata, PrefersTheOriginalDate) {

@@ -173,6 +173,13 @@ TEST(ReadAheadStream, TakesWhatIsWholeFromASourceThatMisbehaves) {
   stream.setOffset(0x10000000);
   stream.baseOffset = 0;
   EXPECT_EQ(stream.getOffset(), 998);  // it stays where the source refuses to go
+  auto const refuses = std::exchange(source->onSeek, nullptr);
+  stream.baseOffset = 0x70000000;
+  stream.setOffset(0x10000000);
+  source->onSeek = refuses;  // by now
+  EXPECT_TRUE(std::isnan(next(stream, &QVStream::readShort)));
+  source->onSeek = nullptr;
+  stream.baseOffset = 0;
 
   source->onRead = nullptr;
   EXPECT_EQ(at(3), 0x789a);
