@@ -6,35 +6,45 @@
 
 namespace quavel::detail {
 
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header) {
+namespace {
+
+/// For a size smaller than a box header: what the standard means by it, if anything.
+char const* meaningOf(std::uint32_t size) {
+  if (size == 0) {
+    return " (0 stands for \"to the end of the file\", which is not read)";
+  }
+  return size == 1 ? " (1 stands for a 64-bit size, which is not read)" : "";
+}
+
+}  // namespace
+
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
   long const start = stream->getOffset();
   std::int64_t const position = stream->baseOffset + start;
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
-  if (start > kLastOffset || !header.read(stream)) {
-    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", place);
+  // From the last box, `leaveBox` may have gone to an offset at which no read may start.
+  bool const isInReach = start <= kLastOffset;
+  if (!isInReach || !header.read(stream)) {
+    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", context);
   }
-  // With a smaller size, the walk would stay where it is or read the header again as a box. The
-  // standard gives 0 and 1 a meaning, but no metadata follows such a box.
+  // A smaller size would leave the walk where it is, or inside this header. The standard gives 0
+  // and 1 a meaning, but no metadata follows such a box.
   if (header.boxSize < box::kHeaderSize) {
-    char const* const meaningOf1 =
-        header.boxSize == 1 ? " (1 stands for a 64-bit size, which is not read)" : "";
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
-                  PlacedBox{header.boxType, position}, place, header.boxSize,
-                  header.boxSize == 0
-                      ? " (0 stands for \"to the end of the file\", which is not read)"
-                      : meaningOf1);
+                  PlacedBox{header.boxType, position}, context, header.boxSize,
+                  meaningOf(header.boxSize));
   }
   leaveBox(*stream, endOfBox(start, header));
   return true;
 }
 
 long endOfBox(long start, QVCR3BoxHeader const& header) {
-  constexpr std::int64_t kMost = std::numeric_limits<long>::max();
-  return static_cast<long>(std::min(std::int64_t{start} + header.boxSize, kMost));
+  constexpr std::int64_t kLargestLong = std::numeric_limits<long>::max();
+  return static_cast<long>(std::min(std::int64_t{start} + header.boxSize, kLargestLong));
 }
 
 void append(std::string& out, PlacedBox box) {
@@ -46,10 +56,10 @@ void append(std::string& out, PlacedBox box) {
   append(out, Offset{box.position});
 }
 
-void append(std::string& out, BoxPlace place) {
-  out += place.text;
-  if (place.parent.type != 0) {
-    append(out, place.parent);
+void append(std::string& out, BoxContext context) {
+  out += context.text;
+  if (context.parent.type != 0) {
+    append(out, context.parent);
   }
 }
 

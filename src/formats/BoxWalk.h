@@ -24,22 +24,22 @@ struct PlacedBox {
 };
 void append(std::string& out, PlacedBox box);
 
-/// Where a box lies, in a note: "in the moov box at 0x18 (24)".
-struct BoxPlace {
-  char const* text;
-  PlacedBox parent = {};  ///< Appended to the text, unless its type is 0.
+/// Where a box was met, as a note says it after the box: " in the moov box at 0x18 (24)".
+struct BoxContext {
+  char const* text = "";
+  PlacedBox parent = {};  ///< Appended to the text; type 0: there is none.
 };
-void append(std::string& out, BoxPlace place);
+void append(std::string& out, BoxContext context);
 
 /// Reads the box header at the stream's position and moves past the box. False: the header cannot
 /// be read, the size in it is smaller than the header itself, or there are too many boxes.
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxPlace place, QVCR3BoxHeader& header);
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3BoxHeader& header);
 
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box. If that has no offset, the stream goes to `kOutOfReach`, which is
-/// less than the ends of the boxes around it, so that the walk over them goes on and is refused.
+/// Moves to the end of a box, or to `kOutOfReach` if no offset reaches it. That is still before the
+/// ends of the boxes around it, so the walks over these try to read another box and are refused.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

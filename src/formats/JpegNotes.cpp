@@ -6,9 +6,9 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;
-  notePassed(journal, position, "end of the data at {}, where the walk ends",
-             Offset{size < 0 ? position : std::min(position, size)});
+  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;  // -1: not known
+  std::int64_t const end = size < 0 ? position : std::min(position, size);
+  notePassed(journal, position, "end of the data at {}, where the walk ends", Offset{end});
 }
 
 void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
@@ -20,7 +20,7 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
              hasWidth && hasHeight
                  ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
                  : "{} does not give both sides",
-             // As the file has them: an `int` above 2^31 would be negative.
+             // As the file has them: sides from 2^31 on are negative as an `int`.
              placed(exifIFD), static_cast<std::uint32_t>(width),
              static_cast<std::uint32_t>(height));
 }
@@ -30,11 +30,11 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
     return;
   }
   // What `noteSize` said of the last Exif directory; the note made here replaces it.
-  QVNote const* const ofExif = journal->absenceOf("width");
-  std::string const exifText = ofExif == nullptr ? "no Exif IFD gives a size" : ofExif->text;
+  QVNote const* const exifNote = journal->absenceOf("width");
+  std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =
       walk.sawSOF0 ? composed("the SOF0 segment at {} declares {} x {}",
-                              {Offset{walk.frame}, walk.frameWidth, walk.frameHeight})
+                              {Offset{walk.sof0}, walk.frameWidth, walk.frameHeight})
                    : "no baseline frame (SOF0) was met";
   noteAbsent(journal, {"width", "height"}, QVReason::NotInFile, "{}; {}", frameText, exifText);
   if (!walk.sawExif) {
@@ -46,16 +46,16 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
 }
 
 void QVJPEGImage::noteHints(Journal* journal, WalkState const& walk) {
-  if (walk.otherFrame >= 0) {
-    noteHint(journal, QVReason::NotBaseline, walk.otherFrame,
+  if (walk.sof2 >= 0) {
+    noteHint(journal, QVReason::NotBaseline, walk.sof2,
              "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
-             Offset{walk.otherFrame});
+             Offset{walk.sof2});
   }
-  if (walk.scan >= 0) {
-    noteHint(journal, QVReason::PictureData, walk.scan,
+  if (walk.firstScan >= 0) {
+    noteHint(journal, QVReason::PictureData, walk.firstScan,
              "No {} was met before the scan at {}; the walk goes on through the picture data and "
              "takes it for segments",
-             walk.missingAtScan, Offset{walk.scan});
+             walk.missingAtScan, Offset{walk.firstScan});
   }
 }
 

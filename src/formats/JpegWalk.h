@@ -14,12 +14,12 @@ struct QVJPEGImage::WalkState {
   bool sawExif = false;
   unsigned short frameWidth = 0;   ///< The greatest that an SOF0 segment has declared.
   unsigned short frameHeight = 0;  ///< Likewise.
-  std::int64_t next = 0;           ///< Where the next segment begins, as an offset of the stream.
+  std::int64_t nextOffset = 0;     ///< Where the next segment begins, as an offset of the stream.
   std::int64_t start = 0;          ///< Where the segment being read begins.
-  std::int64_t frame = -1;         ///< The first SOF0 segment, or the last with a greater side.
-  std::int64_t otherFrame = -1;    ///< The last SOF2 segment before the scan.
-  std::int64_t scan = -1;          ///< The first SOS segment.
-  char const* missingAtScan = "";  ///< Which segments were not met before `scan`.
+  std::int64_t sof0 = -1;          ///< The first SOF0 segment, or a later one with a greater side.
+  std::int64_t sof2 = -1;          ///< The last SOF2 segment before the scan.
+  std::int64_t firstScan = -1;     ///< The first SOS segment.
+  char const* missingAtScan = "";  ///< Which segments were not met before that.
 };
 
 namespace detail {

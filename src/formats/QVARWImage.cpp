@@ -1,7 +1,6 @@
 #include "quavel/QVARWImage.h"
 
 #include "formats/Steps.h"
-#include "quavel/QVStream.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -13,7 +12,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
   auto const mainIFD =
-      readFirstDirectory(stream, nullptr, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
+      readFirstDirectory(stream, kWholeFile, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
@@ -30,8 +29,8 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return true;
   }
   DirectoryPointer rawIFD;
-  if (!readSubIFD(stream, mainIFD, 0, {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength},
-                  rawIFD)) {
+  if (!readSubIFD(stream, mainIFD, /*index=*/0,
+                  {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength}, rawIFD)) {
     return false;
   }
   return !rawIFD || storeInfoFromSubIFD0(rawIFD);

@@ -1,7 +1,6 @@
 #include "quavel/QVCR3Box.h"
 
 #include "formats/BoxWalk.h"
-#include "quavel/QVCR3BoxHeader.h"
 
 namespace quavel {
 
@@ -10,7 +9,7 @@ QVCR3Box::~QVCR3Box() = default;
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
   detail::ReadScope const scope(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
-  return detail::stepOverBox(stream, {""}, *boxHeader);
+  return detail::stepOverBox(stream, /*context=*/{}, *boxHeader);
 }
 
 std::shared_ptr<QVCR3BoxHeader> QVCR3Box::header() const { return boxHeader; }

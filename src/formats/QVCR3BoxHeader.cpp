@@ -3,14 +3,13 @@
 #include <array>
 
 #include "formats/BoxTypes.h"
-#include "quavel/QVStream.h"
 #include "stream/Bytes.h"
 
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // Both numbers in one read, since walks do little but read headers. A size whose type is cut off
-  // is stored, as if the numbers were read one after the other.
+  // One read for both numbers, since walks do little but read headers. If the data ends within the
+  // type, the size is stored all the same.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);

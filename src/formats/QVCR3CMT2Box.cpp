@@ -70,7 +70,7 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
 }
 
 // APEX values are base-2 logarithms (Exif, annex C): the f-number is 2^(Av/2), the exposure time is
-// 2^-Tv seconds. NaN stays NaN.
+// 2^-Tv seconds. Of an absent value, which is NaN, the result is NaN too.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {

@@ -4,12 +4,6 @@
 
 #include "formats/BoxTypes.h"
 #include "formats/BoxWalk.h"
-#include "quavel/QVCR3BoxHeader.h"
-#include "quavel/QVCR3CMT1Box.h"
-#include "quavel/QVCR3CMT2Box.h"
-#include "quavel/QVCR3MoovBox.h"
-#include "quavel/QVCR3UUIDBox.h"
-#include "quavel/QVStream.h"
 
 namespace quavel {
 
@@ -22,14 +16,14 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
-    BoxPlace const place = {" before a moov box was met"};
-    if (!stepOverBox(stream, place, header)) {
+    BoxContext const context = {" before a moov box was met"};
+    if (!stepOverBox(stream, context, header)) {
       return false;
     }
     PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};
     notePassed(scope.reading().journal, found.position, "{}: {} bytes", found, header.boxSize);
     if (found.type == box::Moov) {
-      stream->setOffset(boxStart);
+      stream->setOffset(boxStart);  // `moov.read` begins at the header
       QVCR3MoovBox moov;
       return moov.read(stream) && storeInfoFromMoov(*stream, moov, found.position);
     }
@@ -79,7 +73,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  // A CMT1 box leaves these two dates empty, but a host's class derived from it may fill them.
+  // A CMT1 box always leaves these two dates empty.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

@@ -2,9 +2,6 @@
 
 #include "formats/BoxTypes.h"
 #include "formats/BoxWalk.h"
-#include "quavel/QVCR3BoxHeader.h"
-#include "quavel/QVCR3UUIDBox.h"
-#include "quavel/QVStream.h"
 
 namespace quavel {
 
@@ -31,10 +28,10 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
-  BoxPlace const place = {" in the ", {box::Moov, stream->baseOffset + start}};
+  BoxContext const context = {" in the ", {box::Moov, stream->baseOffset + start}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (!stepOverBox(stream, place, child)) {
+    if (!stepOverBox(stream, context, child)) {
       return false;
     }
     if (child.boxType != box::Uuid) {

@@ -2,10 +2,6 @@
 
 #include "formats/BoxTypes.h"
 #include "formats/BoxWalk.h"
-#include "quavel/QVCR3BoxHeader.h"
-#include "quavel/QVCR3CMT1Box.h"
-#include "quavel/QVCR3CMT2Box.h"
-#include "quavel/QVStream.h"
 
 namespace quavel {
 
@@ -13,6 +9,7 @@ using namespace detail;
 
 namespace {
 
+/// Reads the child that begins at `start`, in place of the one kept before, if any.
 template <class MetadataBox>
 bool readKeptChild(std::shared_ptr<QVStream>& stream, long start,
                    std::shared_ptr<MetadataBox>& kept) {
@@ -53,10 +50,10 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  BoxPlace const place = {" in the metadata ", {box::Uuid, position_}};
+  BoxContext const context = {" in the metadata ", {box::Uuid, position_}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (!stepOverBox(stream, place, child)) {
+    if (!stepOverBox(stream, context, child)) {
       return false;
     }
     std::uint32_t const type = child.boxType;
@@ -69,7 +66,7 @@ bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
       return false;
     }
     if (cmt1Box && cmt2Box) {
-      return true;
+      return true;  // the other children hold none of the record's fields
     }
   }
   return true;

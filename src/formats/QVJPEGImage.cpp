@@ -6,7 +6,6 @@
 
 #include "formats/JpegWalk.h"
 #include "formats/Steps.h"
-#include "quavel/QVStream.h"
 #include "stream/Bytes.h"
 #include "tiff/Tags.h"
 
@@ -24,16 +23,17 @@ constexpr unsigned short kSOS = 0xffda;
 constexpr unsigned short kAPP1 = 0xffe1;
 
 // A segment's length counts its own two bytes but not the marker's.
+constexpr std::int64_t kMarkerSize = 2;
 constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
-// With a side of up to this many pixels, the size in the Exif directory is taken for a thumbnail's.
+// An Exif directory's size with a side of up to this many pixels is taken for a thumbnail's.
 constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// Bytes to skip after these markers, of which no length is read. A constant, so that readers work
-// even before the public map below is initialised.
+// No length is read after these markers; so many bytes are skipped instead. A constant, so that
+// readers work even before the public map below is initialised.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -51,7 +51,7 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
 /// Moves to the next segment. False: no read may start there.
 bool seekNext(QVStream& stream, std::int64_t offset) {
   return seek(stream, offset) || refuseCut(journalOf(stream), stream.baseOffset + offset,
-                                           sizeof(kSOI), "the marker of the next segment");
+                                           kMarkerSize, "the marker of the next segment");
 }
 
 }  // namespace
@@ -67,7 +67,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   std::int64_t const start = notedPosition(journal, *stream);
   unsigned short marker = 0;
   if (!stream->readShort(&marker)) {
-    return refuseCut(journal, start, sizeof(marker), "the SOI marker");
+    return refuseCut(journal, start, kMarkerSize, "the SOI marker");
   }
   if (marker != kSOI) {
     return refuse(journal, QVReason::OtherKind, start,
@@ -85,7 +85,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
       break;
     }
     if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk) ||
-        !seekNext(*stream, walk.next)) {
+        !seekNext(*stream, walk.nextOffset)) {
       noteHints(journal, walk);
       return false;
     }
@@ -101,38 +101,39 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
                               WalkState& walk) {
   for (auto const& [skippedMarker, skip] : kFixedSkips) {
     if (marker == skippedMarker) {
-      walk.next = std::int64_t{stream->getOffset()} + skip;
+      walk.nextOffset = std::int64_t{stream->getOffset()} + skip;
       return true;
     }
   }
 
   unsigned short length = 0;
   if (!stream->readShort(&length)) {
-    return refuseCut(journalOf(*stream), walk.start + std::int64_t{sizeof(marker)}, sizeof(length),
+    return refuseCut(journalOf(*stream), walk.start + kMarkerSize, kLengthSize,
                      "the length of the segment {} at {}", HexCode{marker}, Offset{walk.start});
   }
-  walk.next = std::int64_t{stream->getOffset()} + length - kLengthSize;
+  walk.nextOffset = std::int64_t{stream->getOffset()} + length - kLengthSize;
   if (marker == kAPP1 && !readAPP1(stream, walk)) {
     return false;
   }
   if (marker == kSOF0 && !readSOF0(stream, walk)) {
     return false;
   }
-  if (marker == kSOS && walk.scan < 0) {
-    walk.scan = walk.start;
-    char const* const withoutAPP1 = walk.sawSOF0 ? "APP1" : "SOF0 or APP1";
-    walk.missingAtScan = walk.sawAPP1 ? "SOF0" : withoutAPP1;
+  if (marker == kSOS && walk.firstScan < 0) {
+    walk.firstScan = walk.start;
+    bool const sawNeither = !walk.sawAPP1 && !walk.sawSOF0;
+    char const* const theOther = walk.sawAPP1 ? "SOF0" : "APP1";  // with both, the walk ends
+    walk.missingAtScan = sawNeither ? "SOF0 or APP1" : theOther;
   }
-  // After the start of the scan, these two bytes are picture data, not a frame header.
-  if (marker == kSOF2 && walk.scan < 0) {
-    walk.otherFrame = walk.start;
+  // Once the scan has begun, these two bytes are picture data.
+  if (marker == kSOF2 && walk.firstScan < 0) {
+    walk.sof2 = walk.start;
   }
   return true;
 }
 
 bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   Journal* const journal = journalOf(*stream);
-  std::int64_t const baseOffset = stream->baseOffset;
+  std::int64_t const outerBase = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
   if (!readExactly(*stream, identifier.data(), identifier.size())) {
     return refuseCut(journal, walk.start + kPayloadPosition, identifier.size(),
@@ -153,7 +154,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
     }
     walk.sawExif = true;
   }
-  stream->baseOffset = baseOffset;
+  stream->baseOffset = outerBase;
   walk.sawAPP1 = true;
   return true;
 }
@@ -169,8 +170,8 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   }
   notePassed(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
              Offset{walk.start}, width, height);
-  if (walk.frame < 0 || width > walk.frameWidth || height > walk.frameHeight) {
-    walk.frame = walk.start;
+  if (walk.sof0 < 0 || width > walk.frameWidth || height > walk.frameHeight) {
+    walk.sof0 = walk.start;
   }
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
@@ -188,7 +189,7 @@ void QVJPEGImage::reconcileSizeWith(WalkState const& walk) {
   // The Exif directory may give the sides swapped. The frame's size then counts, unless Orientation
   // says that the image is rotated or mirrored.
   bool const isSwapped = width == walk.frameHeight && height == walk.frameWidth;
-  bool const isUpright = orientation == 1 || orientation == -1;
+  bool const isUpright = orientation == 1 || orientation == -1;  // -1: absent
   if (isSwapped && isUpright) {
     width = walk.frameWidth;
     height = walk.frameHeight;
@@ -220,7 +221,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!QVMetadata::storeInfoFromExifIFD(ifd)) {
     return false;
   }
-  int exifWidth = width;
+  int exifWidth = width;  // without a tag, as an earlier directory gave it
   int exifHeight = height;
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
@@ -236,13 +237,13 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
 }
 
 bool QVJPEGImage::readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag(findEntry(ifd, tag::ImageWidth));
-  return storeNumber(ifd, hasTiffTag ? tag::ImageWidth : tag::PixelXDimension, side);
+  auto const& sideTag = findEntry(ifd, tag::ImageWidth) ? tag::ImageWidth : tag::PixelXDimension;
+  return storeNumber(ifd, sideTag, side);
 }
 
 bool QVJPEGImage::readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
-  bool const hasTiffTag(findEntry(ifd, tag::ImageLength));
-  return storeNumber(ifd, hasTiffTag ? tag::ImageLength : tag::PixelYDimension, side);
+  auto const& sideTag = findEntry(ifd, tag::ImageLength) ? tag::ImageLength : tag::PixelYDimension;
+  return storeNumber(ifd, sideTag, side);
 }
 
 }  // namespace quavel

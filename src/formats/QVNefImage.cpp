@@ -1,7 +1,6 @@
 #include "quavel/QVNefImage.h"
 
 #include "formats/Steps.h"
-#include "quavel/QVStream.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -23,7 +22,7 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
   auto const mainIFD = readFirstDirectory(
-      stream, nullptr,
+      stream, kWholeFile,
       {tag::SubIFDs, tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
@@ -35,10 +34,10 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  // The second SubIFD describes the raw image. It is read even if there is no Exif directory.
+  // The second SubIFD describes the raw image, whether or not there is an Exif directory.
   DirectoryPointer rawIFD;
-  if (!readSubIFD(stream, mainIFD, 1, {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType},
-                  rawIFD)) {
+  if (!readSubIFD(stream, mainIFD, /*index=*/1,
+                  {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType}, rawIFD)) {
     return false;
   }
   return !rawIFD || storeInfoFromSubIFD1(rawIFD);

@@ -3,7 +3,6 @@
 #include <array>
 
 #include "formats/Steps.h"
-#include "quavel/QVStream.h"
 #include "stream/Bytes.h"
 #include "tiff/Tags.h"
 
@@ -19,7 +18,7 @@ constexpr std::array<std::uint8_t, 8> kMagic = {'F', 'U', 'J', 'I', 'F', 'I', 'L
 constexpr long kImageOffsetPosition = 84;
 constexpr long kRawSectionOffsetPosition = 100;
 
-// Its position: after SOI, the APP1 marker, its length (2 bytes each), "Exif" and two zeros.
+// The TIFF header comes after SOI, the APP1 marker, a length (2 bytes each), "Exif" and two zeros.
 constexpr std::uint32_t kTiffHeaderInImage = 12;
 
 /// Reads the offset of a section from the file's header.
@@ -35,7 +34,7 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
   return true;
 }
 
-/// Whether an image begins as the reader expects. The segment's length, bytes 4 and 5, may be any.
+/// Whether a JPEG begins with SOI and an Exif segment, of any length (bytes 4 and 5).
 bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
   return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
          std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
@@ -64,7 +63,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   Journal* const journal = scope.reading().journal;
   isRaw = true;
 
-  std::array<std::uint8_t, 8> magic;
+  std::array<std::uint8_t, kMagic.size()> magic;
   if (!readExactly(*stream, magic.data(), magic.size())) {
     return refuseCut(journal, 0, magic.size(), "the file's magic \"FUJIFILM\"");
   }
@@ -129,6 +128,7 @@ bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVRafImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
+  // `readMainIFD` asks for no size, but a host may pass a directory that has one.
   return storeNumber(ifd, tag::ImageWidth, width) && storeNumber(ifd, tag::ImageLength, height) &&
          storeNumber(ifd, tag::Orientation, orientation);
 }

@@ -1,7 +1,6 @@
 #include "quavel/QVTiffImage.h"
 
 #include "formats/Steps.h"
-#include "quavel/QVStream.h"
 #include "tiff/Tags.h"
 
 namespace quavel {
@@ -10,7 +9,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD that has NewSubfileType and is not reduced; null without one, or on failure.
+/// The first SubIFD that has NewSubfileType and is not reduced; null if none is, or on failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);
@@ -18,16 +17,15 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
     auto subIFD =
-        readDirectoryAt(stream, {"SubIFD", nullptr, i + 1, count}, subIFDs[i]->longValue(),
+        readDirectoryAt(stream, {"SubIFD", kWholeFile, i + 1, count}, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     ValuePointer type = nullptr;
     if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {
       return nullptr;
     }
-    if (type != nullptr && !isReducedImage(type)) {
+    if (type != nullptr && !isReducedImage(type->longValue())) {
       return subIFD;
     }
-    // Not even a SubIFD without NewSubfileType is taken.
     noteHint(
         journal, QVReason::PassedOver, positionOf(subIFD),
         type == nullptr ? "{} has no 0x00fe NewSubfileType" : "{} declares a reduced image too",
@@ -49,7 +47,7 @@ DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
   if (!findNumber(mainIFD, tag::NewSubfileType, type)) {
     return nullptr;
   }
-  bool const isReduced = type != nullptr && isReducedImage(type);
+  bool const isReduced = type != nullptr && isReducedImage(type->longValue());
   return isReduced ? readFullImageSubIFD(stream, mainIFD) : mainIFD;
 }
 
@@ -58,7 +56,7 @@ DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
 bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   auto const mainIFD =
-      readFirstDirectory(stream, nullptr,
+      readFirstDirectory(stream, kWholeFile,
                          {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
                           tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {

@@ -1,7 +1,5 @@
 #include "formats/Steps.h"
 
-#include "quavel/QVStream.h"
-#include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "tiff/Tags.h"
 
 namespace quavel::detail {
@@ -10,7 +8,7 @@ namespace {
 
 constexpr unsigned short kTiffMagic = 42;
 
-// The record's value for an absent number, even if the file gives it.
+// Marks a number in the record as absent. One that the file gives as -1 counts as absent too.
 constexpr std::int32_t kAbsentNumber = -1;
 
 }  // namespace
@@ -63,7 +61,7 @@ bool storeText(DirectoryPointer const& directory, unsigned short tag, std::strin
   return true;
 }
 
-DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
+DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName const& name,
                                  std::uint32_t offset, TagList tags) {
   auto directory = std::make_shared<ReaderDirectory>(name, stream->baseOffset + offset);
   if (!directory->table.readWithNext(*stream, offset, tags, &directory->nextIFDOffset)) {
@@ -88,8 +86,9 @@ bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& di
   if (!findNumber(directory, pointer, offset)) {
     return false;
   }
-  result = offset == nullptr ? nullptr : readDirectoryAt(stream, {name}, offset->longValue(), tags);
-  return offset == nullptr || result != nullptr;
+  bool const isAbsent = offset == nullptr;
+  result = isAbsent ? nullptr : readDirectoryAt(stream, {name}, offset->longValue(), tags);
+  return isAbsent || result != nullptr;
 }
 
 bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
@@ -119,7 +118,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
                count == 1 ? "SubIFD" : "SubIFDs", index + 1);
     return true;
   }
-  rawIFD = readDirectoryAt(stream, {"SubIFD", nullptr, index + 1, count},
+  rawIFD = readDirectoryAt(stream, {"SubIFD", kWholeFile, index + 1, count},
                            subIFDs[index]->longValue(), tags);
   return rawIFD != nullptr;
 }
@@ -132,14 +131,15 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   }
 }
 
-// Below, the tag has an entry. If there is no row for it, the directory is a host's, without notes.
+// The tag has an entry in the next two functions: without a row for it, the directory is a host's,
+// of which no notes are kept.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);
   auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
   if (row != nullptr && fieldOf(tag) != nullptr) {
     noteAbsent(own->table.journal(), {fieldOf(tag)}, QVReason::NoValue, pattern,
-               PlacedEntry{own->table, *row}, TypedCount{row->count, row->typeCode});
+               PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode});
   }
 }
 
@@ -152,10 +152,9 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   bool const isUndefined = row->typeCode == kUndefinedCode;
   return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
-                PlacedEntry{own->table, *row}, TypedCount{row->count, row->typeCode}, wanted);
+                PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},
+                wanted);
 }
-
-bool isReducedImage(ValuePointer newSubfileType) { return (newSubfileType->longValue() & 1U) != 0; }
 
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height) {
@@ -164,11 +163,12 @@ bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                            "the raw image must say that it is of full size", newSubfileType)) {
     return false;
   }
-  if ((newSubfileType & 1) != 0) {
+  auto const bits = static_cast<std::uint32_t>(newSubfileType);
+  if (isReducedImage(bits)) {
     return refuse(journalOf(directory), QVReason::WrongImage, positionOf(directory),
                   "{} declares a reduced image (NewSubfileType {}); the raw image of full size is "
                   "wanted there",
-                  placed(directory), static_cast<std::uint32_t>(newSubfileType));
+                  placed(directory), bits);
   }
   char const* const rule = "the raw image's size is wanted there";
   return storeRequiredNumber(directory, tag::ImageWidth, rule, width) &&

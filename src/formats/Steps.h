@@ -1,7 +1,6 @@
 #ifndef QUAVEL_SRC_FORMATS_STEPS_H
 #define QUAVEL_SRC_FORMATS_STEPS_H
 
-#include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -22,7 +21,7 @@ bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePoin
 /// Stores the tag's number. Absent: true, the field untouched. Not exactly one value: false.
 bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field);
 
-/// The same for a number that must be present; `rule` tells the user so. Absent: false.
+/// The same for a number that must be present. Absent: false, and the note ends with `rule`.
 bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field);
 
@@ -30,11 +29,11 @@ bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, 
 bool storeText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
 
 /// Reads the directory at an offset from the TIFF header; null on failure.
-DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, DirectoryName const& name,
+DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName const& name,
                                  std::uint32_t offset, TagList tags);
 
 /// Reads the TIFF header at the stream's position and the directory it refers to; null on failure.
-/// `structure` is what notes call the TIFF structure; null when it is the whole file.
+/// `structure` is what notes call the TIFF structure, or `kWholeFile`.
 DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
                                     TagList tags);
 
@@ -57,21 +56,21 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the tag's field stays absent because there is no entry for it.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// Notes that it stays absent because the entry's value is unusable; the pattern says what it is.
+/// Notes that the tag's field stays absent because the entry's value is no use, as `pattern` says.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
-/// Refuses the content of the tag's entry, which must exist. Returns false.
+/// Refuses the tag's entry, which must exist: it does not hold what is `wanted`. Returns false.
 bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char const* wanted);
 
 /// Whether NewSubfileType's bit 0 marks a reduced-resolution version of another image.
-bool isReducedImage(ValuePointer newSubfileType);
+inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileType & 1U) != 0; }
 
 /// Stores the image size from a directory that must describe a full-size image. False: a side or
 /// NewSubfileType is absent or not exactly one value, or the image is a reduced one.
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory as notes name it; without a table for a host's, of which no notes are kept.
+/// A directory as notes name it. For a host's there is no table, but no note either.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};

@@ -15,8 +15,8 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// A view of an entry's values, which must outlive the view; they belong to a reader's directory or
-/// to a host's. As a bool, false: there is no such entry.
+/// A view of the values of an entry in a reader's own directory or in a host's. The values must
+/// outlive it. As a bool: whether there is such an entry.
 class Entry {
  public:
   Entry() = default;
@@ -29,13 +29,13 @@ class Entry {
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 
-  /// Does what that of `QVTiffImageFileDirectoryEntry` does.
+  /// Like `QVTiffImageFileDirectoryEntry::convertToString`.
   bool convertToString(std::string& out) const;
 
  private:
   bool exists_ = false;
-  ValuePointer values_ = nullptr;  // an array of values, in a reader's directory
-  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // or pointers
+  ValuePointer values_ = nullptr;  // the first value, in a reader's directory
+  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // in a host's
   std::size_t size_ = 0;
 };
 

@@ -13,22 +13,22 @@ namespace quavel::detail {
 
 namespace {
 
-// In values of 9 bytes: few directories need more, and allocators are fast for blocks up to 1 KB.
-constexpr std::size_t kFirstCapacity = 112;
+// At 9 bytes each, just below 1 KB: enough for most directories, and fast to allocate.
+constexpr std::size_t kReservedValues = 112;
 
-// An entry count may be made up, so it does not decide alone how much is reserved.
+// A damaged directory may declare 65535 entries: what is reserved for them has a bound.
 constexpr std::size_t kMaxReservedRows = 256;
 
-bool refuseCount(Journal* journal, EntryTable const& table) {
+bool refuseEntryCount(Journal* journal, EntryTable const& table) {
   return refuseCut(journal, table.position(), kEntryCountSize, "the entry count of {}",
                    PlacedDirectory{&table});
 }
 
-bool refuseNext(Journal* journal, EntryTable const& table, std::uint16_t entryCount) {
-  return refuseCut(
-      journal, table.position() + kEntryCountSize + std::int64_t{kEntrySize} * entryCount,
-      sizeof(std::uint32_t), "the offset of the next directory, after the {} entries of {}",
-      entryCount, PlacedDirectory{&table});
+bool refuseNextOffset(Journal* journal, EntryTable const& table, std::uint16_t entryCount) {
+  std::int64_t const entriesSize = std::int64_t{kEntrySize} * entryCount;
+  return refuseCut(journal, table.position() + kEntryCountSize + entriesSize, sizeof(std::uint32_t),
+                   "the offset of the next directory, after the {} entries of {}", entryCount,
+                   PlacedDirectory{&table});
 }
 
 }  // namespace
@@ -37,18 +37,18 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   Reading& reading = readingOf(stream);
   journal_ = reading.journal;
   if (!stream.readShort(&entryCount_)) {
-    return refuseCount(journal_, *this);
+    return refuseEntryCount(journal_, *this);
   }
   if (!reading.spend(Work::Directories, 1)) {
     return false;
   }
 
-  rows_.reserve(std::min({std::size_t{entryCount_}, wanted.count(), kMaxReservedRows}));
-  values_.reserve(kFirstCapacity);
+  rows_.reserve(std::min({std::size_t{entryCount_}, wanted.left(), kMaxReservedRows}));
+  values_.reserve(kReservedValues);
   EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
   for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
     if (!walk.hasTag()) {
-      return refuseCut(journal_, walk.position(), kEntryTypePosition, "entry {} of {} of {}",
+      return refuseCut(journal_, walk.position(), kEntryTagSize, "entry {} of {} of {}",
                        walk.number(), entryCount_, PlacedDirectory{this});
     }
     unsigned short const tag = walk.tag();
@@ -56,11 +56,11 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // Go to the next entry first: a stream that refuses the seek to the values then reads there.
+    // Back to this entry's end: a stream that ignores the seek to the values reads them from there.
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
-                       PlacedEntry{*this, Row{tag, 0, 0, walk.position(), 0, 0}});
+                       PlacedEntry{*this, tag, walk.position()});
     }
     if (!readEntry(stream, tag, walk.position(), entry)) {
       return false;
@@ -69,20 +69,20 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
 
   // Reading the values may have moved the stream anywhere.
   if (!seek(stream, walk.end())) {
-    return refuseNext(journal_, *this, entryCount_);
+    return refuseNextOffset(journal_, *this, entryCount_);
   }
   return reading.spend(Work::Entries, walk.passed());
 }
 
 bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t position,
                            RawEntry const& entry) {
-  Row row = {
-      tag, entry.typeCode, entry.count, position, 0, static_cast<std::uint32_t>(values_.size())};
-  if (!isAllowed(entry) || !isWhole(entry)) {
+  auto const firstValue = static_cast<std::uint32_t>(values_.size());
+  Row row = {tag, entry.typeCode, entry.count, position, /*bytesOrOffset=*/0, firstValue};
+  if (!isAllowed(entry) || !hasWholeField(entry)) {
     return refuseEntry(row, entry);
   }
   if (entry.typeCode == kUndefinedCode) {
-    row.field = undefinedField(entry, needsReversal(stream));
+    row.bytesOrOffset = bytesOrOffsetOf(entry, needsReversal(stream));
   } else if (!readingOf(stream).spend(Work::Values, entry.count)) {
     return false;
   } else if (!readValues(stream, entry, values_)) {
@@ -95,14 +95,14 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
 bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList tags,
                               std::uint32_t* nextIFDOffset) {
   if (!seek(stream, offset)) {
-    return refuseCount(readingOf(stream).journal, *this);
+    return refuseEntryCount(readingOf(stream).journal, *this);  // `journal_` is not set yet
   }
   WantedTags wanted(tags.begin(), tags.size());
   if (!read(stream, wanted)) {
     return false;
   }
   if (!stream.readLong(nextIFDOffset)) {
-    return refuseNext(journal_, *this, entryCount_);
+    return refuseNextOffset(journal_, *this, entryCount_);
   }
   notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
              static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
@@ -110,7 +110,7 @@ bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList ta
 }
 
 bool EntryTable::refuseEntry(Row const& row, RawEntry const& entry) const {
-  PlacedEntry const place = {*this, row};
+  PlacedEntry const place = {*this, row.tag, row.position};
   if (!isKnown(row.typeCode)) {
     return refuse(journal_, QVReason::MalformedEntry, row.position,
                   "{}: field type {} is neither one of TIFF's 12 nor 13 (IFD)", place,
@@ -132,9 +132,9 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
   std::int64_t const begin = stream.baseOffset + valueOffset(entry, needsReversal(stream));
   std::int64_t const end = begin + static_cast<std::int64_t>(sizeOfValues(entry));
   return refuse(journal_, journal_->cutReason(), begin,
-                "{}: its {} would begin at {} and end at {}, but {}", PlacedEntry{*this, row},
-                TypedCount{row.count, row.typeCode}, Offset{begin}, Offset{end},
-                journal_->cutText(end));
+                "{}: its {} would begin at {} and end at {}, but {}",
+                PlacedEntry{*this, row.tag, row.position}, TypedCount{row.count, row.typeCode},
+                Offset{begin}, Offset{end}, journal_->cutText(end));
 }
 
 Entry findEntry(DirectoryPointer const& directory, unsigned short tag) {
@@ -152,9 +152,9 @@ void append(std::string& out, PlacedDirectory directory) {
 }
 
 void append(std::string& out, PlacedEntry entry) {
-  append(out, TagName{entry.row.tag});
+  append(out, TagName{entry.tag});
   out += " at ";
-  append(out, Offset{entry.row.position});
+  append(out, Offset{entry.position});
   out += " in ";
   append(out, entry.table.name());
 }

@@ -30,22 +30,21 @@ class EntryTable {
     unsigned short tag;
     std::uint16_t typeCode;
     std::uint32_t count;
-    std::int64_t position;  ///< Of the entry, in the file.
-    std::uint32_t field;    ///< UNDEFINED: see `undefinedField`.
-    std::uint32_t first;    ///< Index of its first value in the array.
+    std::int64_t position;        ///< Of the entry, in the file.
+    std::uint32_t bytesOrOffset;  ///< Of an UNDEFINED entry: see `bytesOrOffsetOf`.
+    std::uint32_t firstValue;     ///< The index of its first value in the array.
 
     std::uint32_t valueCount() const { return typeCode == kUndefinedCode ? 0 : count; }
   };
 
-  /// For a directory at a position in the file.
-  EntryTable(DirectoryName const& name, std::int64_t position) : name_(name), position_(position) {}
+  EntryTable(PartName const& name, std::int64_t position) : name_(name), position_(position) {}
 
   /// Reads the directory at the stream's position: the entry count, then the wanted entries, until
   /// all have been met. To be called once. True: the stream stands after the directory's last
   /// entry. False: the count, a tag or a wanted entry cannot be read, or the read exceeds a limit.
   bool read(QVStream& stream, WantedTags& wanted);
 
-  /// Does the same at an offset, then reads the next directory's offset; false also if that fails.
+  /// Seeks to `offset`, calls `read`, reads the next directory's offset. False: one of these fails.
   bool readWithNext(QVStream& stream, std::uint32_t offset, TagList tags,
                     std::uint32_t* nextIFDOffset);
 
@@ -55,17 +54,17 @@ class EntryTable {
         std::find_if(rows_.begin(), rows_.end(), [tag](Row const& row) { return row.tag == tag; });
     return found == rows_.end() ? nullptr : &*found;
   }
-  /// The entry of that row; false as a bool when there is no row.
+  /// The first entry with the tag; false as a bool when there is none.
   Entry entry(unsigned short tag) const {
     Row const* const row = find(tag);
-    return row == nullptr ? Entry() : Entry(values_.data() + row->first, row->valueCount());
+    return row == nullptr ? Entry() : Entry(values_.data() + row->firstValue, row->valueCount());
   }
 
   using Map = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
   /// Moves the values out: the table has none afterwards.
   std::shared_ptr<Map> takeEntries();
 
-  DirectoryName const& name() const { return name_; }
+  PartName const& name() const { return name_; }
   std::int64_t position() const { return position_; }
   Journal* journal() const { return journal_; }  ///< Of the read that filled the table, or null.
 
@@ -75,7 +74,7 @@ class EntryTable {
   bool refuseEntry(Row const& row, RawEntry const& entry) const;
   bool refuseValues(Row const& row, RawEntry const& entry, QVStream& stream) const;
 
-  DirectoryName name_;
+  PartName name_;
   std::int64_t position_;
   std::uint16_t entryCount_ = 0;
   Journal* journal_ = nullptr;
@@ -92,12 +91,13 @@ using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// What a row keeps of an UNDEFINED entry's field: up to 4 bytes as in the file, with zeros for
-/// those beyond its end, or the offset of more than 4.
-std::uint32_t undefinedField(RawEntry const& entry, bool isReversed);
+/// What a row keeps of an UNDEFINED entry. Of up to 4 bytes: the bytes as in the file, with zeros
+/// for those that lie beyond the end of the data. Of more: their offset.
+std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed);
 
-/// Stores that, and the count of bytes, in an entry for a host.
-void storeUndefined(std::uint32_t count, std::uint32_t field, QVTiffImageFileDirectoryEntry& entry);
+/// Stores that, and the `count` of the bytes, in an entry for a host.
+void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
+                    QVTiffImageFileDirectoryEntry& entry);
 
 /// A directory in a note: "IFD0 at 8".
 struct PlacedDirectory {
@@ -105,10 +105,11 @@ struct PlacedDirectory {
 };
 void append(std::string& out, PlacedDirectory directory);
 
-/// An entry in a note, by the row's tag and position: "0x0132 DateTime at 0xe6 (230) in IFD0".
+/// An entry in a note: "0x0132 DateTime at 0xe6 (230) in IFD0".
 struct PlacedEntry {
   EntryTable const& table;
-  EntryTable::Row row;
+  unsigned short tag;
+  std::int64_t position;
 };
 void append(std::string& out, PlacedEntry entry);
 

@@ -9,7 +9,7 @@
 
 namespace quavel::detail {
 
-/// A walk over a directory's entries. It reads as many of them at a time as its buffer can hold.
+/// A walk over a directory's entries, of which it reads up to 64 at a time.
 class EntryWalk {
  public:
   /// The stream stands at the first of `count` entries, which is at `position` in the file.
@@ -17,7 +17,7 @@ class EntryWalk {
       : stream_(stream),
         isReversed_(needsReversal(stream)),
         bufferOffset_(stream.getOffset()),
-        position_(position),
+        firstPosition_(position),
         count_(count),
         left_(count) {}
 
@@ -32,14 +32,17 @@ class EntryWalk {
   std::uint32_t passed() const { return count_ - left_; }
   /// The current entry, counted from 1.
   std::uint32_t number() const { return passed() + 1; }
-  std::int64_t position() const { return position_ + std::int64_t{kEntrySize} * passed(); }
+  /// Where the current entry begins in the file.
+  std::int64_t position() const { return firstPosition_ + kStep * passed(); }
 
-  /// Whether the data holds the current entry's tag. May move the stream.
+  /// Buffers the current entry, which may move the stream. False: the data ends before its tag
+  /// does.
   bool hasTag() { return isBufferedUpTo(kEntryTypePosition) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
-  /// Reads what follows the tag. False: the data ends within the type or the count.
+  /// Takes what follows the tag from the buffer, which holds whole entries unless the data ends.
+  /// False: the data ends within the type or the count.
   bool readRest(RawEntry* entry) const {
     if (!isBufferedUpTo(kEntryFieldPosition)) {
       return false;
@@ -52,7 +55,7 @@ class EntryWalk {
     return true;
   }
 
-  /// The offsets at which the next entry begins and the last one ends.
+  /// The stream's offsets at which the next entry begins and the last one ends.
   std::int64_t nextOffset() const { return offset() + kStep; }
   std::int64_t end() const { return offset() + kStep * left_; }
 
@@ -71,9 +74,9 @@ class EntryWalk {
     return numberAt<Number>(entry_ + position, isReversed_);
   }
 
-  /// Buffers the current entry and those after it. False: the data ends before its tag does.
+  /// Buffers the current entry and as many of those after it as fit.
   bool fillBuffer() {
-    bufferOffset_ = offset();
+    bufferOffset_ = offset();  // of the current entry: `entry_` still points into the old buffer
     entry_ = buffer_.data();
     std::size_t const size = std::min(kEntrySize * left_, buffer_.size());
     bool const isReached = seek(stream_, bufferOffset_);
@@ -83,8 +86,8 @@ class EntryWalk {
 
   QVStream& stream_;
   bool const isReversed_;
-  std::int64_t bufferOffset_;  // of the buffer's first byte
-  std::int64_t const position_;
+  std::int64_t bufferOffset_;         // of the buffer's first byte, in the stream
+  std::int64_t const firstPosition_;  // of the first entry, in the file
   std::uint32_t const count_;
   std::uint32_t left_;  // entries, the current one included
   std::array<std::uint8_t, 64 * kEntrySize> buffer_;

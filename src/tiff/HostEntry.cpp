@@ -17,40 +17,40 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
   return list;
 }
 
-std::uint32_t undefinedField(RawEntry const& entry, bool isReversed) {
+std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed) {
   if (entry.count > kEntryFieldSize) {
     return valueOffset(entry, isReversed);
   }
-  std::uint32_t field = 0;
-  std::memcpy(&field, entry.field, entry.fieldSize);
-  return field;
+  std::uint32_t bytes = 0;
+  std::memcpy(&bytes, entry.field, entry.fieldSize);
+  return bytes;
 }
 
-void storeUndefined(std::uint32_t count, std::uint32_t field,
+void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
                     QVTiffImageFileDirectoryEntry& entry) {
   if (count > kEntryFieldSize) {
-    entry.dataOffset = field;
+    entry.dataOffset = bytesOrOffset;
     entry.dataCount = count;
     return;
   }
   entry.bytes = std::make_shared<std::vector<std::uint8_t>>(count);
-  if (count != 0) {
-    std::memcpy(entry.bytes->data(), &field, count);
+  if (count != 0) {  // else `data` may be null, which `memcpy` must not get
+    std::memcpy(entry.bytes->data(), &bytesOrOffset, count);
   }
 }
 
 std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
-  // One block for all values; it lives as long as anyone keeps one of them.
   auto const block = std::make_shared<ValueBlock>(std::move(values_));
   auto map = std::make_shared<Map>();
   for (Row const& row : rows_) {
     auto entry = std::make_shared<QVTiffImageFileDirectoryEntry>();
     if (row.typeCode == kUndefinedCode) {
-      storeUndefined(row.count, row.field, *entry);
+      storeUndefined(row.count, row.bytesOrOffset, *entry);
     } else {
-      entry->values = listOf(block, row.first, row.count);
+      entry->values = listOf(block, row.firstValue, row.count);
     }
-    // Most directories are sorted by tag. Of a repeated tag, the first entry stays.
+    // Most directories are sorted by tag: the end is where most entries belong. An entry whose tag
+    // is in the map already is not stored.
     map->emplace_hint(map->end(), row.tag, std::move(entry));
   }
   return map;

@@ -13,6 +13,9 @@ namespace {
 constexpr unsigned short kLittleEndianMark = 0x4949;  // "II"
 constexpr unsigned short kBigEndianMark = 0x4d4d;     // "MM"
 
+constexpr std::int64_t kMagicPosition = 2;           // from the header's start
+constexpr std::int64_t kFirstIFDOffsetPosition = 4;  // likewise
+
 constexpr unsigned short kBigTiffMagic = 43;
 
 }  // namespace
@@ -20,32 +23,32 @@ constexpr unsigned short kBigTiffMagic = 43;
 QVTiffHeader::QVTiffHeader() = default;
 
 bool QVTiffHeader::read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic) {
-  return detail::readTiffHeader(*stream, expectedMagic, nullptr, *this);
+  return detail::readTiffHeader(*stream, expectedMagic, detail::kWholeFile, *this);
 }
 
 bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                             QVTiffHeader& header) {
   Journal* const journal = journalOf(stream);
   std::int64_t const start = notedPosition(journal, stream);
-  DirectoryName const name = {"the TIFF header", structure};
+  PartName const name = {"the TIFF header", structure};
 
   unsigned short mark = 0;
   if (!stream.readShort(&mark)) {
     return refuseCut(journal, start, sizeof(mark), "{}", name);
   }
   if (mark != kLittleEndianMark && mark != kBigEndianMark) {
-    // The pair is shown in the order in which the file has it.
+    auto const asInFile = stream.byteOrder == ByteOrder::BigEndian ? mark : reversed(mark);
     return refuse(journal, QVReason::OtherKind, start,
                   "{} at {} begins with {}, not with 49 49 (\"II\") or 4d 4d (\"MM\")", name,
-                  Offset{start},
-                  HexPair{stream.byteOrder == ByteOrder::BigEndian ? mark : reversed(mark)});
+                  Offset{start}, HexPair{asInFile});
   }
   bool const isLittle = mark == kLittleEndianMark;
   stream.byteOrder = isLittle ? ByteOrder::LittleEndian : ByteOrder::BigEndian;
 
   unsigned short magic = 0;
   if (!stream.readShort(&magic)) {
-    return refuseCut(journal, start + 2, sizeof(magic), "{} at {}", name, Offset{start});
+    return refuseCut(journal, start + kMagicPosition, sizeof(magic), "{} at {}", name,
+                     Offset{start});
   }
   if (magic != expectedMagic) {
     return refuse(journal, QVReason::OtherKind, start, "{} at {} has magic {}, not {}{}", name,
@@ -53,8 +56,8 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
                   magic == kBigTiffMagic ? "; 43 marks a BigTIFF, which is not read" : "");
   }
   if (!stream.readLong(&header.firstIFDOffset)) {
-    return refuseCut(journal, start + 4, sizeof(header.firstIFDOffset), "{} at {}", name,
-                     Offset{start});
+    return refuseCut(journal, start + kFirstIFDOffsetPosition, sizeof(header.firstIFDOffset),
+                     "{} at {}", name, Offset{start});
   }
   notePassed(journal, start, "{} at {}: {}-endian", name, Offset{start},
              isLittle ? "little" : "big");

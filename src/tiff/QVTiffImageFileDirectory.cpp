@@ -1,7 +1,6 @@
 #include "quavel/QVTiffImageFileDirectory.h"
 
 #include "journal/Reading.h"
-#include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "tiff/EntryTable.h"
 
 namespace quavel {
@@ -12,7 +11,7 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
                                     std::vector<unsigned short> const& tags) {
   detail::ReadScope const scope(*stream);
   detail::WantedTags wanted(tags.data(), tags.size());
-  detail::EntryTable table({}, detail::positionOf(*stream));
+  detail::EntryTable table(/*name=*/{}, detail::positionOf(*stream));
   if (!table.read(*stream, wanted)) {
     return false;
   }

@@ -3,7 +3,6 @@
 #include <array>
 #include <utility>
 
-#include "quavel/QVStream.h"
 #include "stream/Bytes.h"
 #include "tiff/EntryTable.h"
 
@@ -26,16 +25,16 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
     // Up to 4 bytes are stored even if the data ends within them; an offset only if it is whole.
-    if (entry.count <= kEntryFieldSize || isWhole(entry)) {
-      storeUndefined(entry.count, undefinedField(entry, needsReversal(*stream)), *this);
+    if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
+      storeUndefined(entry.count, bytesOrOffsetOf(entry, needsReversal(*stream)), *this);
     }
-    return isWhole(entry);
+    return hasWholeField(entry);
   }
   auto const block = std::make_shared<ValueBlock>();
-  if (!isWhole(entry) || !readValues(*stream, entry, *block)) {
+  if (!hasWholeField(entry) || !readValues(*stream, entry, *block)) {
     return false;
   }
-  values = listOf(block, 0, block->size());
+  values = listOf(block, /*first=*/0, block->size());
   return true;
 }
 

@@ -6,7 +6,6 @@
 #include <limits>
 #include <type_traits>
 
-#include "quavel/QVStream.h"
 #include "tiff/RawEntry.h"
 
 namespace quavel {
@@ -132,8 +131,8 @@ Float toFloat(EntryValue const& value) {
   });
 }
 
-/// The value for all integer accessors but `longValue`: its floats saturate at other limits.
-std::uint32_t bitsOf(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
+/// For all integer accessors but `longValue`, where floats saturate at the limits of uint32.
+std::uint32_t signedBits(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace
 
@@ -162,23 +161,23 @@ unsigned int QVTiffImageFileDirectoryEntryValue::sizeOfValueOfType(EntryValueTyp
 }
 
 char QVTiffImageFileDirectoryEntryValue::charValue() const {
-  return static_cast<char>(bitsOf(*this));
+  return static_cast<char>(signedBits(*this));
 }
 
 std::uint8_t QVTiffImageFileDirectoryEntryValue::byteValue() const {
-  return static_cast<std::uint8_t>(bitsOf(*this));
+  return static_cast<std::uint8_t>(signedBits(*this));
 }
 
 std::int8_t QVTiffImageFileDirectoryEntryValue::sbyteValue() const {
-  return static_cast<std::int8_t>(bitsOf(*this));
+  return static_cast<std::int8_t>(signedBits(*this));
 }
 
 std::uint16_t QVTiffImageFileDirectoryEntryValue::shortValue() const {
-  return static_cast<std::uint16_t>(bitsOf(*this));
+  return static_cast<std::uint16_t>(signedBits(*this));
 }
 
 std::int16_t QVTiffImageFileDirectoryEntryValue::sshortValue() const {
-  return static_cast<std::int16_t>(bitsOf(*this));
+  return static_cast<std::int16_t>(signedBits(*this));
 }
 
 std::uint32_t QVTiffImageFileDirectoryEntryValue::longValue() const {
@@ -186,7 +185,7 @@ std::uint32_t QVTiffImageFileDirectoryEntryValue::longValue() const {
 }
 
 std::int32_t QVTiffImageFileDirectoryEntryValue::slongValue() const {
-  return static_cast<std::int32_t>(bitsOf(*this));
+  return static_cast<std::int32_t>(signedBits(*this));
 }
 
 float QVTiffImageFileDirectoryEntryValue::floatValue() const { return toFloat<float>(*this); }

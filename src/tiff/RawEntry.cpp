@@ -14,7 +14,7 @@ using EntryValue = QVTiffImageFileDirectoryEntryValue;
 constexpr std::size_t kPartSize = 512;
 
 template <class Number>
-void storeNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* destination) {
+void copyNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* destination) {
   Number const number = numberAt<Number>(bytes, isReversed);
   std::memcpy(destination, &number, sizeof(Number));
 }
@@ -26,17 +26,17 @@ void storeValue(std::uint8_t const* bytes, std::size_t size, bool isReversed, En
       value.value[0] = bytes[0];
       return;
     case 2:
-      return storeNumber<std::uint16_t>(bytes, isReversed, value.value);
+      return copyNumber<std::uint16_t>(bytes, isReversed, value.value);
     case 4:
-      return storeNumber<std::uint32_t>(bytes, isReversed, value.value);
+      return copyNumber<std::uint32_t>(bytes, isReversed, value.value);
     default:  // 8: a double, or a fraction, which is two numbers
       break;
   }
   if (value.type == EntryValueType::DOUBLE) {
-    return storeNumber<std::uint64_t>(bytes, isReversed, value.value);
+    return copyNumber<std::uint64_t>(bytes, isReversed, value.value);
   }
-  storeNumber<std::uint32_t>(bytes, isReversed, value.value);
-  storeNumber<std::uint32_t>(bytes + 4, isReversed, value.value + 4);
+  copyNumber<std::uint32_t>(bytes, isReversed, value.value);
+  copyNumber<std::uint32_t>(bytes + 4, isReversed, value.value + 4);
 }
 
 }  // namespace
@@ -56,9 +56,11 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
     if (!isInField && readUpTo(stream, part.data(), partCount * size) < partCount * size) {
       return false;
     }
-    std::uint8_t const* bytes = isInField ? entry.field : part.data();  // a field is a single part
-    values.resize(values.size() + partCount);
-    EntryValue* value = values.data() + (values.size() - partCount);
+    std::uint8_t const* bytes =
+        isInField ? entry.field : part.data();  // the field is the only part
+    std::size_t const oldSize = values.size();
+    values.resize(oldSize + partCount);
+    EntryValue* value = values.data() + oldSize;
     for (std::size_t i = 0; i < partCount; ++i, ++value, bytes += size) {
       value->type = type;
       storeValue(bytes, size, isReversed, *value);

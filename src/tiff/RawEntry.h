@@ -12,15 +12,16 @@
 
 namespace quavel::detail {
 
-// A directory entry and its parts: sizes, and positions in bytes from its start (TIFF 6.0).
+// The layout of a directory entry in bytes (TIFF 6.0). Positions are counted from its start.
+inline constexpr std::size_t kEntryTagSize = 2;
 inline constexpr std::size_t kEntryTypePosition = 2;
 inline constexpr std::size_t kValueCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize = 2;  // of the number of entries in a directory
+inline constexpr std::int64_t kEntryCountSize = 2;  // of what precedes the entries: their number
 
-inline constexpr std::uint16_t kUndefinedCode = 7;
+inline constexpr std::uint16_t kUndefinedCode = 7;  // of the field type UNDEFINED
 
 /// What follows the tag in a directory entry, not yet interpreted.
 struct RawEntry {
@@ -30,8 +31,8 @@ struct RawEntry {
   std::size_t fieldSize;      ///< How many of the field's 4 bytes the data holds.
 };
 
-// In real files, the longest wanted entries are texts of a few hundred values. The bound keeps the
-// memory that a damaged count can make an entry take below 2 MB.
+// In real files, the longest wanted entries are texts of a few hundred values. With this bound, an
+// entry with a damaged count takes less than 2 MB of memory.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
 /// Bytes of one value in a file, by EntryValueType (not by the type's code in the file).
@@ -42,7 +43,8 @@ inline bool isKnown(std::uint16_t typeCode) {
   return typeCode != 0 && typeCode < fieldTypeToValueType.size();
 }
 
-/// Whether the type is known and there are not too many values.
+/// Whether the type is known and there are not too many values. Any number of UNDEFINED bytes is
+/// allowed: beyond the field, they are not read.
 inline bool isAllowed(RawEntry const& entry) {
   return isKnown(entry.typeCode) &&
          (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);
@@ -60,14 +62,14 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
 }
 
 /// Whether the data holds all the bytes of the field that the entry uses.
-inline bool isWhole(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
+inline bool hasWholeField(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
-/// The offset in the field, of which all 4 bytes must be there.
+/// The offset that the field holds, all 4 bytes of which must be there.
 inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }
 
-/// Appends the values of an entry, which must be whole and allowed and must not be UNDEFINED.
+/// Appends the values of an entry that is allowed, has its whole field and is not UNDEFINED.
 /// False: the data does not hold them all.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);

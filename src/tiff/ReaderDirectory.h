@@ -16,7 +16,7 @@ using DirectoryPointer = std::shared_ptr<QVTiffImageFileDirectory>;
 /// A host never sees one; it gets what `forHost` makes.
 class ReaderDirectory final : public QVTiffImageFileDirectory {
  public:
-  ReaderDirectory(DirectoryName const& name, std::int64_t position) : table(name, position) {
+  ReaderDirectory(PartName const& name, std::int64_t position) : table(name, position) {
     ofReader = this;
   }
   ReaderDirectory(ReaderDirectory const&) = delete;
@@ -33,8 +33,8 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   EntryTable table;
 };
 
-/// Does what `QVTiffHeader::read` does. `structure` is what notes call the TIFF structure, such as
-/// "the Exif segment"; null when it is the whole file.
+/// Reads the header like `QVTiffHeader::read`. `structure` is what notes call the TIFF structure,
+/// such as "the Exif segment", or `kWholeFile`.
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);
 

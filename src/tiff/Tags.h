@@ -3,7 +3,7 @@
 
 #include <array>
 
-// The tags read from directories, those of TIFF and Exif under their standard names.
+// The tags that are read. Those of TIFF and Exif have their standard names.
 namespace quavel::tag {
 
 /// A tag, its name for notes, and the record's field that is filled from its entry, if any.
@@ -46,6 +46,7 @@ inline constexpr Tag RafDirectoryPointer = {0xf000, "(the vendor directory)"};
 inline constexpr Tag RafImageWidth = {0xf001, "(the raw image's width)", "width"};
 inline constexpr Tag RafImageLength = {0xf002, "(the raw image's height)", "height"};
 
+/// An array that counts its elements itself.
 template <class... Tags>
 constexpr std::array<Tag, sizeof...(Tags)> arrayOf(Tags const&... tags) {
   return {tags...};

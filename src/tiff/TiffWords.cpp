@@ -13,7 +13,7 @@ constexpr char kNamesByTypeCode[][10] = {"",          "BYTE",  "ASCII",     "SHO
                                          "RATIONAL",  "SBYTE", "UNDEFINED", "SSHORT", "SLONG",
                                          "SRATIONAL", "FLOAT", "DOUBLE",    "IFD"};
 
-tag::Tag const* known(unsigned short number) {
+tag::Tag const* findTag(unsigned short number) {
   auto const* const found =
       std::find_if(std::begin(tag::kAll), std::end(tag::kAll),
                    [number](tag::Tag const& row) { return row.number == number; });
@@ -23,8 +23,8 @@ tag::Tag const* known(unsigned short number) {
 }  // namespace
 
 void append(std::string& out, TagName tag) {
-  append(out, HexCode{tag.tag});
-  if (auto const* const row = known(tag.tag)) {
+  append(out, HexCode{tag.number});
+  if (auto const* const row = findTag(tag.number)) {
     out.append(" ").append(row->name);
   }
 }
@@ -35,19 +35,19 @@ void append(std::string& out, TypedCount values) {
   out += values.count == 1 ? " value" : " values";
 }
 
-void append(std::string& out, DirectoryName const& directory) {
-  out += directory.name;
-  if (directory.number != 0) {
-    out.append(" ").append(std::to_string(directory.number));
-    out.append(" of ").append(std::to_string(directory.count));
+void append(std::string& out, PartName const& part) {
+  out += part.name;
+  if (part.number != 0) {
+    out.append(" ").append(std::to_string(part.number));
+    out.append(" of ").append(std::to_string(part.count));
   }
-  if (directory.structure != nullptr) {
-    out.append(" of ").append(directory.structure);
+  if (part.structure != kWholeFile) {
+    out.append(" of ").append(part.structure);
   }
 }
 
 char const* fieldOf(unsigned short tag) {
-  auto const* const row = known(tag);
+  auto const* const row = findTag(tag);
   bool const hasField = row != nullptr && row->field[0] != '\0';
   return hasField ? row->field : nullptr;
 }

@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 /// A tag: "0x0132 DateTime".
 struct TagName {
-  unsigned short tag;
+  unsigned short number;
 };
 
 /// A number of values: "2 SHORT values". The type must be known.
@@ -20,17 +20,20 @@ struct TypedCount {
   std::uint16_t typeCode;
 };
 
-/// A directory's name: "IFD0 of the Exif segment" or "SubIFD 2 of 3".
-struct DirectoryName {
+/// In place of a TIFF structure's name: the structure is the whole file, and notes do not name it.
+inline constexpr char const* kWholeFile = nullptr;
+
+/// A part of a TIFF structure, a directory or the header: "IFD0 of the Exif segment".
+struct PartName {
   char const* name = "the directory";
-  char const* structure = nullptr;  ///< Null for the structure that is the whole file.
-  std::uint32_t number = 0;         ///< From 1 to `count`; 0: it is the only one of its kind.
+  char const* structure = kWholeFile;  ///< The name of the TIFF structure.
+  std::uint32_t number = 0;  ///< From 1 to `count`: "SubIFD 2 of 3". 0: there is only one.
   std::uint32_t count = 0;
 };
 
 void append(std::string& out, TagName tag);
 void append(std::string& out, TypedCount values);
-void append(std::string& out, DirectoryName const& directory);
+void append(std::string& out, PartName const& part);
 
 /// The record's field that is filled from the tag's entry; null for none.
 char const* fieldOf(unsigned short tag);

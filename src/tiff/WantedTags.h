@@ -10,7 +10,8 @@
 
 namespace quavel::detail {
 
-/// The tags that a reader wants, listed in its call.
+/// The tags that a reader wants. It lists some whose values it does not use, such as
+/// OffsetTimeOriginal: a file in which such an entry is damaged is refused.
 using TagList = std::initializer_list<unsigned short>;
 
 /// The tags that are still wanted while a directory is read. A listed tag is wanted until it is
@@ -20,7 +21,7 @@ class WantedTags {
   WantedTags(unsigned short const* tags, std::size_t count) : wantsAll_(count == 0) {
     if (wantsAll_) {
       mask_ = ~std::uint64_t{0};
-    } else if (count > kShortList) {
+    } else if (count > kMaxShortList) {
       longList_ = std::make_unique<LongList>();
     }
     for (auto const* tag = tags; tag != tags + count; ++tag) {
@@ -28,7 +29,7 @@ class WantedTags {
     }
   }
 
-  /// Whether the tag was still wanted. A listed tag is not wanted again.
+  /// Whether the tag is still wanted. A listed tag no longer is after this call.
   bool take(unsigned short tag) {
     if ((mask_ & bitOf(tag)) == 0) {
       return false;
@@ -37,13 +38,13 @@ class WantedTags {
   }
 
   /// How many listed tags are still to be met; SIZE_MAX when every entry is wanted.
-  std::size_t count() const { return wantsAll_ ? SIZE_MAX : left_; }
+  std::size_t left() const { return wantsAll_ ? SIZE_MAX : left_; }
 
   /// Whether there is a list and all its tags have been met.
   bool allMet() const { return left_ == 0 && !wantsAll_; }
 
  private:
-  static constexpr std::size_t kShortList = 16;  // no reader's list is longer
+  static constexpr std::size_t kMaxShortList = 16;  // only hosts' lists are longer
   using LongList = std::bitset<std::size_t{UINT16_MAX} + 1>;
 
   static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << (tag % 64); }
@@ -84,9 +85,9 @@ class WantedTags {
   }
 
   bool const wantsAll_;
-  std::uint64_t mask_ = 0;  // a bit for each tag modulo 64: rules out most others quickly
+  std::uint64_t mask_ = 0;  // a bit for each listed tag modulo 64: rules out most others quickly
   std::size_t left_ = 0;    // listed tags that are still to be met
-  std::array<unsigned short, kShortList> shortList_;
+  std::array<unsigned short, kMaxShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null while the short list is enough
 };
 
