@@ -8,9 +8,9 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kLabelWidth = 17;
+constexpr std::size_t kLabelWidth = 17;  // with the blanks behind the label
 
-/// What a person looks for first comes first.
+/// The fields of a card for which none are chosen, in the order in which people look for them.
 Fields cardFields() {
   std::istringstream names(
       "captureDate model lensModel exposureTime fNumber iso focalLength focalLengthIn35mmFilm "
@@ -30,10 +30,11 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
   if (!outcome.record) {
     return {};
   }
-  static Fields const usual = cardFields();
-  bool const showAbsent = form.showAbsent.value_or(!form.fields.empty());
-  std::string card = form.fields.empty() ? escapedPath(outcome.path) + "\n" : "";
-  for (auto const* field : form.fields.empty() ? usual : form.fields) {
+  static Fields const usualFields = cardFields();
+  bool const fieldsAreChosen = !form.fields.empty();
+  bool const showAbsent = form.showAbsent.value_or(fieldsAreChosen);
+  std::string card = fieldsAreChosen ? "" : escapedPath(outcome.path) + "\n";
+  for (auto const* field : fieldsAreChosen ? form.fields : usualFields) {
     std::string const text = inWords(*field, outcome);
     if (text.empty() && !showAbsent) {
       continue;

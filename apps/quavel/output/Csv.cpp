@@ -11,7 +11,7 @@ std::string quoted(std::string const& text) {
   }
   std::string result = "\"";
   for (char const c : text) {
-    result.append(c == '"' ? 2 : 1, c);
+    result.append(c == '"' ? 2 : 1, c);  // doubles the quotes within
   }
   return result + '"';
 }
@@ -44,7 +44,7 @@ TextOf csvRows(Form const& form, bool isForTerminal) {
     for (auto const* field : fields) {
       std::string text;
       appendExact(text, field->value(outcome));
-      if (isForTerminal) {
+      if (isForTerminal) {  // `escapedPath` also shows the bytes that are not UTF-8
         text = field->name == "path" ? escapedPath(outcome.path) : escaped(text);
       }
       row += quoted(text) + ',';

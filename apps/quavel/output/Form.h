@@ -8,6 +8,7 @@
 
 namespace app {
 
+/// Automatic: an explanation with `hasNotes`, else a card for a single file, else a table.
 enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 
 /// How the files are shown.
@@ -15,10 +16,10 @@ struct Form {
   FormKind kind = FormKind::Automatic;
   Fields fields;                      ///< Empty: the form chooses them.
   Field const* sort = nullptr;        ///< Null: the order of the input.
-  bool isDescending = false;          ///< Sorted in descending order.
+  bool isDescending = false;          ///< With `sort`: in descending order.
   std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
   std::optional<bool> showAbsent;     ///< Not set: the form decides.
-  bool hasNotes = false;              ///< The notes of the read are shown too.
+  bool hasNotes = false;              ///< The notes of the read are shown.
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 

@@ -9,7 +9,7 @@
 
 namespace app {
 
-/// What a form shows of one file. Called on any thread.
+/// Gives the text that a form shows for one file. Called on any thread.
 using TextOf = std::function<std::string(Outcome const&)>;
 
 /// A card: labelled lines for people. Empty when the file gave no record.

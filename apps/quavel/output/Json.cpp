@@ -9,15 +9,12 @@ namespace app {
 
 namespace {
 
-// Bytes, enough for most records: growing the text step by step would cost more than filling it.
-constexpr std::size_t kUsualObject = 700;
-
 bool needsEscape(std::string const& text) {
   return !isPlain(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
 }
 
-/// Appends a value that is not absent. Nearly all texts need no escape; the others are left to the
-/// JSON library. What would steer a terminal is written as \uNNNN when the text goes to one.
+/// Appends a value that is not absent. The JSON library writes the few texts that need escapes. If
+/// such a text could steer a terminal, the terminal gets \uNNNN for all that is not ASCII.
 void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
@@ -33,7 +30,7 @@ void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   }
 }
 
-constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};
+constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};  // by QVNoteKind
 
 /// The notes as a JSON member; what does not apply to a note is left out.
 std::string notesOf(Outcome const& outcome, bool isForTerminal) {
@@ -92,22 +89,24 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  bool const mayAddBytes = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, mayAddBytes, ofRecord = membersOf(fields),
+  // Goes with each path that is not valid UTF-8; other paths do not have this field.
+  bool const addsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
+  return [&form, isForTerminal, addsPathBytes, ofRecord = membersOf(fields),
           ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
                                  fieldNamed("position")}),
           pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
     std::string object;
-    object.reserve(kUsualObject);
+    object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
     appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome,
                   form.showAbsent.value_or(true), isForTerminal);
-    if (mayAddBytes || !outcome.record) {
-      appendMembers(object, pathBytes, outcome, false, isForTerminal);
+    if (addsPathBytes || !outcome.record) {
+      appendMembers(object, pathBytes, outcome, /*showAbsent=*/false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
     object.resize(std::max<std::size_t>(object.size(), 1));  // it may have no members
     object.front() = '{';                                    // in place of the first comma
-    return object += form.kind == FormKind::Jsonl ? "}\n" : "}";
+    object += form.kind == FormKind::Jsonl ? "}\n" : "}";
+    return object;
   };
 }
 

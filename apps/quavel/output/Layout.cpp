@@ -8,7 +8,7 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kGap = 2;
+constexpr std::size_t kGap = 2;  // blanks between columns
 
 /// Shortens the widest columns first, each down to its minimum, until the line fits or no column
 /// can be shortened further.
@@ -28,7 +28,7 @@ void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t lin
   }
 }
 
-/// The shown column to leave out first; the number of columns when all that are shown must stay.
+/// The shown column to leave out first; `columns.size()` when none may be left out.
 std::size_t mostDispensable(std::vector<Column> const& columns, Widths const& widths) {
   std::size_t found = columns.size();
   int highest = 0;
@@ -78,7 +78,7 @@ std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
     std::string const text =
         columns[i].keepsEnd ? keepEnd(texts[i], widths[i]) : keepStart(texts[i], widths[i]);
     line.append(gap, ' ').append(text);
-    gap = widths[i] - std::min(widths[i], cells(text)) + kGap;
+    gap = widths[i] - cells(text) + kGap;
   }
   return line + '\n';
 }

@@ -7,21 +7,21 @@
 
 namespace app {
 
-/// How a table's column is shortened when the table is wider than the terminal.
+/// A table's column, and how it is shortened when the table is wider than the terminal.
 struct Column {
   std::string label;
-  std::size_t least;  ///< Cells that it can be shortened to.
+  std::size_t least;  ///< The fewest terminal cells that it can be shortened to.
   int rank;           ///< The column with the highest rank is left out first; 0: never.
-  bool keepsEnd;      ///< Shortened at its start.
+  bool keepsEnd;      ///< Shortened at its start; true only for the path.
 };
 
-/// Widths in cells; 0: the column is left out.
+/// The widths of all columns, in terminal cells; 0: the column is left out.
 using Widths = std::vector<std::size_t>;
 
-/// The cells that a line takes.
+/// The width of a line with columns of these widths and the gaps between them.
 std::size_t lineWidth(Widths const& widths);
 
-/// The widths for columns whose longest cells take `natural`, in a line of `line` cells.
+/// The `natural` widths, reduced as `columns` allow until a line takes at most `line` cells.
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line);
 
 /// One line of the table, with its line end.

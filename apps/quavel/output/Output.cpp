@@ -16,8 +16,8 @@ namespace app {
 
 namespace {
 
-/// Writes the whole piece, unless an interrupt comes before any of it has been written.
-void write(std::string_view bytes) {
+/// Writes all bytes, unless an interrupt comes before any of them has been written.
+void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
     ssize_t const count = ::write(STDOUT_FILENO, bytes.data(), bytes.size());
@@ -25,15 +25,15 @@ void write(std::string_view bytes) {
       bytes.remove_prefix(static_cast<std::size_t>(count));
       isBegun = true;
     } else if (errno == EAGAIN) {
-      pollfd waiting = {STDOUT_FILENO, POLLOUT, 0};
-      ::poll(&waiting, 1, -1);
+      pollfd writable = {STDOUT_FILENO, POLLOUT, 0};
+      ::poll(&writable, 1, -1);  // without a timeout
     } else if (errno == EPIPE) {
       throw OutputClosed();
     } else if (errno != EINTR) {
       throw std::system_error(errno, std::generic_category());
     }
     if (!isBegun) {
-      interrupt::leaveIfAsked();
+      interrupt::leaveIfSignalled();
     }
   }
 }
@@ -57,16 +57,15 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes up to PIPE_BUF bytes whole or not at all. So an interrupt cuts none of the pieces
-  // in such a write, even while the pipe's reader keeps us waiting.
-  std::size_t const most = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
-  std::string_view const all = pending_;
+  // A pipe takes up to PIPE_BUF bytes whole or not at all. So an interrupt cuts no piece of such a
+  // write, even while the pipe's reader keeps us waiting. Writes to a regular file do not wait.
+  std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
     bool const isLast = i + 1 == ends_.size();
-    if (isLast || ends_[i + 1] - begin > most) {  // the next piece would be too much
+    if (isLast || ends_[i + 1] - begin > maxWrite) {  // no room for the next piece
       interrupt::WriteScope const scope;
-      write(all.substr(begin, ends_[i] - begin));
+      writeWhole(std::string_view(pending_).substr(begin, ends_[i] - begin));
       begin = ends_[i];
     }
   }
@@ -76,7 +75,7 @@ void Output::flush() {
 
 void Output::enclose(std::string_view head, char const* tail) {
   interrupt::WriteScope const scope;
-  write(head);
+  writeWhole(head);
   tail_ = tail;
   interrupt::setTail(tail);
 }
@@ -84,16 +83,16 @@ void Output::enclose(std::string_view head, char const* tail) {
 void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
-  interrupt::setTail(nullptr);
+  interrupt::setTail(nullptr);  // so that the tail is never written twice
   if (char const* const tail = std::exchange(tail_, nullptr)) {
-    write(tail);
+    writeWhole(tail);
   }
 }
 
 void Output::giveUp() noexcept {
   try {
     finish();
-  } catch (...) {  // NOLINT(bugprone-empty-catch): the caller reports what came first
+  } catch (...) {  // NOLINT(bugprone-empty-catch): the caller reports the first failure
   }
 }
 

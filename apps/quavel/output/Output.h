@@ -19,14 +19,13 @@ class Output {
 
   /// Holds the piece until the next `flush`.
   void add(std::string_view piece);
-  /// Throws OutputClosed, or std::system_error when the output cannot be written.
+  /// Writes what is held. Throws OutputClosed, or std::system_error for any other failure.
   void flush();
-  /// Writes the head now, and the tail once: at `finish` or when the command is interrupted. The
-  /// tail is not copied.
+  /// Writes the head now, the tail at `finish` or on an interrupt. The tail is not copied.
   void enclose(std::string_view head, char const* tail);
-  /// Flushes and writes the tail.
+  /// Flushes, and writes the tail unless that has been done.
   void finish();
-  /// Does the same after a failure, and throws nothing.
+  /// Tries to finish after a failure; throws nothing.
   void giveUp() noexcept;
 
   bool isTerminal() const { return isTerminal_; }

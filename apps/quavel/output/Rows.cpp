@@ -7,13 +7,14 @@ namespace app::rows {
 
 namespace {
 
-constexpr std::size_t kMinChosen = 3;   // cells that the column of a chosen field keeps
-constexpr std::size_t kMinPath = 8;     // the same for the path
-constexpr std::size_t kDateColumn = 1;  // among the default columns
-constexpr std::size_t kDay = 10;        // "2018-02-21"
-constexpr std::size_t kMinute = 16;     // "2018-02-21 12:08"
+constexpr std::size_t kLeastWidth = 3;      // of the column of a chosen field
+constexpr std::size_t kLeastPathWidth = 8;  // the same if the field is the path
+constexpr std::size_t kDateColumn = 1;      // its index among the default columns
+constexpr std::size_t kDay = 10;            // the length of "2018-02-21"
+constexpr std::size_t kMinute = 16;         // the length of "2018-02-21 12:08"
 
 std::vector<Column> defaultColumns() {
+  // Label, least width, rank, whether it keeps its end.
   return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};
@@ -30,11 +31,12 @@ std::string toTheMinute(std::string const& date) {
 }
 
 std::string withoutVerb(std::string const& orientation) {
-  constexpr std::string_view kVerb = "turn ";
-  return orientation.substr(orientation.rfind(kVerb, 0) == 0 ? kVerb.size() : 0);
+  constexpr std::string_view kVerb = "turn ";  // as in "turn 90 CW"
+  bool const beginsWithVerb = orientation.compare(0, kVerb.size(), kVerb) == 0;
+  return beginsWithVerb ? orientation.substr(kVerb.size()) : orientation;
 }
 
-Cells defaultCells(Outcome const& outcome) {
+Row defaultRow(Outcome const& outcome) {
   return {escapedPath(outcome.path),       toTheMinute(wordsOf("captureDate", outcome)),
           words::size(*outcome.record),    withoutVerb(wordsOf("orientation", outcome)),
           wordsOf("model", outcome),       wordsOf("lensModel", outcome),
@@ -50,24 +52,24 @@ std::vector<Column> columnsOf(Fields const& fields) {
   std::vector<Column> columns;
   for (auto const* field : fields) {
     bool const isPath = field->name == "path";
-    columns.push_back({field->label, isPath ? kMinPath : kMinChosen, 0, isPath});
+    columns.push_back({field->label, isPath ? kLeastPathWidth : kLeastWidth, 0, isPath});
   }
   return columns;
 }
 
-Cells cellsOf(Fields const& fields, Outcome const& outcome) {
+Row rowOf(Fields const& fields, Outcome const& outcome) {
   if (fields.empty()) {
-    return defaultCells(outcome);
+    return defaultRow(outcome);
   }
-  Cells cells;
+  Row row;
   for (auto const* field : fields) {
-    cells.push_back(inWords(*field, outcome));
+    row.push_back(inWords(*field, outcome));
   }
-  return cells;
+  return row;
 }
 
-void dropTime(Cells& cells) {
-  std::string& date = cells[kDateColumn];
+void dropTime(Row& row) {
+  std::string& date = row[kDateColumn];
   if (date.size() == kMinute && date[4] == '-' && date[13] == ':') {
     date.resize(kDay);
   }

@@ -7,17 +7,16 @@
 #include "output/Layout.h"
 #include "photo/Field.h"
 
-/// What a table shows of each photo.
+/// What a table shows of each photo. Empty `fields` stand for what a photographer looks for first.
 namespace app::rows {
 
-using Cells = std::vector<std::string>;
+using Row = std::vector<std::string>;
 
-/// The columns of the chosen fields; if none are, what a photographer looks for first.
 std::vector<Column> columnsOf(Fields const& fields);
 /// The row of a file that gave a record; an absent value is empty.
-Cells cellsOf(Fields const& fields, Outcome const& outcome);
-/// Shortens the date in a row of default columns to the day.
-void dropTime(Cells& cells);
+Row rowOf(Fields const& fields, Outcome const& outcome);
+/// Shortens the date to the day, in a row made with empty `fields`.
+void dropTime(Row& row);
 
 }  // namespace app::rows
 

@@ -15,18 +15,18 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kPage = 500;  // rows
-constexpr auto kFlushInterval = std::chrono::milliseconds(200);
-constexpr auto kFirstFlushInterval = std::chrono::milliseconds(12);  // so that rows show soon
+constexpr std::size_t kMostRows = 500;                      // in a page
+constexpr auto kPageTime = std::chrono::milliseconds(200);  // a terminal waits no longer for a page
+constexpr auto kFirstPageTime = std::chrono::milliseconds(12);  // nobody notices so short a wait
 
-/// The folder that all paths of the rows are in, with a "/" at its end; empty when there is none.
-std::string commonFolder(std::vector<std::vector<std::string>> const& rows, std::size_t column) {
+/// The folder that all paths in the column are in, with a "/" at its end; empty when there is none.
+std::string commonFolder(std::vector<rows::Row> const& rows, std::size_t column) {
   std::string folder = rows.front()[column];
   for (auto const& row : rows) {
     std::string const& path = row[column];
     auto const difference = std::mismatch(folder.begin(), folder.end(), path.begin(), path.end());
     folder.erase(difference.first, folder.end());
-    folder.erase(folder.rfind('/') + 1);  // everything, if there is no "/"
+    folder.erase(folder.rfind('/') + 1);  // without a "/": from npos + 1, which is 0
   }
   return folder.size() <= 2 ? "" : folder;  // such as "./": too short to save room
 }
@@ -42,28 +42,29 @@ class Table : public Writer {
 
  private:
   void writePage(bool isLast);
-  void widen(bool isLast);
-  void fitTerminal();
-  bool fitsLayout(std::size_t line) const;
+  void layOutUncut(bool isLast);
+  void layOutForTerminal();
+  bool pageFitsLayout(std::size_t line) const;
   void writeHeader();
-  Widths naturalWidths(bool showAll) const;
-  std::vector<std::string> inLayout(std::vector<std::string> cells) const;
+  Widths naturalWidths(bool mustShowEmpty = false) const;
+  rows::Row inLayout(rows::Row row) const;
 
   Form const& form_;
   Output& output_;
   std::vector<Column> columns_;
-  std::vector<std::vector<std::string>> page_;
-  std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
-  std::size_t files_ = 0;
-  std::atomic<bool> isCardLikely_{true};  // false once a file is added; records are kept until then
-  Outcome first_;                         // becomes a card if no other file follows
   bool isTerminal_;
-  std::size_t pathColumn_ = 0;  // columns_.size() when there is none
-  std::size_t line_ = 0;        // the terminal's width in the layout in use
-  std::string folder_;          // of all paths, when it stands above the table
-  bool hasDaysOnly_ = false;    // dates are shown without the time
-  Widths natural_;              // in the layout in use; empty before the first page
-  Widths widths_;
+  std::size_t pathColumn_ = 0;  // the one that keeps its end; columns_.size() when there is none
+  std::size_t files_ = 0;
+  std::atomic<bool> keepsRecords_{true};  // until the first file is added: a card needs its record
+  Outcome first_;                         // becomes a card if no other file follows
+  std::vector<rows::Row> page_;
+  std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
+  // The layout of the rows below the last header:
+  Widths natural_;            // the columns' widths if nothing is cut; empty before the first page
+  Widths widths_;             // the columns' widths as shown
+  std::size_t line_ = 0;      // the terminal's width
+  std::string folder_;        // stands above the header and is removed from the paths
+  bool hasDaysOnly_ = false;  // dates are shown without the time
 };
 
 Table::Table(Form const& form, Output& output)
@@ -78,8 +79,8 @@ Table::Table(Form const& form, Output& output)
 
 void Table::prepare(Outcome& outcome) const {
   if (outcome.record) {
-    outcome.cells = rows::cellsOf(form_.fields, outcome);
-    if (!isCardLikely_) {
+    outcome.cells = rows::rowOf(form_.fields, outcome);
+    if (!keepsRecords_) {
       outcome.record.reset();
     }
   }
@@ -88,27 +89,27 @@ void Table::prepare(Outcome& outcome) const {
 void Table::add(Outcome&& outcome) {
   if (++files_ == 1) {
     first_ = outcome;
-    isCardLikely_ = false;
+    keepsRecords_ = false;
   }
   auto const now = std::chrono::steady_clock::now();
-  if (page_.empty() && !natural_.empty()) {  // the first page started with the command
+  bool const isFirstPage = natural_.empty();  // its time counts from the start of the command
+  if (page_.empty() && !isFirstPage) {
     pageStart_ = now;
   }
   if (!outcome.cells.empty()) {
     page_.push_back(std::move(outcome.cells));
   }
-  auto const interval = natural_.empty() ? kFirstFlushInterval : kFlushInterval;
-  // Sorted rows come all at once, so no page needs to be short. A first file may become a card.
-  bool const isDue =
-      isTerminal_ && form_.sort == nullptr && files_ > 1 && now - pageStart_ > interval;
-  if (page_.size() == kPage || isDue) {
-    writePage(false);
+  auto const pageTime = isFirstPage ? kFirstPageTime : kPageTime;
+  // Sorted rows come all at once, so no page needs to be short. A single file may become a card.
+  bool const isDue = isTerminal_ && !form_.sort && files_ > 1 && now - pageStart_ > pageTime;
+  if (page_.size() == kMostRows || isDue) {
+    writePage(/*isLast=*/false);
   }
 }
 
 void Table::pause() {
   if (isTerminal_ && files_ > 1) {
-    writePage(false);
+    writePage(/*isLast=*/false);
   }
 }
 
@@ -116,7 +117,7 @@ void Table::end() {
   if (files_ == 1 && form_.kind == FormKind::Automatic) {
     output_.add(cardOf(form_, first_));
   } else {
-    writePage(true);
+    writePage(/*isLast=*/true);
   }
 }
 
@@ -125,9 +126,9 @@ void Table::writePage(bool isLast) {
     return;
   }
   if (isTerminal_) {
-    fitTerminal();
+    layOutForTerminal();
   } else {
-    widen(isLast);
+    layOutUncut(isLast);
   }
   for (auto& row : page_) {
     row = inLayout(std::move(row));
@@ -138,12 +139,13 @@ void Table::writePage(bool isLast) {
 }
 
 /// One header serves all pages, so an empty column is left out only if there is just one page.
-void Table::widen(bool isLast) {
+void Table::layOutUncut(bool isLast) {
   bool const isFirst = natural_.empty();
-  Widths const natural = naturalWidths(!(isFirst && isLast));
-  natural_.resize(columns_.size());
-  std::transform(natural.begin(), natural.end(), natural_.begin(), natural_.begin(),
-                 [](std::size_t a, std::size_t b) { return std::max(a, b); });
+  Widths const ofPage = naturalWidths(/*mustShowEmpty=*/!(isFirst && isLast));
+  natural_.resize(ofPage.size());
+  for (std::size_t i = 0; i < ofPage.size(); ++i) {
+    natural_[i] = std::max(natural_[i], ofPage[i]);
+  }
   widths_ = natural_;
   if (isFirst) {
     writeHeader();
@@ -151,36 +153,36 @@ void Table::widen(bool isLast) {
 }
 
 /// Leaves out what does not fit: the common folder, then parts of cells, then times, then columns.
-void Table::fitTerminal() {
+void Table::layOutForTerminal() {
   std::size_t const line = terminalWidth(STDOUT_FILENO);
-  if (fitsLayout(line)) {
+  if (pageFitsLayout(line)) {
     return;
   }
-  output_.add(natural_.empty() ? "" : "\n");
+  output_.add(natural_.empty() ? "" : "\n");  // a blank line between two layouts
   line_ = line;
   folder_.clear();
   hasDaysOnly_ = false;
-  natural_ = naturalWidths(false);
+  natural_ = naturalWidths();
   if (lineWidth(natural_) > line && pathColumn_ < columns_.size()) {
     folder_ = commonFolder(page_, pathColumn_);
-    natural_ = naturalWidths(false);
+    natural_ = naturalWidths();
   }
   widths_ = fit(columns_, natural_, line);
   auto const hidden = [](Widths const& all) { return std::count(all.begin(), all.end(), 0U); };
-  if (form_.fields.empty() && hidden(widths_) > hidden(natural_)) {
+  if (form_.fields.empty() && hidden(widths_) > hidden(natural_)) {  // chosen dates stay whole
     hasDaysOnly_ = true;
-    natural_ = naturalWidths(false);
+    natural_ = naturalWidths();
     widths_ = fit(columns_, natural_, line);
   }
   output_.add(folder_.empty() ? "" : "In " + folder_ + "\n");
   writeHeader();
 }
 
-bool Table::fitsLayout(std::size_t line) const {
-  auto const isInFolder = [this](std::vector<std::string> const& row) {
+bool Table::pageFitsLayout(std::size_t line) const {
+  auto const isInFolder = [this](rows::Row const& row) {
     return folder_.empty() || row[pathColumn_].compare(0, folder_.size(), folder_) == 0;
   };
-  Widths const natural = naturalWidths(false);
+  Widths const natural = naturalWidths();
   return line == line_ && std::all_of(page_.begin(), page_.end(), isInFolder) &&
          std::equal(natural.begin(), natural.end(), natural_.begin(), natural_.end(),
                     std::less_equal<>());  // no column is wider than in the layout
@@ -194,31 +196,32 @@ void Table::writeHeader() {
   output_.add(lineOf(columns_, widths_, labels));
 }
 
-Widths Table::naturalWidths(bool showAll) const {
-  bool const showAbsent = showAll || form_.showAbsent.value_or(!form_.fields.empty());
+/// The widths of the page's columns if nothing is cut; 0 for an empty column that is not shown.
+Widths Table::naturalWidths(bool mustShowEmpty) const {
+  bool const showEmpty = mustShowEmpty || form_.showAbsent.value_or(!form_.fields.empty());
   Widths natural(columns_.size(), 0);
   for (auto const& row : page_) {
     auto const shown = inLayout(row);
     for (std::size_t i = 0; i < shown.size(); ++i) {
-      natural[i] = std::max(natural[i], app::cells(shown[i]));
+      natural[i] = std::max(natural[i], cells(shown[i]));
     }
   }
   for (std::size_t i = 0; i < natural.size(); ++i) {
-    if (natural[i] > 0 || showAbsent) {
+    if (natural[i] > 0 || showEmpty) {
       natural[i] = std::max(natural[i], columns_[i].label.size());
     }
   }
   return natural;
 }
 
-std::vector<std::string> Table::inLayout(std::vector<std::string> cells) const {
+rows::Row Table::inLayout(rows::Row row) const {
   if (!folder_.empty()) {
-    cells[pathColumn_].erase(0, folder_.size());
+    row[pathColumn_].erase(0, folder_.size());
   }
   if (hasDaysOnly_) {
-    rows::dropTime(cells);
+    rows::dropTime(row);
   }
-  return cells;
+  return row;
 }
 
 }  // namespace

@@ -28,7 +28,7 @@ class TextWriter : public Writer {
   }
   void add(Outcome&& outcome) override {
     if (!outcome.text.empty()) {
-      output_.add(start_.empty() ? outcome.text : outcome.text.insert(0, start_));
+      output_.add(outcome.text.insert(0, start_));
       start_ = separator_;
     }
   }
@@ -47,9 +47,25 @@ class SortingWriter : public Writer {
   SortingWriter(Form const& form, std::unique_ptr<Writer> next)
       : form_(form), next_(std::move(next)) {}
 
-  void prepare(Outcome&) const override {}  // sorting needs the record
+  void prepare(Outcome&) const override {}  // in `end`: sorting needs the record
   void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
-  void end() override;
+  void end() override {
+    auto const isBefore = [this](Outcome const& a, Outcome const& b) {
+      Value const left = compared(*form_.sort, a);
+      Value const right = compared(*form_.sort, b);
+      if (isAbsent(left) || isAbsent(right)) {
+        return !isAbsent(left) && isAbsent(right);  // absent values come last
+      }
+      return form_.isDescending ? right < left : left < right;
+    };
+    std::stable_sort(outcomes_.begin(), outcomes_.end(), isBefore);
+    for (auto& outcome : outcomes_) {
+      next_->prepareSafely(outcome);
+      next_->add(std::move(outcome));
+      outcome = {};  // frees its memory
+    }
+    next_->end();
+  }
 
  private:
   Form const& form_;
@@ -57,29 +73,11 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-void SortingWriter::end() {
-  auto const isBefore = [this](Outcome const& a, Outcome const& b) {
-    Value const left = compared(*form_.sort, a);
-    Value const right = compared(*form_.sort, b);
-    if (isAbsent(left) || isAbsent(right)) {
-      return !isAbsent(left) && isAbsent(right);  // absent values come last
-    }
-    return form_.isDescending ? right < left : left < right;
-  };
-  std::stable_sort(outcomes_.begin(), outcomes_.end(), isBefore);
-  for (auto& outcome : outcomes_) {
-    next_->prepareSafely(outcome);
-    next_->add(std::move(outcome));
-    outcome = {};  // frees its memory
-  }
-  next_->end();
-}
-
-/// A file without a record is shown only where a condition chose it.
+/// Each path with a NUL behind it. A file without a record is shown only if conditions chose it.
 TextOf paths(Form const& form, bool isForTerminal) {
-  return [isChosen = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
+  return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
-    return outcome.record || isChosen ? path + '\0' : std::string();
+    return outcome.record || hasConditions ? path + '\0' : std::string();
   };
 }
 
@@ -101,14 +99,12 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
       return writer(paths(form, isTerminal), "", "");
     case FormKind::Card:
       return writer([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
-    default:  // Automatic with notes
+    default:  // Automatic with notes: `makeTable` makes all tables
       return writer(explanationOf, "", "\n");
   }
 }
 
 }  // namespace
-
-Writer::~Writer() = default;
 
 void Writer::prepareSafely(Outcome& outcome) const {
   try {

@@ -12,17 +12,17 @@ namespace app {
 class Writer {
  public:
   Writer() = default;
-  virtual ~Writer();
+  virtual ~Writer() = default;
   Writer(Writer const&) = delete;
   Writer& operator=(Writer const&) = delete;
 
-  /// Does the form's part of the work on one file, on any thread. Drops what is no longer needed.
+  /// Sets the outcome's text or cells and drops what they replace. Called on any thread.
   virtual void prepare(Outcome& outcome) const = 0;
   /// The same, but an exception becomes the file's problem.
   void prepareSafely(Outcome& outcome) const;
-  /// Takes the prepared outcomes in the order of the output.
+  /// Takes a prepared outcome, in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
-  /// Writes what is held back, because nothing else may come for a while.
+  /// Writes what is held back. Called when the next outcome may take a while.
   virtual void pause() {}
   virtual void end() {}
 };

@@ -18,7 +18,7 @@ Console::Console() : isTerminal_(::isatty(STDERR_FILENO) == 1) {}
 
 void Console::printMessage(std::string const& message) {
   hideProgress();
-  // When standard error fails, there is nowhere else to report it.
+  // A failure is ignored: there is no other place to report it.
   interrupt::write(STDERR_FILENO, "quavel: " + message + "\n");
 }
 
@@ -28,8 +28,8 @@ void Console::printFileMessage(std::string const& path, std::string const& probl
 
 void Console::showProgress(std::string const& line) {
   isProgressShown_ = true;
-  interrupt::setProgressShown(true);
-  // The last cell stays free: some terminals go to the next line when it is written.
+  interrupt::setProgressShown(true);  // first, so that an interrupt erases a half-written line too
+  // Some terminals go to the next line once the last cell is written, so it stays free.
   interrupt::write(STDERR_FILENO,
                    interrupt::kEraseLine + keepStart(line, terminalWidth(STDERR_FILENO) - 1));
 }

@@ -6,17 +6,17 @@
 
 namespace app {
 
-/// Cells in a line of the terminal; 80 when it is unknown.
+/// The width in cells of the terminal that `fd` is open on; 80 when the width is unknown.
 std::size_t terminalWidth(int fd);
 
-/// Standard error: messages, and a progress line below them.
+/// Standard error: messages, and on a terminal a progress line below them.
 class Console {
  public:
   Console();
 
-  /// Prints "quavel: " and the message, which must be safe for a terminal.
+  /// Prints "quavel: " and the message, which must be safe for a terminal (see `escaped`).
   void printMessage(std::string const& message);
-  /// The same about a file, whose name and problem are made safe.
+  /// Prints "quavel: path: problem", with both escaped.
   void printFileMessage(std::string const& path, std::string const& problem);
 
   bool isTerminal() const { return isTerminal_; }

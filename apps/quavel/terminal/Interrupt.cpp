@@ -15,22 +15,21 @@ std::atomic<bool> isProgressShown{false};
 std::atomic<bool> isWriting{false};
 std::atomic<int> pendingSignal{0};
 
-/// Dies by the signal, so that a shell's loop around the command ends with it.
+/// Dies by the signal, so that a shell's loop around the command ends too.
 [[noreturn]] void die() {
   int const signal = pendingSignal;
-  sigset_t own;
-  ::sigemptyset(&own);
-  ::sigaddset(&own, signal);
+  sigset_t onlyThis;
+  ::sigemptyset(&onlyThis);
+  ::sigaddset(&onlyThis, signal);
   ::signal(signal, SIG_DFL);
-  ::pthread_sigmask(SIG_UNBLOCK, &own, nullptr);
+  ::pthread_sigmask(SIG_UNBLOCK, &onlyThis, nullptr);  // a handler runs with its signal blocked
   ::raise(signal);
-  ::_exit(128 + signal);
+  ::_exit(128 + signal);  // the status by which shells report a death by signal
 }
 
-/// Completes the output and the terminal's line, then dies.
+/// Erases the progress line and completes the output, then dies.
 [[noreturn]] void leave() {
-  ::alarm(1);  // in case nobody reads the tail
-  isWriting = true;
+  ::alarm(1);  // so that `handle` calls `die` if nobody reads the tail
   if (isProgressShown) {
     write(STDERR_FILENO, kEraseLine);
   }
@@ -42,16 +41,16 @@ std::atomic<int> pendingSignal{0};
 
 void handle(int signal) {
   if (pendingSignal != 0) {
-    if (signal == SIGALRM) {
+    if (signal == SIGALRM) {  // the second is over
       die();
     }
-    return;  // it is ending already, within the alarm's second
+    return;  // the process is ending already
   }
   pendingSignal = signal;
   if (!isWriting) {
     leave();
   }
-  ::alarm(1);
+  ::alarm(1);  // the longest time that the WriteScope may still take
 }
 
 }  // namespace
@@ -69,8 +68,8 @@ void write(int fd, std::string_view bytes) {
 
 void install() {
   struct sigaction action = {};
-  action.sa_handler = handle;  // without SA_RESTART: a write that waits returns
-  // No signal but the alarm interrupts the handling of another.
+  action.sa_handler = handle;  // without SA_RESTART, so that a blocked write fails with EINTR
+  // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);
   ::sigaction(SIGALRM, &action, nullptr);
@@ -86,10 +85,10 @@ void install() {
 BlockSignals::BlockSignals() {
   sigset_t all;
   ::sigfillset(&all);
-  ::pthread_sigmask(SIG_SETMASK, &all, &previous_);
+  ::pthread_sigmask(SIG_SETMASK, &all, &previousMask_);
 }
 
-BlockSignals::~BlockSignals() { ::pthread_sigmask(SIG_SETMASK, &previous_, nullptr); }
+BlockSignals::~BlockSignals() { ::pthread_sigmask(SIG_SETMASK, &previousMask_, nullptr); }
 
 void setTail(char const* tail) { tailToWrite = tail; }
 
@@ -99,10 +98,10 @@ WriteScope::WriteScope() { isWriting = true; }
 
 WriteScope::~WriteScope() {
   isWriting = false;
-  leaveIfAsked();
+  leaveIfSignalled();
 }
 
-void leaveIfAsked() {
+void leaveIfSignalled() {
   if (pendingSignal != 0) {
     leave();
   }

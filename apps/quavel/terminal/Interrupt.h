@@ -5,15 +5,16 @@
 
 #include <string_view>
 
-/// Ends the process at once, by the signal itself, when the user or the system sends one. No thread
-/// waits for signals: a second thread makes every system call of a reader more expensive.
+/// SIGINT, SIGTERM and SIGHUP complete the output at once and end the process. A signal handler
+/// does this, not a waiting thread, which would make every system call on a file slower.
 namespace app::interrupt {
 
-/// Must be called once, on the thread that writes, before any other is started. Signals that the
-/// process already ignores stay ignored.
+/// Installs the handler. To be called once, before any thread is started. Signals that the process
+/// ignores, as under nohup, stay ignored.
 void install();
 
-/// While it lives, threads that the calling thread starts do not receive the signals.
+/// Threads that the calling thread starts while this lives receive no signals, so that the handler
+/// runs on the thread that writes.
 class BlockSignals {
  public:
   BlockSignals();
@@ -22,23 +23,22 @@ class BlockSignals {
   BlockSignals& operator=(BlockSignals const&) = delete;
 
  private:
-  sigset_t previous_;
+  sigset_t previousMask_;
 };
 
-/// The characters that erase a terminal's line.
 inline constexpr char kEraseLine[] = "\r\x1b[K";
 
-/// Writes the bytes, as far as possible. A signal handler may call it.
+/// Writes the bytes, up to the first failure. Safe to call in a signal handler.
 void write(int fd, std::string_view bytes);
 
-/// Sets the text that an interrupt writes to standard output at the end; null: none. Not copied.
+/// Sets what an interrupt writes to standard output last; null: nothing. The text is not copied.
 void setTail(char const* tail);
 
-/// States whether the terminal shows a progress line, which an interrupt must erase.
+/// Sets whether the terminal shows a progress line, which an interrupt would then erase.
 void setProgressShown(bool isShown);
 
-/// While one lives, an interrupt waits for the write in progress, but for a second at most. Further
-/// signals change nothing.
+/// A signal that arrives while this lives ends the process only when this is destroyed, or after a
+/// second. Further signals have no effect.
 class WriteScope {
  public:
   WriteScope();
@@ -47,8 +47,8 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// Ends the process if a signal has been waiting for a scope to end.
-void leaveIfAsked();
+/// Ends the process now if a signal is waiting for the end of a WriteScope.
+void leaveIfSignalled();
 
 }  // namespace app::interrupt
 

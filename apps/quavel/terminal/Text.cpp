@@ -13,9 +13,9 @@ namespace {
 
 constexpr std::string_view kEllipsis = "…";
 
-/// One character, or one byte that is not part of a valid one.
+/// One character, or one byte that is not part of a valid character.
 struct Character {
-  utf8proc_int32_t code;  // the byte itself, when it is not valid
+  utf8proc_int32_t code;  // of an invalid byte: its value
   std::string_view bytes;
   bool isValid;
 };
@@ -39,14 +39,14 @@ std::size_t cellsOf(Character const& character) {
     case UTF8PROC_BOUNDCLASS_T:
       return 0;  // the later letters of a Hangul syllable, within the cells of the first
     case UTF8PROC_BOUNDCLASS_PREPEND:
-      return 1;  // also the Arabic signs that enclose a number
+      return 1;  // the Arabic signs that enclose a number have a charwidth of 0
     default:
-      // Unlike other marks, these stand beside their letter.
+      // Spacing marks too have a charwidth of 0, although they stand beside their letter.
       return property->category == UTF8PROC_CATEGORY_MC ? 1 : property->charwidth;
   }
 }
 
-/// Whether it has no glyph of its own but changes how its neighbours or the line appear.
+/// Whether a character has no glyph of its own but changes how others or the line appear.
 bool isHidden(Character const& character) {
   constexpr utf8proc_int32_t kNonJoiner = 0x200c;
   constexpr utf8proc_int32_t kJoiner = 0x200d;
@@ -64,13 +64,13 @@ bool isHidden(Character const& character) {
   }
 }
 
-std::string shown(Character const& character) {
+std::string escapeFor(Character const& character) {
   if (character.code == '\n' || character.code == '\t') {
     return character.code == '\n' ? "\\n" : "\\t";
   }
   char text[16];
-  bool const isByte = !character.isValid || character.code < 0x80;
-  std::snprintf(text, sizeof text, isByte ? "\\x%02x" : "\\u{%04x}",
+  bool const isOneByte = !character.isValid || character.code < 0x80;
+  std::snprintf(text, sizeof text, isOneByte ? "\\x%02x" : "\\u{%04x}",
                 static_cast<unsigned>(character.code));
   return text;
 }
@@ -86,21 +86,21 @@ bool isUtf8(std::string_view text) {
 }  // namespace
 
 bool isPlain(std::string_view text) {
-  // Eight characters at a time: subtracting ' ' or adding 1 sets the top bit of any byte that is
-  // not visible ASCII, unless it is set already. Only such a byte carries into the next one.
+  // Eight bytes at a time. Bytes from 0x80 on have the top bit; those below ' ' get it when ' ' is
+  // subtracted, and 0x7f when 1 is added. Printable bytes never get it, and never borrow or carry.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = kSpaces;
-  std::uint64_t tops = 0;
+  std::uint64_t found = 0;
   for (; text.size() >= sizeof word; text.remove_prefix(sizeof word)) {
     std::memcpy(&word, text.data(), sizeof word);
-    tops |= word | (word - kSpaces) | (word + kOnes);
+    found |= word | (word - kSpaces) | (word + kOnes);
   }
-  for (char const c : text) {  // less than a word: the rest of it is spaces, or has been looked at
+  for (char const c : text) {  // fewer than eight; the other bytes are spaces or already seen
     word = (word << 8U) | static_cast<unsigned char>(c);
   }
-  tops |= word | (word - kSpaces) | (word + kOnes);
-  return (tops & (kOnes << 7U)) == 0;
+  found |= word | (word - kSpaces) | (word + kOnes);
+  return (found & (kOnes * 0x80)) == 0;
 }
 
 std::string textAsUtf8(std::string text) {
@@ -108,7 +108,7 @@ std::string textAsUtf8(std::string text) {
     return text;
   }
   std::string utf8;
-  for (char const c : text) {
+  for (char const c : text) {  // in Latin-1, a byte is the code of its character
     utf8proc_uint8_t bytes[4];
     auto const length = utf8proc_encode_char(static_cast<unsigned char>(c), bytes);
     utf8.append(bytes, bytes + length);
@@ -123,7 +123,7 @@ std::string pathAsUtf8(std::string const& path) {
   std::string utf8;
   for (std::string_view rest = path; !rest.empty();) {
     Character const next = takeCharacter(rest);
-    utf8 += next.isValid && next.code != 0 ? next.bytes : "\xef\xbf\xbd";
+    utf8 += next.isValid && next.code != 0 ? next.bytes : "\xef\xbf\xbd";  // U+FFFD
   }
   return utf8;
 }
@@ -135,7 +135,7 @@ std::string escaped(std::string const& text) {
   std::string result;
   for (std::string_view rest = text; !rest.empty();) {
     Character const next = takeCharacter(rest);
-    result += next.isValid && !isHidden(next) ? std::string(next.bytes) : shown(next);
+    result += next.isValid && !isHidden(next) ? std::string(next.bytes) : escapeFor(next);
   }
   return result;
 }
@@ -158,8 +158,8 @@ std::size_t cells(std::string_view text) {
   return sum;
 }
 
-std::string keepStart(std::string const& text, std::size_t width, std::size_t most) {
-  if (text.size() <= most && cells(text) <= width) {
+std::string keepStart(std::string const& text, std::size_t width, std::size_t maxBytes) {
+  if (text.size() <= maxBytes && cells(text) <= width) {
     return text;
   }
   std::size_t kept = 0;
@@ -167,7 +167,7 @@ std::string keepStart(std::string const& text, std::size_t width, std::size_t mo
   for (std::string_view rest = text; !rest.empty();) {
     Character const next = takeCharacter(rest);
     used += cellsOf(next);
-    if (used >= width || kept + next.bytes.size() > most) {
+    if (used >= width || kept + next.bytes.size() > maxBytes) {  // the last cell is for the "…"
       break;
     }
     kept += next.bytes.size();
@@ -176,17 +176,17 @@ std::string keepStart(std::string const& text, std::size_t width, std::size_t mo
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
-  std::size_t left = cells(text);
-  if (left <= width) {
+  std::size_t keptCells = cells(text);
+  if (keptCells <= width) {
     return text;
   }
   std::string_view kept = text;
   for (std::string_view rest = text; !rest.empty(); kept = rest) {
-    std::size_t const taken = cellsOf(takeCharacter(rest));
-    if (left < width && taken > 0) {  // a combining mark would attach to the ellipsis
+    std::size_t const firstCells = cellsOf(takeCharacter(rest));
+    if (keptCells < width && firstCells > 0) {  // a mark of no cells would attach to the "…"
       break;
     }
-    left -= taken;
+    keptCells -= firstCells;
   }
   return width == 0 ? "" : std::string(kEllipsis).append(kept);
 }
