@@ -203,6 +203,18 @@ class Endings(CommandTest):
             for line in lines[form == "--csv":]:
                 check(line)
 
+    def test_interrupt_completes_json_that_lacks_only_its_end(self):
+        length = len(self.run_quavel("-q", "--json", "a.tif").stdout.removesuffix(b"\n]\n"))
+        end, start = os.pipe()
+        fcntl.fcntl(start, fcntl.F_SETPIPE_SZ, 4096)
+        process = self.start("-q", "--json", "." + "/" * (4094 - length) + "a.tif", stdout=start)  # 1 byte is left
+        os.close(start)
+        time.sleep(0.1)
+        process.send_signal(signal.SIGINT)
+        with open(end, "rb") as pipe:
+            self.assertEqual(len(json.loads(pipe.read())), 1)
+        self.assertEqual(process.wait(60), -signal.SIGINT)
+
     def test_records_come_before_the_list_ends_and_ignored_interrupts_stay_ignored(self):
         with self.start("-q", "--jsonl", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
                         preexec_fn=lambda: signal.signal(signal.SIGINT, signal.SIG_IGN)) as process:

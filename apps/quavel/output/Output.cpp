@@ -83,10 +83,10 @@ void Output::enclose(std::string_view head, char const* tail) {
 void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
-  interrupt::setTail(nullptr);  // so that the tail is never written twice
   if (char const* const tail = std::exchange(tail_, nullptr)) {
-    writeWhole(tail);
+    writeWhole(tail);  // if an interrupt comes before any of it is written, the interrupt writes it
   }
+  interrupt::setTail(nullptr);
 }
 
 void Output::giveUp() noexcept {
