@@ -1,4 +1,3 @@
-#include <algorithm>
 #include <array>
 #include <cmath>
 #include <variant>
@@ -14,11 +13,11 @@ namespace {
 
 constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
-/// A field that can be absent.
+/// A field of the record that can be absent.
 struct FieldRow {
   char name[22];
-  std::uint8_t origin;    ///< It is computed from the field this many rows below; 0: from none.
-  std::uint8_t families;  ///< The readers that fill it.
+  std::uint8_t rowsToOrigin;  ///< Down to the field that it is computed from; 0: not computed.
+  std::uint8_t families;      ///< Whose readers fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
 
@@ -58,19 +57,19 @@ bool isAbsent(FieldRow const& row, QVMetadata const& record) {
 
 QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
   if ((row.families & format.family) == 0) {
-    std::string const text = row.families == kCr3
-                                 ? "given by CR3 files only"
-                                 : composed("never taken from {} files", {format.kind});
-    return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, 0};
+    bool const isCr3Only = row.families == kCr3;
+    std::string const text = isCr3Only ? "given by CR3 files only"
+                                       : composed("never taken from {} files", {format.name});
+    return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, /*systemError=*/0};
   }
-  FieldRow const& origin = *(&row + row.origin);  // the row itself, unless it is computed
-  auto const* const known = journal.absenceOf(origin.name);
-  QVNote note = known == nullptr ? QVNote() : *known;
+  FieldRow const& origin = *(&row + row.rowsToOrigin);  // the row itself, unless it is computed
+  auto const* const noted = journal.absenceOf(origin.name);
+  QVNote note = noted == nullptr ? QVNote() : *noted;  // null: a reader forgot to say why
   note.field = row.name;
   return note;
 }
 
-// Enough bytes for any of the signatures below, and for the brand.
+// Enough bytes for any of the signatures below, and for the brand of an ISO base media file.
 constexpr std::size_t kOpeningSize = 16;
 constexpr std::size_t kBrandPosition = 8;
 constexpr std::size_t kBrandSize = 4;
@@ -79,8 +78,8 @@ struct Signature {
   std::uint8_t position;
   std::uint8_t size;
   char bytes[9];
-  char kind[36];
-  std::uint8_t families;  ///< The readers of such files; 0: none.
+  char kind[36];          ///< As it stands after "looks like".
+  std::uint8_t families;  ///< Whose files begin like this; 0: no family's.
 };
 
 constexpr std::uint8_t kTiffFamilies = kTiff | kNef | kArw;
@@ -112,25 +111,27 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
     return;
   }
   std::array<std::uint8_t, kOpeningSize> opening;
-  std::size_t const size = readUpTo(stream, opening.data(), opening.size());
+  std::size_t const received = readUpTo(stream, opening.data(), opening.size());
   for (auto const& row : kSignatures) {
-    if (size < std::size_t{row.position} + row.size ||
+    if (received < std::size_t{row.position} + row.size ||
         std::memcmp(opening.data() + row.position, row.bytes, row.size) != 0) {
       continue;
     }
     if ((row.families & format.family) == 0) {
-      // Only an ISO base media file has its signature elsewhere than at 0, and a brand after it.
-      bool const hasBrand = row.position != 0 && size >= kBrandPosition + kBrandSize;
+      // Only the signature of ISO base media files is not at 0, and their brand follows it.
+      bool const hasBrand = row.position != 0 && received >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
-      std::string const kind =
-          hasBrand ? composed("{} of brand \"{}\"", {&row.kind[0], brand}) : row.kind;
-      for (QVNote& note : journal.notes) {  // how far the reader got in such a file says little
-        note.reason = note.kind == QVNoteKind::Refusal ? QVReason::OtherKind : note.reason;
+      char const* const kind = row.kind;
+      std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
+      for (QVNote& note : journal.notes) {
+        if (note.kind == QVNoteKind::Refusal) {
+          note.reason = QVReason::OtherKind;  // says more than where the wrong reader failed
+        }
       }
       journal.hint(QVReason::OtherContent, start,
-                   "The file looks like {}; its extension has it read as {}", {kind, format.kind});
+                   "The file looks like {}; its extension has it read as {}", {text, format.name});
     }
-    return;
+    return;  // the first signature that is there decides
   }
 }
 

@@ -24,10 +24,10 @@ namespace quavel::detail {
 
 namespace {
 
-/// Memory for a record of any class. None of the classes adds members to QVMetadata, so that one
-/// type is enough, and the library has one `shared_ptr` control block type instead of ten.
+/// Memory for a record of any class. The classes add no members to QVMetadata, so that one type is
+/// enough, and the library has one type of `shared_ptr` control block instead of ten.
 struct RecordStorage {
-  RecordStorage() {}  // does not set the bytes to zero
+  RecordStorage() {}  // with `= default`, `make_shared` would set the bytes to zero
   ~RecordStorage() { record->~QVMetadata(); }
 
   QVMetadata* record;
@@ -39,7 +39,7 @@ std::shared_ptr<QVMetadata> make() {
   static_assert(sizeof(Image) == sizeof(QVMetadata));
   auto const storage = std::make_shared<RecordStorage>();
   storage->record = new (storage->bytes) Image;
-  return {storage, storage->record};
+  return {storage, storage->record};  // points to the record and shares the storage
 }
 
 constexpr Format kFormats[] = {
@@ -56,25 +56,27 @@ char lowerCase(char letter) {
   return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
 }
 
-bool refuseExtension(Journal* journal, std::string const& extension) {
+void refuseExtension(Journal* journal, std::string const& extension) {
   std::string known;
   for (auto const& format : kFormats) {
     known.append(known.empty() ? "" : " ").append(format.extension);
   }
   if (extension.empty() || extension.find('/') != std::string::npos) {
-    return refuse(journal, QVReason::UnknownExtension, -1,
-                  "there is no extension; these name a format: {}", known);
+    refuse(journal, QVReason::UnknownExtension, -1,
+           "there is no extension; these name a format: {}", known);
+    return;
   }
   auto const* const bytes = reinterpret_cast<std::uint8_t const*>(extension.data());
+  // At most 100 bytes, so that the known ones fit into the note too.
   QuotedBytes const quoted = {bytes, std::min<std::size_t>(extension.size(), 100)};
-  return refuse(journal, QVReason::UnknownExtension, -1,
-                "the extension \"{}\" names no format; these do: {}", quoted, known);
+  refuse(journal, QVReason::UnknownExtension, -1,
+         "the extension \"{}\" names no format; these do: {}", quoted, known);
 }
 
 }  // namespace
 
 std::string extensionOf(std::string const& path) {
-  // If only a folder's name has a ".", the result contains a "/" and so names no format.
+  // If only a folder's name has a ".", the result contains a "/" and so is not a known extension.
   auto const dot = path.rfind('.');
   return dot == std::string::npos ? std::string() : path.substr(dot + 1);
 }
@@ -91,15 +93,12 @@ Format const* formatOf(std::string_view extension) {
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) {
   std::string extension = extensionOf(path);
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
-  int fd = -1;
-  auto stream = openReadAhead(path, &fd);
-  if (journal != nullptr && fd == -1) {
-    // The reader gets an empty stream and refuses it too, but the first refusal counts.
+  auto stream = openReadAhead(path, journal == nullptr ? nullptr : &journal->fd);
+  if (journal != nullptr && journal->fd == -1) {
+    // The reader below will refuse the empty stream too, but only the first refusal counts.
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));
-  } else if (journal != nullptr) {
-    journal->fd = fd;
   }
   return readStream(std::move(stream), extension, journal);
 }
@@ -118,7 +117,7 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     record = nullptr;
   }
   if (journal != nullptr) {
-    journal->format = format->kind;
+    journal->format = format->name;
     if (record) {
       noteAbsences(*format, *record, *journal);
     } else {

@@ -15,13 +15,13 @@ namespace detail {
 
 class Journal;
 
-/// Formats that are read in the same way, as one bit, so that families can be combined into sets.
+/// Families of formats that are read alike. Each is one bit, so that a number can hold a set.
 enum Family : unsigned { kTiff = 1, kNef = 2, kArw = 4, kJpeg = 8, kRaf = 16, kCr3 = 32 };
 
 /// What an extension stands for.
 struct Format {
   std::string_view extension;
-  char const* kind;  ///< Its name, such as "JPEG".
+  char const* name;  ///< Such as "JPEG".
   Family family;
   std::shared_ptr<QVMetadata> (*makeRecord)();
 };
@@ -35,7 +35,8 @@ Format const* formatOf(std::string_view extension);
 /// Notes, for each field that the record lacks, why it is absent.
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
-/// When the refused file, which begins at `start`, looks like another format, notes which one.
+/// If the refused file, which begins at `start`, looks like another format: notes which one, and
+/// makes that the reason of the refusal.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null. The journal may be null, here and below.

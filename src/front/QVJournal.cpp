@@ -12,7 +12,7 @@ namespace quavel {
 
 namespace {
 
-// In the order of the enumerators.
+// In the order of the enumerators; the longest has 17 letters.
 constexpr char kReasonNames[][18] = {
     "none",        "unknown-extension", "cannot-open",     "read-error",    "empty",
     "cut-short",   "other-kind",        "malformed-entry", "malformed-box", "missing-part",
@@ -40,7 +40,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
   journal.knownSize = static_cast<std::int64_t>(length);
   auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
   if constexpr (sizeof(unsigned long) < sizeof(length)) {
-    memory->length = length;  // which the constructor's parameter cannot hold
+    memory->length = length;  // for which the constructor's `unsigned long` is too small
   }
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));
 }

@@ -2,15 +2,15 @@
 
 #include "front/Formats.h"
 #include "quavel/QVMStream.h"
-#include "quavel/QVMetadata.h"
 
 namespace quavel {
 
-QVReader::QVReader(std::string const& path) : metadata(detail::readPath(path, nullptr)) {}
+QVReader::QVReader(std::string const& path)
+    : metadata(detail::readPath(path, /*journal=*/nullptr)) {}
 
 QVReader::QVReader(unsigned char* buffer, unsigned long const& length, std::string const& extension)
-    : metadata(
-          detail::readStream(std::make_shared<QVMStream>(buffer, length), extension, nullptr)) {}
+    : metadata(detail::readStream(std::make_shared<QVMStream>(buffer, length), extension,
+                                  /*journal=*/nullptr)) {}
 
 QVReader::~QVReader() = default;
 

@@ -11,7 +11,7 @@ namespace quavel::detail {
 
 namespace {
 
-// So few that all notes of any file fit on a screen.
+// So few that the notes of any file fit on a screen.
 constexpr std::size_t kMaxSteps = 8;
 constexpr std::size_t kMaxHints = 8;
 
@@ -22,7 +22,7 @@ bool isLimit(QVReason reason) {
 }  // namespace
 
 void Journal::add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text) {
-  notes.push_back({kind, reason, position, "", std::move(text), 0});
+  notes.push_back({kind, reason, position, /*field=*/"", std::move(text), /*systemError=*/0});
 }
 
 void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern, Words words) {
@@ -32,8 +32,9 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
   isRefused_ = true;
   QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
   add(kind, reason, position, composed(pattern, words));
-  bool const isSystemFailure = reason == QVReason::CannotOpen || reason == QVReason::ReadError;
-  notes.back().systemError = isSystemFailure ? systemError : 0;
+  if (reason == QVReason::CannotOpen || reason == QVReason::ReadError) {
+    notes.back().systemError = systemError;
+  }
 }
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
@@ -66,8 +67,8 @@ std::string Journal::cutText(std::int64_t end) {
   if (dataSize() < 0) {
     return "the data ends before that";
   }
-  return end <= dataSize() ? "reading there fails"
-                           : composed("the file ends at {}", {Offset{dataSize()}});
+  bool const isInFile = end <= dataSize();
+  return isInFile ? "reading there fails" : composed("the file ends at {}", {Offset{dataSize()}});
 }
 
 void Journal::passed(std::int64_t position, char const* pattern, Words words) {
@@ -91,7 +92,7 @@ void Journal::absent(char const* field, QVReason reason, char const* pattern, Wo
   if (note == nullptr) {
     note = &absences_.emplace_back();
   }
-  *note = {QVNoteKind::Absence, reason, -1, field, composed(pattern, words), 0};
+  *note = {QVNoteKind::Absence, reason, -1, field, composed(pattern, words), /*systemError=*/0};
 }
 
 QVNote* Journal::absenceOf(char const* field) {

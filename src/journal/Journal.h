@@ -11,8 +11,8 @@
 
 namespace quavel::detail {
 
-/// Collects the notes of one read. The readers add theirs through the functions after this class: a
-/// null journal means that nobody asked for notes, and then no text is composed.
+/// Collects the notes of one read; `QVNote` explains their parts. Readers add notes through the
+/// functions after this class, which compose no text when the journal is null.
 class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
@@ -22,7 +22,7 @@ class Journal {
 
   using Words = std::initializer_list<Word>;
 
-  /// Only the first refusal counts: later ones follow from it.
+  /// Notes why there is no record. Only the first refusal counts: later ones follow from it.
   void refuse(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// Refuses because the `count` bytes at `position` are missing; the pattern says what they are.
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
@@ -37,7 +37,7 @@ class Journal {
 
   /// The size of the data in bytes, for which the first call asks the system; -1: not known.
   std::int64_t dataSize();
-  /// Why the last read delivered too little: as a reason, and in words for bytes that end at `end`.
+  /// Why the last read delivered too little, as a reason and as a text; it was to end at `end`.
   QVReason cutReason() const;
   std::string cutText(std::int64_t end);
 
@@ -47,7 +47,7 @@ class Journal {
   int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
   bool hasReadFailed = false;   ///< The last read failed; the end of the data is not a failure.
-  int systemError = 0;          ///< The `errno` of that failure; 0: none is known.
+  int systemError = 0;          ///< The `errno` of that failure, or of opening; 0: not known.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);
@@ -63,44 +63,44 @@ class Journal {
 inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
 
 /// States why the read ends. Always false, so that a step can `return refuse(...)`.
-template <class... Words>
+template <class... Values>
 [[gnu::cold, gnu::noinline]] bool refuse(Journal* journal, QVReason reason, std::int64_t position,
-                                         char const* pattern, Words... words) {
+                                         char const* pattern, Values... words) {
   if (journal != nullptr) {
     journal->refuse(reason, position, pattern, {words...});
   }
   return false;
 }
 
-/// Does the same for `count` bytes missing at `position`; the pattern says what they are.
-template <class... Words>
+/// Refuses because `count` bytes are missing at `position`; the pattern says what they are.
+template <class... Values>
 [[gnu::cold, gnu::noinline]] bool refuseCut(Journal* journal, std::int64_t position,
                                             std::int64_t count, char const* pattern,
-                                            Words... words) {
+                                            Values... words) {
   if (journal != nullptr) {
     journal->refuseCut(position, count, pattern, {words...});
   }
   return false;
 }
 
-template <class... Words>
-void notePassed(Journal* journal, std::int64_t position, char const* pattern, Words... words) {
+template <class... Values>
+void notePassed(Journal* journal, std::int64_t position, char const* pattern, Values... words) {
   if (wantsAll(journal)) {
     journal->passed(position, pattern, {words...});
   }
 }
 
-template <class... Words>
+template <class... Values>
 void noteHint(Journal* journal, QVReason reason, std::int64_t position, char const* pattern,
-              Words... words) {
+              Values... words) {
   if (wantsAll(journal)) {
     journal->hint(reason, position, pattern, {words...});
   }
 }
 
-template <class... Words>
+template <class... Values>
 void noteAbsent(Journal* journal, std::initializer_list<char const*> fields, QVReason reason,
-                char const* pattern, Words... words) {
+                char const* pattern, Values... words) {
   if (wantsAll(journal)) {
     for (char const* const field : fields) {
       journal->absent(field, reason, pattern, {words...});

@@ -11,23 +11,23 @@ namespace quavel::detail {
 
 class Journal;
 
-/// Work that a file can make a read do many times over.
+/// Work that a file can make a read do many times over. A step goes over a segment or a box.
 enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
 
-/// The limits of each kind of work in one read. The formats do not limit how many directories,
-/// segments or boxes come before the wanted one, and a file can refer to the same large directory
-/// again and again. The bounds lie far above what cameras write.
+/// The most work of each kind in one read, far above what cameras' files need. The formats set no
+/// such limits: any number of directories, segments or boxes may come before the wanted one, and a
+/// file can refer to the same large directory again and again.
 inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
-    std::uint64_t{1} << 14U,  // directories: each takes up to a dozen separate reads of the file
+    std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
-    std::uint64_t{1} << 20U,  // values: less than 32 MB of memory, with their directories
-    std::uint64_t{1} << 24U,  // segments or boxes: enough for 32 MB of zeros in a JPEG
+    std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB
+    std::uint64_t{1} << 24U,  // steps: enough for 32 MB of zeros in a JPEG, one every 2 bytes
 };
 
 /// One read of a file: the work done so far, and the journal.
 class Reading {
  public:
-  /// Counts work done. False: it exceeds the limit, and the journal has the refusal.
+  /// Adds to the work done. False: the total exceeds the limit, and the journal has the refusal.
   bool spend(Work work, std::uint64_t amount) {
     std::uint64_t& done = done_[static_cast<std::size_t>(work)];
     done += amount;
@@ -36,7 +36,7 @@ class Reading {
 
   Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
-  /// The library made the record, so no override in a host's class sees the directories.
+  /// The record's class is one of the library's, so no host's override sees the directories.
   bool isOwnRecord = false;
 
  private:
@@ -45,20 +45,20 @@ class Reading {
   std::array<std::uint64_t, 4> done_ = {};
 };
 
-/// Makes a stream serve a read as long as the scope lives. Public operations that readers or a
-/// host's own code call meanwhile join that read instead of beginning another.
+/// Makes a stream serve a read as long as the scope lives.
 class ReadScope {
  public:
+  /// For a public operation: begins a read, or joins the one during which it was called.
   explicit ReadScope(QVStream& stream) : stream_(stream), outer_(stream.reading_.current) {
     if (outer_ == nullptr) {
-      stream_.reading_.current = &own_;
+      stream_.reading_.current = &begun_;
     }
   }
-  /// For a record that the library made: begins a read of its own, even within another.
+  /// For a record of the library's own class: begins a read, even during another.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
-    own_.journal = journal;
-    own_.isOwnRecord = true;
-    stream_.reading_.current = &own_;
+    begun_.journal = journal;
+    begun_.isOwnRecord = true;
+    stream_.reading_.current = &begun_;
   }
   ~ReadScope() { stream_.reading_.current = outer_; }
   ReadScope(ReadScope const&) = delete;
@@ -69,27 +69,27 @@ class ReadScope {
 
  private:
   QVStream& stream_;
-  Reading* outer_;
-  Reading own_;
+  Reading* outer_;  // null: none was under way
+  Reading begun_;   // not used after joining `outer_`
 };
 
-/// The read that the stream serves. There must be one: public operations open a scope.
+/// The read that the stream serves. There is one in every public operation: each opens a scope.
 inline Reading& readingOf(QVStream const& stream) { return *ReadScope::current(stream); }
 
-/// The journal of the read that the stream serves, or null.
+/// The journal of the read that the stream serves; null without a read or a journal.
 inline Journal* journalOf(QVStream const& stream) {
   Reading const* const reading = ReadScope::current(stream);
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal whether the last `readBuffer` failed, which a negative `delivered` means, and
-/// the system's error, or 0 if that is not known. A refusal that follows states both.
+/// Tells the journal what `readBuffer` returned (negative: it failed) and, after a failure, the
+/// `errno`, or 0 if that is not known. A refusal that follows states the failure.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.
 inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }
 
-/// The same if there is a journal to note it; else 0, without asking the stream.
+/// The position for a note; 0, without asking the stream, when there is no journal for it.
 inline std::int64_t notedPosition(Journal const* journal, QVStream& stream) {
   return journal == nullptr ? 0 : positionOf(stream);
 }

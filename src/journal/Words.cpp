@@ -1,5 +1,6 @@
 #include "journal/Words.h"
 
+#include <algorithm>
 #include <string_view>
 
 namespace quavel::detail {
@@ -8,12 +9,12 @@ namespace {
 
 constexpr std::size_t kMaxTextLength = 500;
 
-// Smaller offsets look the same in both notations.
+// Smaller offsets are a single digit, the same in decimal.
 constexpr std::int64_t kFirstHexadecimal = 10;
 
 void appendHex(std::string& out, std::uint64_t number, int minDigits) {
   int digits = minDigits;
-  while (digits < 16 && (number >> (4 * digits)) != 0) {
+  while (digits < 16 && (number >> (4 * digits)) != 0) {  // 64 bits are 16 digits
     ++digits;
   }
   while (digits-- > 0) {
@@ -74,17 +75,18 @@ void append(std::string& out, QuotedBytes bytes) {
 std::string composed(char const* pattern, std::initializer_list<Word> words) {
   std::string text;
   text.reserve(kMaxTextLength / 4);
-  auto const* word = words.begin();
   std::string_view rest = pattern;
-  // Each "{" in a pattern begins a "{}".
-  for (auto at = rest.find('{'); at != rest.npos && word != words.end(); at = rest.find('{')) {
-    text += rest.substr(0, at);
-    word->appendTo(text);
-    ++word;
-    rest.remove_prefix(at + 2);
+  for (Word const& word : words) {
+    auto const brace = rest.find('{');  // of a "{}": patterns have no other braces
+    if (brace == rest.npos) {
+      break;
+    }
+    text += rest.substr(0, brace);
+    word.appendTo(text);
+    rest.remove_prefix(brace + 2);
   }
   text += rest;
-  text.resize(text.size() < kMaxTextLength ? text.size() : kMaxTextLength);
+  text.resize(std::min(text.size(), kMaxTextLength));
   return text;
 }
 

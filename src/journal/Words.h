@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// An offset in the file: "0x1f2 (498)".
+/// An offset in the file: "0x1f2 (498)", or just "8" for a small one.
 struct Offset {
   std::int64_t value;
 };
@@ -19,7 +19,7 @@ struct HexBytes {
   std::size_t count;
 };
 
-/// Two bytes of the file, as a big-endian number: "ff d8".
+/// Two bytes of the file, held as a big-endian number: "ff d8".
 struct HexPair {
   std::uint16_t value;
 };
@@ -46,24 +46,24 @@ void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 
-/// A part of a note's text: a value, which must outlive this, and the function that turns it into
-/// text. That is one of the `append` functions above, or one declared beside the value's type.
+/// A part of a note's text: a value of any type that has an `append` function, above or beside the
+/// type itself. The value must outlive the word.
 class Word {
  public:
   template <class Value>
   Word(Value const& value)
-      : value_(&value), append_([](std::string& out, void const* word) {
-          append(out, *static_cast<Value const*>(word));
+      : value_(&value), append_([](std::string& out, void const* erased) {
+          append(out, *static_cast<Value const*>(erased));
         }) {}
 
   void appendTo(std::string& out) const { append_(out, value_); }
 
  private:
-  void const* value_;
-  void (*append_)(std::string& out, void const* word);
+  void const* value_;  // of the type that `append_` was made for
+  void (*append_)(std::string& out, void const* value);
 };
 
-/// The pattern with each "{}" replaced by the next word, cut to the greatest length of a note.
+/// The pattern with each "{}" replaced by the next word, cut to the 500 bytes of a note's text.
 std::string composed(char const* pattern, std::initializer_list<Word> words);
 
 }  // namespace quavel::detail

@@ -15,7 +15,7 @@ namespace quavel::detail {
 
 /// Whether numbers read from the stream must have their bytes reversed for the host.
 inline bool needsReversal(QVStream const& stream) {
-  bool const isKnown =
+  bool const isKnown =  // with any other value, which a host may set, nothing is converted
       stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
   return isKnown && stream.byteOrder != stream.hostOrder;
 }
@@ -34,9 +34,9 @@ inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bit
 template <class Number>
 void reverseBytes(Number* number) {
   constexpr std::size_t kSize = sizeof(Number);
-  std::conditional_t<kSize == 2, std::uint16_t,
-                     std::conditional_t<kSize == 4, std::uint32_t, std::uint64_t>>
-      bits;
+  using Bits4Or8 = std::conditional_t<kSize == 4, std::uint32_t, std::uint64_t>;
+  using Bits = std::conditional_t<kSize == 2, std::uint16_t, Bits4Or8>;
+  Bits bits;
   std::memcpy(&bits, number, kSize);
   bits = reversed(bits);
   std::memcpy(number, &bits, kSize);
@@ -52,7 +52,7 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// The sum and the difference of positions, which wrap around where signed ones are undefined.
+/// Sum and difference that wrap around: hosts choose the numbers, and overflow would be undefined.
 inline std::int64_t wrappingSum(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
 }
@@ -60,7 +60,7 @@ inline std::int64_t wrappingDifference(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) - static_cast<std::uint64_t>(b));
 }
 
-/// Copies bytes. Most reads are of one number; with a constant size, memcpy needs no call.
+/// memcpy, inlined for the sizes of numbers: most reads are of a single number.
 inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std::size_t count) {
   switch (count) {
     case 2:
@@ -77,15 +77,15 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// The last offset at which a read may start. Where `long` has 32 bits, no offset reaches beyond
-// 2 GB; stopping 1 MB earlier keeps the offset after a directory's last entry within them.
-inline constexpr bool kIsLongShort = sizeof(long) < sizeof(std::int64_t);
+// The last offset at which a read may start. Where `long` has 32 bits, that is 1 MB before the
+// largest one: even a directory of 65535 entries that begins there ends at a valid offset.
+inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
 inline constexpr long kLastOffset =
-    std::numeric_limits<long>::max() - (kIsLongShort ? 1L << 20U : 0);
+    std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
-/// The offset that a walk moves to if its target has none. Where `long` has 32 bits, it is less
-/// than the largest `long`, which is taken for the end of a box that ends beyond all offsets.
-inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLongShort ? 1 : 0);
+/// Where a walk goes when a box ends beyond all offsets; no read succeeds there. Where `long` has
+/// 32 bits, it is still before the end of the boxes around it: the walk goes on and then fails.
+inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
 inline bool seek(QVStream& stream, std::int64_t offset) {
@@ -103,7 +103,7 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
     return true;
   }
   if (delivered < 0) {
-    noteReadResult(stream, delivered, 0);
+    noteReadResult(stream, delivered, /*error=*/0);
   }
   return false;
 }
@@ -115,8 +115,8 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
   while (received < count) {
     std::int64_t const delivered = stream.readBuffer(destination + received, count - received);
     if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - received) {
-      if (delivered != 0) {
-        noteReadResult(stream, -1, 0);  // a count above what was asked for is a failure too
+      if (delivered != 0) {  // at 0 the data ends; more than asked for is a failure, as -1 is
+        noteReadResult(stream, -1, /*error=*/0);
       }
       break;
     }

@@ -12,7 +12,7 @@ namespace quavel::detail {
 
 namespace {
 
-// Most photos take one to four reads; one that is walked through its image data takes dozens.
+// Most photos take one to four reads; a walk through the image data takes dozens.
 constexpr int kReadsOfAWalk = 16;
 constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;  // bytes to fetch at a time
 
@@ -21,18 +21,18 @@ constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;  // bytes to fetch 
 constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
-// The advice against reading ahead costs a system call and helps only with files that are not
-// cached. So it is given only while recent reads were as slow as reads from a disk.
+// Advice against reading ahead keeps the system from fetching several times too much. It costs a
+// call and helps only with uncached files: it is given while reads are as slow as from a disk.
 constexpr auto kSlowRead = std::chrono::microseconds(40);  // a cached block takes about 3
-constexpr int kFilesAdvised = 64;                          // after a slow read
-std::atomic<int> filesToAdvise{1};
+constexpr int kFilesAfterSlowRead = 64;
+std::atomic<int> filesToAdvise{1};  // the first file may come from a disk; lost updates do no harm
 
-/// Both streams in one allocation.
+/// A file and the stream that reads it ahead, in one allocation.
 struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
 
   PositionedFile file;
-  // The pointer to `file` owns nothing: both streams live as long as this object.
+  // This pointer to `file` owns nothing: both members live as long as the object around them.
   QVReadAheadStream ahead{std::shared_ptr<QVStream>(std::shared_ptr<void>(), &file),
                           kFirstBlockSize, kNextBlockSize};
 };
@@ -42,16 +42,15 @@ struct ReadAheadFile {
 PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
 std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t count) {
-  int const left = filesToAdvise.load(std::memory_order_relaxed);
-  // Without the advice, the system would fetch several times what the first read asks for.
-  if (left > 0) {
+  int const filesLeft = filesToAdvise.load(std::memory_order_relaxed);
+  if (filesLeft > 0) {
     file::expectFewReads(fd);
   }
   auto const start = std::chrono::steady_clock::now();
   std::int64_t const delivered = file::readAt(fd, destination, count, position_);
   bool const isSlow = std::chrono::steady_clock::now() - start > kSlowRead;
-  if (isSlow || left > 0) {
-    filesToAdvise.store(isSlow ? kFilesAdvised : left - 1, std::memory_order_relaxed);
+  if (isSlow || filesLeft > 0) {
+    filesToAdvise.store(isSlow ? kFilesAfterSlowRead : filesLeft - 1, std::memory_order_relaxed);
   }
   return delivered;
 }
@@ -69,8 +68,8 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   ++reads_;
-  std::int64_t delivered = reads_ == 1 && file::kTakesAdvice ? readFirst(destination, count)
-                                                             : readFurther(destination, count);
+  bool const isTimed = reads_ == 1 && file::kTakesAdvice;
+  auto delivered = isTimed ? readFirst(destination, count) : readFurther(destination, count);
   if (delivered == -1 && errno == ESPIPE) {
     delivered = readPipe(destination, count);
   }
@@ -80,11 +79,11 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
 
 std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t count) {
   if (position_ != pipePosition_) {
-    return -1;
+    return -1;  // a pipe cannot seek
   }
   // Each read of a pipe delivers only what its writer has written so far.
   std::size_t received = 0;
-  std::int64_t delivered = 1;
+  std::int64_t delivered = 1;  // anything above 0: the pipe has not ended yet
   while (received < count && delivered > 0) {
     delivered = file::read(fd, destination + received, count - received);
     received += delivered > 0 ? static_cast<std::size_t>(delivered) : 0;
@@ -99,7 +98,7 @@ long PositionedFile::getOffset() {
 
 void PositionedFile::setOffset(long const& offset) {
   std::int64_t const target = wrappingSum(baseOffset, offset);
-  bool const isAccepted =
+  bool const isAccepted =  // the file system is asked only where its limit may matter
       target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
   if (isAccepted) {
     position_ = target;

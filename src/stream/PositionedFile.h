@@ -8,13 +8,13 @@
 
 namespace quavel::detail {
 
-/// A position that every file system accepts. Each has its own limit beyond it.
+/// A position that every file system accepts in a seek. Their limits differ, but all lie above it.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read states its position, so that a seek needs no system
-/// call, and the system is advised not to read ahead while files come from the disk and not from
-/// its cache. Many reads mean a walk to the end of the file; the system is then advised to fetch
-/// what follows. A pipe is read only front to back.
+/// call. While files come from the disk rather than from the system's cache, the system is advised
+/// not to read ahead. Many reads of one file are taken for a walk to its end: then the system is
+/// advised to fetch what follows. A pipe is read only front to back.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);
@@ -31,10 +31,10 @@ class PositionedFile : public QVFStream {
   std::int64_t position_ = 0;      // absolute
   std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
   std::int64_t advisedEnd_ = 0;    // of the range that the system was advised to fetch
-  int reads_ = 0;
+  int reads_ = 0;                  // calls of `readBuffer`
 };
 
-/// Opens the file at `path` as a stream that reads ahead. Sets `*fd`, if given, to its descriptor,
+/// Opens the file at `path` as a stream that reads ahead. Sets `*fd`, if given, to the descriptor,
 /// which the stream owns; -1: the file cannot be opened, and `errno` says why.
 std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
 

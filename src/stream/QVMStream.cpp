@@ -12,7 +12,7 @@ QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
 std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   auto const delivered = static_cast<std::size_t>(std::min<std::uint64_t>(count, length - offset));
   if (delivered == 0) {
-    return 0;  // `buffer` may be null
+    return 0;  // before `buffer` is used, which may be null
   }
   detail::copyBytes(destination, buffer + offset, delivered);
   offset += delivered;

@@ -15,15 +15,15 @@ namespace {
 
 bool fitsLong(std::int64_t number) { return number == static_cast<long>(number); }
 
-/// Seeks to a position that does not fit a `long`, by way of `baseOffset`. False: the seek failed.
+/// Seeks to a position that fits `baseOffset` but not a `long`. False: the seek failed.
 bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = detail::wrappingSum(base, target);
   source.setOffset(0);
-  bool const isThere = source.getOffset() == 0;
+  bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` is at its start instead, and reports offset 0.
-  return isThere && source.getOffset() == static_cast<long>(target);
+  // A source that ignores `baseOffset` is at its start: its offset is 0, not the target's low bits.
+  return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
 }  // namespace
@@ -55,14 +55,13 @@ long QVReadAheadStream::getOffset() {
 
 void QVReadAheadStream::setOffset(long const& offset) {
   std::int64_t const target = detail::wrappingSum(baseOffset, offset);
-  if (target < 0 || (target > detail::kSurelyAccepted && !sourceAccepts(target))) {
-    return;
+  if (target >= 0 && (target <= detail::kSurelyAccepted || sourceAccepts(target))) {
+    position_ = target;
   }
-  position_ = target;
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  // Start at 0: a source that refuses the seek stays there. One that stops at its end accepts it.
+  // From 0: a source that refuses the seek stays there, and one that goes to its end accepts it.
   sourcePosition_ = -1;
   source_->setOffset(0);
   if (fitsLong(target)) {
@@ -99,12 +98,13 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[longest]);
   }
-  // Sequential reads are likely to go on, so they get the larger block.
-  fetch(last_, position_ == sourcePosition_ ? longest : nextSize_, needed);
+  // A sequential read is likely to go on, so it gets the larger block.
+  bool const isSequential = position_ == sourcePosition_;
+  fetch(last_, isSequential ? longest : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // even a read that fails may overwrite its bytes
+  block.size = 0;  // for a source that overwrites the bytes and then throws
   errno = 0;       // a host's stream may fail without setting it
   std::int64_t delivered = readSource(block, wanted);
   if (delivered < 0 && needed < wanted) {
@@ -117,8 +117,9 @@ void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t need
 }
 
 std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
-  // The source's position is unknown from here on, unless the read succeeds.
-  if (std::exchange(sourcePosition_, -1) != position_) {
+  // From here on the source's position is unknown, until the read succeeds.
+  bool const mustSeek = std::exchange(sourcePosition_, -1) != position_;
+  if (mustSeek) {
     if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
     } else if (!sourceAccepts(position_)) {

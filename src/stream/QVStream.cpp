@@ -4,7 +4,6 @@
 
 namespace quavel {
 
-using detail::needsReversal;
 using detail::reverseBytes;
 
 namespace {
@@ -23,7 +22,7 @@ bool readNumber(QVStream& stream, Number* number) {
     return false;
   }
   if constexpr (sizeof(Number) > 1) {
-    if (needsReversal(stream)) {
+    if (detail::needsReversal(stream)) {
       reverseBytes(number);
     }
   }

@@ -24,15 +24,12 @@ std::int64_t readAt(int fd, std::uint8_t* destination, std::size_t count, std::i
 std::int64_t position(int fd);
 std::int64_t seek(int fd, std::int64_t position);
 std::int64_t size(int fd);
-inline constexpr bool kTakesAdvice = false;
-inline void expectFewReads(int /*fd*/) {}
-inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 
-#else
+#else  // POSIX
 
 static_assert(sizeof(off_t) == 8, "files above 2 GB need _FILE_OFFSET_BITS=64");
 
-inline int open(std::string const& path) { return ::open(path.c_str(), O_RDONLY, 0); }
+inline int open(std::string const& path) { return ::open(path.c_str(), O_RDONLY); }
 
 inline void close(int fd) { ::close(fd); }
 
@@ -50,28 +47,34 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// The size of a regular file. Any other kind of file has -1 too, without an `errno`.
+/// The size of a regular file. For any other kind of file also -1, but then `errno` is not set.
 inline std::int64_t size(int fd) {
   struct stat status = {};
   bool const isRegular = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
   return isRegular ? std::int64_t{status.st_size} : -1;
 }
 
+#endif  // _WIN32
+
 #ifdef POSIX_FADV_RANDOM
+
 inline constexpr bool kTakesAdvice = true;
-/// Advises the system not to read ahead: reads will be few and far apart.
+
+/// Advises the system not to read ahead in the whole file: reads will be few and far apart.
 inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
-/// Advises the system to fetch these bytes now: they will be read soon.
+
+/// Advises the system to fetch these `count` bytes now: they will be read soon.
 inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
   ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
 }
+
 #else
+
 inline constexpr bool kTakesAdvice = false;
 inline void expectFewReads(int /*fd*/) {}
 inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
-#endif
 
-#endif
+#endif  // POSIX_FADV_RANDOM
 
 }  // namespace quavel::detail::file
 

@@ -17,19 +17,19 @@ namespace quavel::detail::file {
 
 namespace {
 
-/// The path in UTF-16; empty when it is not UTF-8.
+/// The path in UTF-16; when it is not UTF-8, empty, which names no file.
 std::wstring widened(std::string const& path) {
-  int const size =
+  int const size =  // with the NUL; 0: the path is not UTF-8
       ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, nullptr, 0);
-  std::vector<wchar_t> wide(static_cast<std::size_t>(size) + 1);
+  std::vector<wchar_t> wide(static_cast<std::size_t>(size) + 1);  // a NUL even for size 0
   ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, wide.data(), size);
   return wide.data();
 }
 
-/// The path in the form that Windows requires from MAX_PATH characters on: absolute and with the
-/// prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
+/// The path; from MAX_PATH characters on, in the form that Windows then requires: absolute and with
+/// the prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
-  DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with the final NUL
+  DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
   std::vector<wchar_t> whole(std::size_t{size} + 1);
   if (size < MAX_PATH || ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
     return path;
