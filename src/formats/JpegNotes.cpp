@@ -6,8 +6,8 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;  // -1: not known
-  std::int64_t const end = size < 0 ? position : std::min(position, size);
+  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;   // -1: not known
+  std::int64_t const end = size < 0 ? position : std::min(position, size);  // see JpegWalk.h
   notePassed(journal, position, "end of the data at {}, where the walk ends", Offset{end});
 }
 
@@ -16,15 +16,16 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
       findEntry(exifIFD, tag::ImageWidth) || findEntry(exifIFD, tag::PixelXDimension);
   bool const hasHeight =
       findEntry(exifIFD, tag::ImageLength) || findEntry(exifIFD, tag::PixelYDimension);
-  noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile,
-             hasWidth && hasHeight
-                 ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
-                 : "{} does not give both sides",
-             // As the file has them: sides from 2^31 on are negative as an `int`.
-             placed(exifIFD), static_cast<std::uint32_t>(width),
-             static_cast<std::uint32_t>(height));
+  char const* const pattern =
+      hasWidth && hasHeight
+          ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
+          : "{} does not give both sides";
+  // The casts give the sides as they are in the file: from 2^31 on, they are negative as an `int`.
+  noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile, pattern, placed(exifIFD),
+             static_cast<std::uint32_t>(width), static_cast<std::uint32_t>(height));
 }
 
+/// Says of each field why it is absent, if it is: the notes of the others are not shown.
 void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;

@@ -8,8 +8,8 @@
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // One read for both numbers, since walks do little but read headers. If the data ends within the
-  // type, the size is stored all the same.
+  // One read for both numbers, since walks do little but read headers. As with two reads, the size
+  // is stored even if the data ends within the type.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);

@@ -19,7 +19,7 @@ inline constexpr std::size_t kValueCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize = 2;  // of what precedes the entries: their number
+inline constexpr std::int64_t kEntryCountSize = 2;  // of the number of entries, before the first
 
 inline constexpr std::uint16_t kUndefinedCode = 7;  // of the field type UNDEFINED
 
@@ -44,7 +44,7 @@ inline bool isKnown(std::uint16_t typeCode) {
 }
 
 /// Whether the type is known and there are not too many values. Any number of UNDEFINED bytes is
-/// allowed: beyond the field, they are not read.
+/// allowed, because only up to 4 are read, those in the field.
 inline bool isAllowed(RawEntry const& entry) {
   return isKnown(entry.typeCode) &&
          (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);

@@ -20,10 +20,10 @@ struct TypedCount {
   std::uint16_t typeCode;
 };
 
-/// In place of a TIFF structure's name: the structure is the whole file, and notes do not name it.
+/// For `PartName::structure`: the TIFF structure is the whole file, so notes do not name it.
 inline constexpr char const* kWholeFile = nullptr;
 
-/// A part of a TIFF structure, a directory or the header: "IFD0 of the Exif segment".
+/// The name of a directory or a header in a TIFF structure: "IFD0 of the Exif segment".
 struct PartName {
   char const* name = "the directory";
   char const* structure = kWholeFile;  ///< The name of the TIFF structure.

@@ -78,7 +78,7 @@ std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
     std::string const text =
         columns[i].keepsEnd ? keepEnd(texts[i], widths[i]) : keepStart(texts[i], widths[i]);
     line.append(gap, ' ').append(text);
-    gap = widths[i] - cells(text) + kGap;
+    gap = widths[i] - widthOf(text) + kGap;
   }
   return line + '\n';
 }

@@ -7,7 +7,7 @@
 #include "output/Layout.h"
 #include "photo/Field.h"
 
-/// What a table shows of each photo. Empty `fields` stand for what a photographer looks for first.
+/// What a table shows of each photo. An empty list of fields stands for the default columns.
 namespace app::rows {
 
 using Row = std::vector<std::string>;
@@ -15,7 +15,7 @@ using Row = std::vector<std::string>;
 std::vector<Column> columnsOf(Fields const& fields);
 /// The row of a file that gave a record; an absent value is empty.
 Row rowOf(Fields const& fields, Outcome const& outcome);
-/// Shortens the date to the day, in a row made with empty `fields`.
+/// Shortens the date to the day, in a row of the default columns.
 void dropTime(Row& row);
 
 }  // namespace app::rows

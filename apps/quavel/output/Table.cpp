@@ -44,7 +44,7 @@ class Table : public Writer {
   void writePage(bool isLast);
   void layOutUncut(bool isLast);
   void layOutForTerminal();
-  bool pageFitsLayout(std::size_t line) const;
+  bool pageFitsLayout(std::size_t width) const;
   void writeHeader();
   Widths naturalWidths(bool mustShowEmpty = false) const;
   rows::Row inLayout(rows::Row row) const;
@@ -53,16 +53,16 @@ class Table : public Writer {
   Output& output_;
   std::vector<Column> columns_;
   bool isTerminal_;
-  std::size_t pathColumn_ = 0;  // the one that keeps its end; columns_.size() when there is none
+  std::size_t pathColumn_ = 0;  // columns_.size() when the path is not shown
   std::size_t files_ = 0;
-  std::atomic<bool> keepsRecords_{true};  // until the first file is added: a card needs its record
-  Outcome first_;                         // becomes a card if no other file follows
+  std::atomic<bool> keepsRecords_{true};  // until the first file is added
+  Outcome first_;  // with its record, because it becomes a card if no other file follows
   std::vector<rows::Row> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   // The layout of the rows below the last header:
   Widths natural_;            // the columns' widths if nothing is cut; empty before the first page
   Widths widths_;             // the columns' widths as shown
-  std::size_t line_ = 0;      // the terminal's width
+  std::size_t width_ = 0;     // the terminal's
   std::string folder_;        // stands above the header and is removed from the paths
   bool hasDaysOnly_ = false;  // dates are shown without the time
 };
@@ -154,37 +154,40 @@ void Table::layOutUncut(bool isLast) {
 
 /// Leaves out what does not fit: the common folder, then parts of cells, then times, then columns.
 void Table::layOutForTerminal() {
-  std::size_t const line = terminalWidth(STDOUT_FILENO);
-  if (pageFitsLayout(line)) {
+  std::size_t const width = terminalWidth(STDOUT_FILENO);
+  if (pageFitsLayout(width)) {
     return;
   }
   output_.add(natural_.empty() ? "" : "\n");  // a blank line between two layouts
-  line_ = line;
+  width_ = width;
   folder_.clear();
   hasDaysOnly_ = false;
   natural_ = naturalWidths();
-  if (lineWidth(natural_) > line && pathColumn_ < columns_.size()) {
+  if (lineWidth(natural_) > width && pathColumn_ < columns_.size()) {
     folder_ = commonFolder(page_, pathColumn_);
     natural_ = naturalWidths();
   }
-  widths_ = fit(columns_, natural_, line);
+  widths_ = fit(columns_, natural_, width);
   auto const hidden = [](Widths const& all) { return std::count(all.begin(), all.end(), 0U); };
-  if (form_.fields.empty() && hidden(widths_) > hidden(natural_)) {  // chosen dates stay whole
+  bool const dropsColumns = hidden(widths_) > hidden(natural_);
+  if (dropsColumns && form_.fields.empty()) {  // without times, they may fit
     hasDaysOnly_ = true;
     natural_ = naturalWidths();
-    widths_ = fit(columns_, natural_, line);
+    widths_ = fit(columns_, natural_, width);
   }
   output_.add(folder_.empty() ? "" : "In " + folder_ + "\n");
   writeHeader();
 }
 
-bool Table::pageFitsLayout(std::size_t line) const {
+bool Table::pageFitsLayout(std::size_t width) const {
   auto const isInFolder = [this](rows::Row const& row) {
     return folder_.empty() || row[pathColumn_].compare(0, folder_.size(), folder_) == 0;
   };
+  if (width != width_ || !std::all_of(page_.begin(), page_.end(), isInFolder)) {
+    return false;
+  }
   Widths const natural = naturalWidths();
-  return line == line_ && std::all_of(page_.begin(), page_.end(), isInFolder) &&
-         std::equal(natural.begin(), natural.end(), natural_.begin(), natural_.end(),
+  return std::equal(natural.begin(), natural.end(), natural_.begin(), natural_.end(),
                     std::less_equal<>());  // no column is wider than in the layout
 }
 
@@ -203,7 +206,7 @@ Widths Table::naturalWidths(bool mustShowEmpty) const {
   for (auto const& row : page_) {
     auto const shown = inLayout(row);
     for (std::size_t i = 0; i < shown.size(); ++i) {
-      natural[i] = std::max(natural[i], cells(shown[i]));
+      natural[i] = std::max(natural[i], widthOf(shown[i]));
     }
   }
   for (std::size_t i = 0; i < natural.size(); ++i) {

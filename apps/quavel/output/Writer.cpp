@@ -32,7 +32,7 @@ class TextWriter : public Writer {
       start_ = separator_;
     }
   }
-  void end() override { output_.finish(); }
+  void end() override { output_.finish(); }  // writes the end of a JSON array
 
  private:
   Output& output_;
@@ -51,8 +51,8 @@ class SortingWriter : public Writer {
   void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
   void end() override {
     auto const isBefore = [this](Outcome const& a, Outcome const& b) {
-      Value const left = compared(*form_.sort, a);
-      Value const right = compared(*form_.sort, b);
+      Value const left = comparedValue(*form_.sort, a);
+      Value const right = comparedValue(*form_.sort, b);
       if (isAbsent(left) || isAbsent(right)) {
         return !isAbsent(left) && isAbsent(right);  // absent values come last
       }
@@ -73,7 +73,8 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path with a NUL behind it. A file without a record is shown only if conditions chose it.
+/// Each path, ended by a NUL. Without conditions, only files with a record are shown; with them,
+/// all that meet them, and no others get here.
 TextOf paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;

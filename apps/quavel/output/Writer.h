@@ -18,7 +18,7 @@ class Writer {
 
   /// Sets the outcome's text or cells and drops what they replace. Called on any thread.
   virtual void prepare(Outcome& outcome) const = 0;
-  /// The same, but an exception becomes the file's problem.
+  /// The same, but an exception becomes the `problem` of the outcome.
   void prepareSafely(Outcome& outcome) const;
   /// Takes a prepared outcome, in the order of the output.
   virtual void add(Outcome&& outcome) = 0;

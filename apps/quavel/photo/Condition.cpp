@@ -101,7 +101,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
 }
 
 bool Condition::holds(Outcome const& outcome) const {
-  Value const value = compared(field_, outcome);
+  Value const value = comparedValue(field_, outcome);
   return !isAbsent(value) && isMet_(comparable(field_, value), wanted_);
 }
 

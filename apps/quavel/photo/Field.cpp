@@ -181,7 +181,7 @@ bool isAbsent(Value const& value) {
                          : std::holds_alternative<std::monostate>(value);
 }
 
-Value compared(Field const& field, Outcome const& outcome) {
+Value comparedValue(Field const& field, Outcome const& outcome) {
   bool const isCaptureDate = field.value == captureDate && outcome.record;
   return isCaptureDate ? usableCaptureDate(*outcome.record) : field.value(outcome);
 }

@@ -46,7 +46,7 @@ std::string inWords(Field const& field, Outcome const& outcome);
 bool isAbsent(Value const& value);
 
 /// The value by which files are sorted and selected, whatever form the output has.
-Value compared(Field const& field, Outcome const& outcome);
+Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, a number with the digits that give it exactly
 /// when read back, or "Infinity", "true" or "false". Nothing when absent.

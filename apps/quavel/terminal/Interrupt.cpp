@@ -29,7 +29,7 @@ std::atomic<int> pendingSignal{0};
 
 /// Erases the progress line and completes the output, then dies.
 [[noreturn]] void leave() {
-  ::alarm(1);  // so that `handle` calls `die` if nobody reads the tail
+  ::alarm(1);  // if a write below takes longer, SIGALRM makes `handle` end the process
   if (isProgressShown) {
     write(STDERR_FILENO, kEraseLine);
   }
@@ -68,7 +68,8 @@ void write(int fd, std::string_view bytes) {
 
 void install() {
   struct sigaction action = {};
-  action.sa_handler = handle;  // without SA_RESTART, so that a blocked write fails with EINTR
+  // Without SA_RESTART, so that a blocked write of Output fails with EINTR and can be given up.
+  action.sa_handler = handle;
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);

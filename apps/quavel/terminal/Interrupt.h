@@ -47,7 +47,8 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// Ends the process now if a signal is waiting for the end of a WriteScope.
+/// Ends the process if a signal is waiting for the end of the WriteScope. Called during one, while
+/// nothing of its write has been written.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt

@@ -147,7 +147,7 @@ std::string escapedPath(std::string path) {
   return escaped(path);
 }
 
-std::size_t cells(std::string_view text) {
+std::size_t widthOf(std::string_view text) {
   if (isPlain(text)) {
     return text.size();
   }
@@ -159,7 +159,7 @@ std::size_t cells(std::string_view text) {
 }
 
 std::string keepStart(std::string const& text, std::size_t width, std::size_t maxBytes) {
-  if (text.size() <= maxBytes && cells(text) <= width) {
+  if (text.size() <= maxBytes && widthOf(text) <= width) {
     return text;
   }
   std::size_t kept = 0;
@@ -176,7 +176,7 @@ std::string keepStart(std::string const& text, std::size_t width, std::size_t ma
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
-  std::size_t keptCells = cells(text);
+  std::size_t keptCells = widthOf(text);
   if (keptCells <= width) {
     return text;
   }

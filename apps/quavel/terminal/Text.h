@@ -22,7 +22,7 @@ std::string escaped(std::string const& text);
 std::string escapedPath(std::string path);
 
 /// The number of terminal cells that an escaped text takes.
-std::size_t cells(std::string_view text);
+std::size_t widthOf(std::string_view text);
 /// The start or the end of an escaped text, cut with "…" if it takes more than `width` cells. The
 /// start is also cut at `maxBytes`, since combining marks take no cells, however many there are.
 std::string keepStart(std::string const& text, std::size_t width,
