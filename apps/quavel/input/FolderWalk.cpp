@@ -15,7 +15,7 @@ namespace app {
 
 FolderWalk::FolderWalk(std::string const& folder, Filter const& filter, Report report)
     : filter_(filter), report_(std::move(report)) {
-  enter(folder, /*mayBeLink=*/false);
+  enter(folder, /*isFoundByLink=*/false);
 }
 
 bool FolderWalk::next(Input& input) {
@@ -52,7 +52,7 @@ bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
       input = {std::move(path), /*isPhoto=*/true, {}};
       return true;
     case DT_DIR:
-      enter(path, /*mayBeLink=*/false);
+      enter(path, /*isFoundByLink=*/false);
       return false;
     case DT_LNK:
     case DT_UNKNOWN:  // not every file system gives the type here
@@ -75,23 +75,23 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
-    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` took it for a file
-      enter(path, /*mayBeLink=*/true);
+    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` applied the rule for files
+      enter(path, /*isFoundByLink=*/true);
     }
     return false;
   }
-  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // stands for all others
+  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // which `visit` skips
   return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
 }
 
-void FolderWalk::enter(std::string const& path, bool mayBeLink) {
+void FolderWalk::enter(std::string const& path, bool isFoundByLink) {
   std::unique_ptr<DIR, int (*)(DIR*)> const folder(::opendir(path.c_str()), ::closedir);
   struct stat status = {};
   if (!folder || ::fstat(::dirfd(folder.get()), &status) == -1) {
     return setUnreadable(path, errno);
   }
   Identity const identity(status.st_dev, status.st_ino);
-  if (isRepeated(path, identity, mayBeLink)) {
+  if (isRepeated(path, identity, isFoundByLink)) {
     return;
   }
   Level level = {path.back() == '/' ? path : path + '/', identity, {}, {}};
@@ -99,14 +99,14 @@ void FolderWalk::enter(std::string const& path, bool mayBeLink) {
   levels_.push_back(std::move(level));
 }
 
-bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool mayBeLink) {
+bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool isFoundByLink) {
   bool const isLoop = std::any_of(levels_.begin(), levels_.end(),
                                   [&](Level const& level) { return level.identity == identity; });
   if (isLoop) {
     report_(path, "symbolic-link loop, back to a folder above; skipped");
     return true;
   }
-  if (mayBeLink && !linked_.insert(identity).second) {
+  if (isFoundByLink && !linked_.insert(identity).second) {
     report_(path, "another symbolic link led to this folder before; skipped");
     return true;
   }

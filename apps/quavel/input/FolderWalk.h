@@ -29,8 +29,8 @@ struct Filter {
 
 /// Finds the photos in a folder and its subfolders, in the order of their names' bytes. Symbolic
 /// links are followed; one that leads back to a folder above it, or to a folder that another link
-/// led to before, is reported and skipped. Memory holds only the entries still to be visited in the
-/// current folder and in the folders above it.
+/// led to before, is reported and skipped. Memory holds only the names in the current folder and in
+/// the folders above it.
 class FolderWalk {
  public:
   /// The filter must outlive it.
@@ -39,7 +39,8 @@ class FolderWalk {
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
   bool isAtEnd() const { return !unreadable_ && levels_.empty(); }
-  /// One step of `next`; false when it found nothing. Must not be called at the end.
+  /// A short step of `next`, for callers with other things to do meanwhile. False: it found nothing
+  /// yet. Not to be called at the end.
   bool step(Input& input);
 
  private:
@@ -55,8 +56,9 @@ class FolderWalk {
     std::vector<Entry> entries;  // still to be visited, from the back
   };
 
-  void enter(std::string const& path, bool mayBeLink);
-  bool isRepeated(std::string const& path, Identity const& identity, bool mayBeLink);  // reports it
+  void enter(std::string const& path, bool isFoundByLink);
+  bool isRepeated(std::string const& path, Identity const& identity,
+                  bool isFoundByLink);  // reports it
   bool isHidden(std::string_view name, bool isFolder) const;
   bool isExcluded(std::string const& folder, std::string_view name) const;
   void readEntries(DIR* folder, Level& level);

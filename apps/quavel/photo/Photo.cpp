@@ -23,7 +23,7 @@ constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
 Problem irregular(mode_t mode) {
-  if (S_ISDIR(mode)) {
+  if (S_ISDIR(mode)) {  // named in a list of paths: a folder among the arguments is walked
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
   char const* const socketOrDevice = S_ISSOCK(mode) ? "socket" : "device";
@@ -73,7 +73,8 @@ bool isDate(std::string const& text) {
   bool const isWhole = text.size() == kDateSize && end == text.c_str() + kDateSize;
   // strptime accepts any number of blanks before a number.
   bool const hasOneBlank = text.find(' ') == 10 && text.rfind(' ') == 10;
-  return isWhole && hasOneBlank && day.tm_mday == time.tm_mday && time.tm_sec <= 60;
+  bool const isReal = day.tm_mday == time.tm_mday && time.tm_sec <= 60;  // strptime accepts 61
+  return isWhole && hasOneBlank && isReal;
 }
 
 /// Calls `read` to fill the outcome, unless it has a problem. `read` itself may set a problem.
@@ -111,7 +112,7 @@ std::string extensionOf(std::string_view path) {
 
 bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");  // reads no file; is only asked for formats
-  // `createMetadata` makes a record, which is too expensive for each name in a large folder.
+  // For a known extension, the library makes a record: too expensive for each name in a folder.
   thread_local std::unordered_set<std::string> known;
   if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
     known.insert(extension);

@@ -5,8 +5,9 @@
 
 #include <string_view>
 
-/// SIGINT, SIGTERM and SIGHUP complete the output at once and end the process. A signal handler
-/// does this, not a waiting thread, which would make every system call on a file slower.
+/// On SIGINT, SIGTERM and SIGHUP, a signal handler closes the output (see `setTail`) and ends the
+/// process at once. There is no waiting thread for this: a single thread reads files faster, since
+/// the system need not guard open files against other threads.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
@@ -47,8 +48,8 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// Ends the process if a signal is waiting for the end of the WriteScope. Called during one, while
-/// nothing of its write has been written.
+/// Ends the process now if a signal has arrived during the current WriteScope. Only to be called
+/// while nothing of the write has been written, so that no line is cut.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt
