@@ -141,18 +141,6 @@ class Documents(CommandTest):
         for reason in set(re.findall(r'"error":.*?"reason":"([a-z-]+)"', transcripts)):
             self.assertIn(f"\n{reason}\t", text)
 
-    def test_bash_completes_values_and_names(self):
-        self.put("-a.tif", b"")
-        run = '''compopt() { :; }; . "$0"; COMP_WORDS=(quavel "$@"); COMP_CWORD=$#; _quavel; echo "${COMPREPLY[*]}"'''
-        for words, expected in (("--absent = sh", "show"), ("--absent =", "skip show"), ("--absent s", "skip show"),
-                                ("--fields = iso,mod", "iso,model"), ("--fields iso,i", "iso,isRaw"),
-                                ("--fields pathBytes,pa", "pathBytes,path"), ("--sort = -is", "-isRaw -iso"),
-                                ("--sort ca", "captureDate"), ("--where mod", "model"), ("--dates = ''", "exif iso"),
-                                ("-j ''", ""), ("--why --cs", "--csv"), ("-- -", "-a.tif"), ("-- --sort i", "")):
-            done = subprocess.run(["bash", "-c", run, SOURCE / "completions/quavel", *shlex.split(words)],
-                                  cwd=self.folder, capture_output=True, text=True, check=True, timeout=60)
-            self.assertEqual(done.stdout.strip(), expected, words)
-
 
 def written(terminal):
     """What a terminal has been sent and nobody has read; it holds 4 KB at most."""
@@ -297,38 +285,13 @@ class Refusals(CommandTest):
 class Samples(CommandTest):
     """QUAVEL_SAMPLES names a folder of real photos with their expected records."""
 
-    REASONS = {
-        "arw-03.arw": "the entry count of SubIFD 1 of 1",
-        "cr3-04.cr3": "the header of the next box in the metadata uuid box",
-        "dng-04.dng": "0x0132 DateTime at 0xe6 (230) in IFD0: its 20 ASCII values would begin at",
-        "dng-05.dng": "magic 43, not 42",
-        "jpg-08.jpg": "0xa002 PixelXDimension at 0x1e4 (484) in the Exif IFD holds 2 SHORT values",
-        "jpg-09.jpg": "the TIFF header of the Exif segment at 0xc (12) begins with ff ff",
-        "jpg-11.jpg": "not with ff d8 (SOI)",
-        "nef-02.nef": "IFD0 at 8 declares 160 x 106",
-        "nef-03.nef": "entry 11 of 28 of IFD0 at 8",
-        "raf-01.raf": "the TIFF header of the raw section",
-        "raf-02.raf": "the TIFF header of the raw section",
-        "tif-01.tif": "the offset of the next directory, after the 15 entries of IFD0",
-        "tif-04.tif": "magic 43, not 42",
-        "tiff-02.tiff": "magic 43, not 42",
-    }
-
-    def test_records_and_reasons_are_the_expected_ones(self):
+    def test_records_are_the_expected_ones(self):
         with open(Path(SAMPLES) / "expected.ndjson", encoding="utf-8") as lines:
             expected = {row["file"]: row["expected"] for row in map(json.loads, lines)}
         found = {Path(record["path"]).name: record for record in self.objects(SAMPLES, status=1)}
         self.assertEqual(set(found), set(expected))
-        why = self.run_quavel("--why", SAMPLES, status=1).stdout.decode()
-        for explanation in why.split("\n\n"):
-            verdict, *notes = explanation.splitlines()
-            path, _, error = verdict.partition(": no record: ")
-            self.assertEqual(error, found[Path(path).name]["error"] + "." if error else "")
-            self.assertLess(len(notes), 24)
-            self.assertRegex(explanation, r"\A[^\x00-\x09\x0b-\x1f\x7f]*\Z")
         for name, record in expected.items():
             self.assertEqual("error" in found[name], record is None, name)
-            self.assertIn(self.REASONS[name] if record is None else "", found[name].get("error", ""))
             for key, value in (record or {}).items():
                 got = found[name][key]
                 if value in ("nan", "", -1):
