@@ -13,6 +13,10 @@ import unittest
 from pathlib import Path
 
 COMMAND = os.environ["QUAVEL_COMMAND"]
+ROOT = Path(__file__).resolve().parents[2]
+SAMPLES = os.environ.get("QUAVEL_SAMPLES")
+if SAMPLES:
+    SAMPLES = os.environ["QUAVEL_SAMPLES"] = str(ROOT / SAMPLES)  # a relative path starts there
 
 
 def open_terminal(width):

@@ -18,12 +18,10 @@ import time
 import unittest
 from pathlib import Path
 
-from command import COMMAND, CommandTest, open_terminal
+from command import COMMAND, ROOT, SAMPLES, CommandTest, open_terminal
 from photos import photo
 
-HERE = Path(__file__).resolve().parent
-SOURCE = HERE.parents[1] / "apps/quavel"
-SAMPLES = os.environ.get("QUAVEL_SAMPLES")
+SOURCE = ROOT / "apps/quavel"
 
 for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
     signal.signal(number, signal.SIG_DFL)  # whoever runs this may ignore them
@@ -137,7 +135,7 @@ class Documents(CommandTest):
             self.assertRegex(text, rf"\b{extensions}\b", name)
             for option in options:
                 self.assertRegex(text, rf"(--| -l ){option}(?![\w-])", name)
-        transcripts = "".join(file.read_text(encoding="utf-8") for file in HERE.glob("transcripts/*.txt"))
+        transcripts = "".join(file.read_text(encoding="utf-8") for file in ROOT.glob("tests/command/transcripts/*.txt"))
         for reason in set(re.findall(r'"error":.*?"reason":"([a-z-]+)"', transcripts)):
             self.assertIn(f"\n{reason}\t", text)
 

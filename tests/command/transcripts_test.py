@@ -10,18 +10,17 @@ What the command writes follows: its output, then its standard error with "! " b
 its status in brackets unless that is 0. "..." stands for any text within a line.
 """
 
-import os
 import re
 import shlex
 import subprocess
 import unittest
 from pathlib import Path
 
-from command import CommandTest
+from command import ROOT, SAMPLES, CommandTest
 from photos import photo
 
 STEP = re.compile(r"^(@|\d*\$) (.*(?:\n> .*)*)\n((?:(?!@ |\d*\$ |# ).*\n)*)", re.M)
-PHOTOS = Path(__file__).parents[2] / "examples/photos"
+PHOTOS = ROOT / "examples/photos"
 USAGE_END = "! Try 'quavel --help'.\n[2]\n"  # of all transcripts of usage.txt, which leave it out
 
 
@@ -60,7 +59,7 @@ class Transcripts(CommandTest):
 
 for file in Path(__file__).with_name("transcripts").glob("*.txt"):
     setattr(Transcripts, "test_" + file.stem, lambda self, file=file: self.play(file))
-if not os.environ.get("QUAVEL_SAMPLES"):
+if not SAMPLES:
     Transcripts.test_samples = unittest.skip("QUAVEL_SAMPLES is not set")(Transcripts.test_samples)
 
 if __name__ == "__main__":
