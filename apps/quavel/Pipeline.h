@@ -29,7 +29,7 @@ struct Batch {
 
 // A batch should be short enough for results to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;  ///< In seconds.
-/// How many files the next batch should have, when the last one had `size` and `done` is finished.
+/// Doubles or halves `size`, the number of files in a new batch, by what the finished one took.
 std::size_t nextBatchSize(Batch const& done, std::size_t size);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.

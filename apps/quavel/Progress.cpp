@@ -16,9 +16,9 @@ namespace app {
 
 namespace {
 
-constexpr auto kQuietStart = std::chrono::milliseconds(500);  // without a progress line
-constexpr auto kInterval = std::chrono::milliseconds(100);    // between updates of the line
-constexpr auto kCountingSpell = std::chrono::milliseconds(1);
+constexpr auto kQuietStart = std::chrono::milliseconds(500);   // without a progress line
+constexpr auto kInterval = std::chrono::milliseconds(100);     // between updates of the line
+constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // then counting files rests
 constexpr int kRestFactor = 4;  // a rest is this many times as long as the spell before it
 
 double secondsSince(std::chrono::steady_clock::time_point start) {

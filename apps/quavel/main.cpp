@@ -69,7 +69,7 @@ int main(int argc, char** argv) {
     console.printMessage("the output cannot be written: " + error.code().message() +
                          "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {
-    output.giveUp();
+    output.giveUp();  // writes what is held, and the end of JSON
     console.printMessage("not enough memory; leave out --sort, or name fewer files at a time");
   } catch (std::exception const& error) {
     output.giveUp();

@@ -17,7 +17,7 @@ class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
 
-  /// Whether steps, hints and absences are wanted too, not only the refusal.
+  /// Whether all notes are wanted, not only the refusal and the hint at another format.
   bool wantsAll() const { return wantsAll_; }
 
   using Words = std::initializer_list<Word>;

@@ -54,7 +54,7 @@ class ReadScope {
       stream_.reading_.current = &begun_;
     }
   }
-  /// For a record of the library's own class: begins a read, even during another.
+  /// For `readStream` and a record of the library's own class: begins a read, even during another.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
     begun_.journal = journal;
     begun_.isOwnRecord = true;

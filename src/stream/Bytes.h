@@ -84,7 +84,7 @@ inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
 /// Where a walk goes when a box ends beyond all offsets; no read succeeds there. Where `long` has
-/// 32 bits, it is still before the end of the boxes around it: the walk goes on and then fails.
+/// 32 bits, a box around it that does so too ends 1 later: the walk there goes on and then fails.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
@@ -102,7 +102,7 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered == static_cast<std::int64_t>(count)) {
     return true;
   }
-  if (delivered < 0) {
+  if (delivered < 0) {  // a short read is no failure, or `QVReadAheadStream` has noted one
     noteReadResult(stream, delivered, /*error=*/0);
   }
   return false;

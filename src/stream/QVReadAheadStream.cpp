@@ -22,7 +22,7 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   source.setOffset(0);
   bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` is at its start: its offset is 0, not the target's low bits.
+  // A source that ignores `baseOffset` now says 0; any other says the low bits of the target.
   return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -61,7 +61,7 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  // From 0: a source that refuses the seek stays there, and one that goes to its end accepts it.
+  // From 0: a source that refuses the seek stays there. Going to its end counts as accepting it.
   sourcePosition_ = -1;
   source_->setOffset(0);
   if (fitsLong(target)) {
@@ -122,7 +122,7 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   if (mustSeek) {
     if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
-    } else if (!sourceAccepts(position_)) {
+    } else if (!sourceAccepts(position_)) {  // which seeks there
       return -1;
     }
   }

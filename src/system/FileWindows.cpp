@@ -30,7 +30,7 @@ std::wstring widened(std::string const& path) {
 /// the prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
-  std::vector<wchar_t> whole(std::size_t{size} + 1);
+  std::vector<wchar_t> whole(std::size_t{size} + 1);  // too small if the current folder changes now
   if (size < MAX_PATH || ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
     return path;
   }

@@ -76,7 +76,7 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
     if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` applied the rule for files
-      enter(path, /*isFoundByLink=*/true);
+      enter(path, /*isFoundByLink=*/true);     // also for DT_UNKNOWN, which may be no link
     }
     return false;
   }

@@ -81,7 +81,7 @@ bool PathList::refill() {
   }
   buffer_.erase(0, start_);
   start_ = 0;
-  if (buffer_.size() > 2 * kMaxPathLength) {  // all of it one path, which is too long
+  if (buffer_.size() > 2 * kMaxPathLength) {  // no separator in it: one path, which is too long
     buffer_.resize(kMaxPathLength + 1);       // enough for `inputFor` to see that
   }
   std::size_t const size = buffer_.size();
