@@ -23,7 +23,7 @@ struct Form {
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
-  /// --print0 does not count, because it shows no values.
+  /// Whether it shows values to programs. Paths, the form of --print0, show none.
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }

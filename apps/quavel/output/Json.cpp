@@ -89,7 +89,7 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // Goes with each path that is not valid UTF-8; other paths do not have this field.
+  // A path that is not valid UTF-8 comes with its pathBytes; other paths have none.
   bool const addsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
   return [&form, isForTerminal, addsPathBytes, ofRecord = membersOf(fields),
           ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),

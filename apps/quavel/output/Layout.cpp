@@ -12,8 +12,8 @@ constexpr std::size_t kGap = 2;  // blanks between columns
 
 /// Shortens the widest columns first, each down to its minimum, until the line fits or no column
 /// can be shortened further.
-void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t line) {
-  while (lineWidth(widths) > line) {
+void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t maxWidth) {
+  while (lineWidth(widths) > maxWidth) {
     std::size_t widest = columns.size();  // none found yet
     for (std::size_t i = 0; i < columns.size(); ++i) {
       bool const canGive = widths[i] > columns[i].least;
@@ -51,16 +51,16 @@ std::size_t lineWidth(Widths const& widths) {
   return sum == 0 ? 0 : sum - kGap;
 }
 
-Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line) {
+Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t maxWidth) {
   while (true) {
     Widths widths = natural;
     // No column needs more than the whole line; this also bounds the steps of `shorten`.
     for (auto& width : widths) {
-      width = std::min(width, line);
+      width = std::min(width, maxWidth);
     }
-    shorten(columns, widths, line);
+    shorten(columns, widths, maxWidth);
     std::size_t const dispensable = mostDispensable(columns, widths);
-    if (lineWidth(widths) <= line || dispensable == columns.size()) {
+    if (lineWidth(widths) <= maxWidth || dispensable == columns.size()) {
       return widths;
     }
     natural[dispensable] = 0;

@@ -21,8 +21,8 @@ using Widths = std::vector<std::size_t>;
 /// The width of a line with columns of these widths and the gaps between them.
 std::size_t lineWidth(Widths const& widths);
 
-/// The `natural` widths, reduced as `columns` allow until a line takes at most `line` cells.
-Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t line);
+/// The `natural` widths, reduced as `columns` allow, for lines of at most `maxWidth` cells.
+Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t maxWidth);
 
 /// One line of the table, with its line end.
 std::string lineOf(std::vector<Column> const& columns, Widths const& widths,

@@ -57,8 +57,8 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes up to PIPE_BUF bytes whole or not at all. So an interrupt cuts no piece of such a
-  // write, even while the pipe's reader keeps us waiting. Writes to a regular file do not wait.
+  // A pipe takes a write of up to PIPE_BUF bytes whole or not at all, so an interrupt cuts no piece
+  // while the pipe's reader keeps us waiting. A regular file never does, so it gets all at once.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {

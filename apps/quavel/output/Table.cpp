@@ -17,7 +17,7 @@ namespace {
 
 constexpr std::size_t kMostRows = 500;                      // in a page
 constexpr auto kPageTime = std::chrono::milliseconds(200);  // a terminal waits no longer for a page
-constexpr auto kFirstPageTime = std::chrono::milliseconds(12);  // nobody notices so short a wait
+constexpr auto kFirstPageTime = std::chrono::milliseconds(12);  // the first seems to come at once
 
 /// The folder that all paths in the column are in, with a "/" at its end; empty when there is none.
 std::string commonFolder(std::vector<rows::Row> const& rows, std::size_t column) {
@@ -73,7 +73,7 @@ Table::Table(Form const& form, Output& output)
       columns_(rows::columnsOf(form.fields)),
       isTerminal_(output.isTerminal()) {
   while (pathColumn_ < columns_.size() && !columns_[pathColumn_].keepsEnd) {
-    ++pathColumn_;
+    ++pathColumn_;  // only the path's column keeps its end
   }
 }
 
@@ -199,7 +199,7 @@ void Table::writeHeader() {
   output_.add(lineOf(columns_, widths_, labels));
 }
 
-/// The widths of the page's columns if nothing is cut; 0 for an empty column that is not shown.
+/// The columns' widths if no text of the page, as `inLayout` gives it, is cut; 0: empty, hidden.
 Widths Table::naturalWidths(bool mustShowEmpty) const {
   bool const showEmpty = mustShowEmpty || form_.showAbsent.value_or(!form_.fields.empty());
   Widths natural(columns_.size(), 0);

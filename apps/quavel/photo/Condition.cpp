@@ -38,7 +38,7 @@ constexpr Relation kRelations[] = {
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// Parses the whole text as the type that a field's function takes; absent if it is no such value.
+/// Parses the whole text as the type that `field.words` takes; absent if it is no such value.
 struct ParseFor {
   std::string_view text;
 

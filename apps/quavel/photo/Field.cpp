@@ -15,7 +15,7 @@ namespace {
 
 using quavel::QVMetadata;
 
-constexpr std::size_t kMaxCells = 200;
+constexpr std::size_t kMaxCells = 200;            // of a terminal
 constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // combining marks take bytes, but no cells
 
 /// A member's value; absent when the member holds -1, NaN or an empty text, which stand for that.
@@ -79,7 +79,7 @@ std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-/// Puts a value, which must not be absent, into words by the function of a field.
+/// Puts a value, which must not be absent, into words by `field.words`.
 struct PutIntoWords {
   Value const& value;
   template <class T>

@@ -38,14 +38,14 @@ bool contains(Fields const& fields, std::string_view name);
 /// The fields of a file that gave a record: those before error.
 Fields recordFields();
 
-/// The field for people: in words, on one line, safe for a terminal and at most 200 cells long
-/// (a path is never cut). Empty when absent.
+/// The field for people: in words, on one line, safe for a terminal and at most 200 of its cells
+/// long (a path is never cut). Empty when absent.
 std::string inWords(Field const& field, Outcome const& outcome);
 
 /// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
-/// The value by which files are sorted and selected, whatever form the output has.
+/// The value to sort and select files by; for captureDate, the first date that is not blank.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, a number with the digits that give it exactly

@@ -31,7 +31,7 @@ struct Input {
 /// The result of reading one file.
 struct Outcome {
   std::string path;
-  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: there is none, or it was dropped.
+  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or `text` or `cells` replaced it.
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< As the journal gives it.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.

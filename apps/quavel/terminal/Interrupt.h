@@ -49,7 +49,7 @@ class WriteScope {
 };
 
 /// Ends the process now if a signal has arrived during the current WriteScope. Only to be called
-/// while nothing of the write has been written, so that no line is cut.
+/// before the first byte of a write or after its last, so that no line is cut.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt
