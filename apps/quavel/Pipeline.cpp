@@ -24,7 +24,7 @@ constexpr bool kCanCountWaits = false;  // all reading is then taken to wait for
 long countWaits() { return 0; }
 #endif
 
-constexpr std::size_t kMaxBatch = 128;                     // files
+constexpr std::size_t kMaxBatch = 64;                      // files
 constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
 
 }  // namespace
