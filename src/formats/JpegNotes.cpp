@@ -7,7 +7,7 @@ using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
   std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;   // -1: not known
-  std::int64_t const end = size < 0 ? position : std::min(position, size);  // see JpegWalk.h
+  std::int64_t const end = size < 0 ? position : std::min(position, size);  // may lie past the end
   notePassed(journal, position, "end of the data at {}, where the walk ends", Offset{end});
 }
 

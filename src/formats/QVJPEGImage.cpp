@@ -221,7 +221,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!QVMetadata::storeInfoFromExifIFD(ifd)) {
     return false;
   }
-  int exifWidth = width;  // without a tag, as an earlier directory gave it
+  int exifWidth = width;  // stays so if this directory gives none
   int exifHeight = height;
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;

@@ -131,8 +131,8 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   }
 }
 
-// The tag has an entry in the next two functions: without a row for it, the directory is a host's,
-// of which no notes are kept.
+// The next two functions are called only for a tag that has an entry. If they find no row for it,
+// the directory is a host's, of which no notes are kept.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);
@@ -149,7 +149,7 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  bool const isUndefined = row->typeCode == kUndefinedCode;
+  bool const isUndefined = row->typeCode == kUndefinedCode;  // never refused as a text
   return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
                 PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},

@@ -56,7 +56,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // Back to this entry's end: a stream that ignores the seek to the values reads them from there.
+    // The walk has read ahead: a stream that ignores `readValues`' seek is to read from here.
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",

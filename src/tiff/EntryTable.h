@@ -95,7 +95,7 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
 /// for those that lie beyond the end of the data. Of more: their offset.
 std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed);
 
-/// Stores that, and the `count` of the bytes, in an entry for a host.
+/// Stores in an entry for a host what `bytesOrOffsetOf` gave, and the `count` of the bytes.
 void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
                     QVTiffImageFileDirectoryEntry& entry);
 

@@ -57,7 +57,7 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
       return false;
     }
     std::uint8_t const* bytes =
-        isInField ? entry.field : part.data();  // a field is done in one pass
+        isInField ? entry.field : part.data();  // a field's values fit in one part
     std::size_t const oldSize = values.size();
     values.resize(oldSize + partCount);
     EntryValue* value = values.data() + oldSize;
