@@ -38,8 +38,8 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3Box
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box, or to `kOutOfReach` if no offset reaches it. That is still before the
-/// ends of the boxes around it, so the walks over these try to read another box and are refused.
+/// Moves to the end of a box, or to `kOutOfReach` if no offset reaches the end. The boxes around it
+/// end further on still, so the walks over them look for another box there and are refused.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail
