@@ -20,7 +20,9 @@ TEST(Formats, ReadTheirMainAndExifDirectories) {
     bool const isTiff = extension == std::string("tiff");  // it stores more before
     check(
         fixtureOf(extension),
-        {{"", {kFarAway, insert(2, 70), insert(0, 3, characters(kModel, "never decoded", 99))}},
+        {{"",
+          {kFarAway, insert(2, 70), insert(1, 63),
+           insert(0, 3, characters(kModel, "never decoded", 99))}},
          {"! isRaw", {shorts(kOrientation, 1, 1), shorts(kOrientation), unreadable(kOrientation)}},
          {isTiff ? "! width, height, orientation, dateTime" : "! orientation, isRaw",
           {longs(kExif, 8, 8), longs(kExif), longs(kExif, 100000),
@@ -223,6 +225,7 @@ TEST(Cr3, StoresTheExifDirectory) {
       exif,
       {{"iso=4464", {longs(kIso, 70000)}},
        {"iso=40000", {shorts(kIso, 40000)}},
+       {"exposureTime=3355443.25", {ratio(kExposureTime, 16777217, 5)}},  // in single precision
        {"-exposureBiasValue", {ratio(kExposureBias, 0, 0, kSRational), drop(kExposureBias)}},
        {"apexFNumber=5.65685415, apertureValue=5", {ratio(kAperture, 5, 1)}},
        {"apexExposureTime=0.015625, shutterSpeedValue=6", {ratio(kShutterSpeed, 6, 1, kSRational)}},
@@ -248,6 +251,7 @@ TEST(Cr3, FindsTheMetadataWhereverItIs) {
       "cr3",
       {{all,
         {cr3File(uuidBox(cmt12)),
+         cr3File(uuidBox(box("CMT2", tiff(kII, {})) + cmt2Box() + cmt1Box())),
          filler + cr3File(filler + uuidBox(filler + cmt2Box() + empty + cmt1Box())),
          cr3File(foreign + uuidBox(cmt12) + filler), cr3File(uuidBox(filler) + uuidBox(cmt12)),
          cr3File(uuidBox(cmt12 + Bytes(8, '\0'))),  // after both boxes nothing is looked at

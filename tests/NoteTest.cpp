@@ -108,7 +108,8 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
        "malformed-entry at 66: 0x920a FocalLength at 0x42 (66) in IFD0 of the CMT2 box holds 1 "
        "SRATIONAL value; 1 RATIONAL value wanted\n"},
       {"cr3", "\x89PNG" + Bytes(20, 'f'),  // far beyond the end of what is not a CR3 file
-       "other-kind at 24: the header of the next box before a moov box was met: 8 bytes wanted"},
+       "other-kind at 2303741511: the header of the next box before a moov box was met: 8 bytes "
+       "wanted"},
       {"jpg/a", "", "unknown-extension: there is no extension; these name a format: tiff"},
       {"", "x", "unknown-extension: there is no extension; these name a format: tiff"},
       {Bytes(100, 'x') + "y", "",
@@ -145,6 +146,13 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
       {"jpg",
        kSOI + sof0() + segment(0xffda, "cd") + segment(0xffda, "ef") + segment(0xffe1, "http"),
        "hint picture-data at 21: No APP1 was met before the scan at 0x15 (21);"},
+      {"jpg", kSOI + exifSegment(tiff(kII, {})) + segment(0xffda, "cd"),
+       "dateTimeOriginal not-in-file: no 0x8769 ExifIFDPointer in IFD0 of the Exif segment at"},
+      {"tif", tiff(kII, {{longs(kOrientation, 5)}}).substr(0, 19),
+       "cut-short at 18: 0x0112 Orientation at 0xa (10) in IFD0: 4 bytes wanted at 0x12 (18)"},
+      {"raf", Bytes("FUJIFILM") + Bytes(76, 'x') + Bytes("\0\0\x10\0", 4),
+       "cut-short at 4108: the TIFF header of the embedded JPEG's Exif segment: 2 bytes wanted"},
+      {"cr3", box("ftyp", "heic"), "hint ... like an ISO base media file of brand \"heic\"; its"},
       {"jpg", kSOI + sof0(), "step none at 2: the SOF0 segment at 2 declares 4000 x 3000\n"},
       {"raf", rafFile(Bytes(40, 'x'), ""), "hint other-opening at 148: The embedded JPEG at "},
       {"raf", rafFile("\xff\xd8\xff\xe2" + image.substr(4), ""), "hint other-opening at 148: "},
@@ -172,6 +180,12 @@ TEST(Journal, TellsWhyAFileOnDiskCannotBeRead) {
   EXPECT_EQ(journal.refusal()->text,
             "the TIFF header at 0: 2 bytes wanted at 2, but the file ends at 3");
   EXPECT_EQ(journal.refusal()->systemError, 0);
+
+  TemporaryFile const pastTheEnd(kSOI + Bytes("\xff\xe2\1\0", 4), "jpg");
+  QVJournal steps;
+  EXPECT_TRUE(steps.read(pastTheEnd.path));
+  EXPECT_EQ(shown(steps.notes().front()),
+            "step none at 6: end of the data at 6, where the walk ends");
 
   TemporaryFile const photo(fixtureOf("tif").bytes(kII), "tif");
   EXPECT_EQ(describe(journal.read(photo.path)), fixtureOf("tif").expected);
@@ -209,6 +223,10 @@ TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItToOthers) {
   };
   expectRefusal(photo, "read-error at 4: " + header + ": 4 bytes wanted at 4, but reading fails\n");
   expectRefusal(std::make_shared<QVReadAheadStream>(photo, 4, 4), "read-error at 4: ");
+  photo->onRead = [&](auto* destination, std::size_t size) {
+    return photo->offset >= 86 ? -1 : photo->deliver(destination, size);
+  };
+  expectRefusal(photo, "read-error at 93: 0x");
   photo->onRead = [&](auto* destination, std::size_t size) {  // more than was asked for
     return photo->deliver(destination, size) + (size > 8 ? 1000 : 0);
   };

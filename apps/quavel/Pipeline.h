@@ -45,8 +45,6 @@ class Pipeline {
   Pipeline(unsigned jobs, unsigned busyJobs, Work work);
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
-  Pipeline(Pipeline const&) = delete;
-  Pipeline& operator=(Pipeline const&) = delete;
 
   /// Works on the first batch itself, and on every batch if there is only one job.
   void submit(std::unique_ptr<Batch> batch);

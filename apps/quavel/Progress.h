@@ -20,8 +20,6 @@ class Progress {
   /// Both arguments must outlive it.
   Progress(Console& console, Options const& options);
   ~Progress();
-  Progress(Progress const&) = delete;
-  Progress& operator=(Progress const&) = delete;
 
   void count(bool hasRecord, bool isShown) {
     ++(hasRecord ? records_ : failures_);

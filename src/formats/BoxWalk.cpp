@@ -18,7 +18,7 @@ char const* meaningOf(std::uint32_t size) {
 
 }  // namespace
 
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3BoxHeader& header) {
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
   long const start = stream->getOffset();
   std::int64_t const position = stream->baseOffset + start;
@@ -28,7 +28,8 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3Box
   // From the last box, `leaveBox` may have gone to an offset at which no read may start.
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
-    return refuseCut(journal, position, box::kHeaderSize, "the header of the next box{}", context);
+    return refuseCut(journal, wrappingSum(stream->baseOffset, std::max(start, context.lastEnd)),
+                     box::kHeaderSize, "the header of the next box{}", context);
   }
   // A smaller size would leave the walk where it is, or inside this header. The standard gives 0
   // and 1 a meaning, but no metadata follows such a box.
@@ -38,7 +39,8 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3Box
                   PlacedBox{header.boxType, position}, context, header.boxSize,
                   meaningOf(header.boxSize));
   }
-  leaveBox(*stream, endOfBox(start, header));
+  context.lastEnd = endOfBox(start, header);
+  leaveBox(*stream, context.lastEnd);
   return true;
 }
 

@@ -28,12 +28,13 @@ void append(std::string& out, PlacedBox box);
 struct BoxContext {
   char const* text = "";
   PlacedBox parent = {};  ///< Appended to the text; type 0: there is none.
+  long lastEnd = 0;       ///< Where the last box ends, even if the stream cannot go there.
 };
 void append(std::string& out, BoxContext context);
 
 /// Reads the box header at the stream's position and moves past the box. False: the header cannot
 /// be read, the size in it is smaller than the header itself, or there are too many boxes.
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext context, QVCR3BoxHeader& header);
+bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header);
 
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);

@@ -6,9 +6,17 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  std::int64_t const size = wantsAll(journal) ? journal->dataSize() : -1;   // -1: not known
-  std::int64_t const end = size < 0 ? position : std::min(position, size);  // may lie past the end
-  notePassed(journal, position, "end of the data at {}, where the walk ends", Offset{end});
+  if (!wantsAll(journal)) {
+    return;
+  }
+  bool const isSizeKnown = journal->dataSize() > 0;
+  std::int64_t const end = isSizeKnown ? std::min(position, journal->dataSize()) : position;
+  if (journal->hasReadFailed) {
+    noteHint(journal, QVReason::ReadError, end, "The walk ends at {}, where {}", Offset{end},
+             journal->cutText(end));
+  } else {
+    notePassed(journal, end, "end of the data at {}, where the walk ends", Offset{end});
+  }
 }
 
 void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
@@ -25,7 +33,7 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
              static_cast<std::uint32_t>(width), static_cast<std::uint32_t>(height));
 }
 
-/// Says of each field why it is absent, if it is: the notes of the others are not shown.
+/// Notes why fields may be absent. A note about a field that has a value is not shown.
 void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;

@@ -9,7 +9,8 @@ QVCR3Box::~QVCR3Box() = default;
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
   detail::ReadScope const scope(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
-  return detail::stepOverBox(stream, /*context=*/{}, *boxHeader);
+  detail::BoxContext context;
+  return detail::stepOverBox(stream, context, *boxHeader);
 }
 
 std::shared_ptr<QVCR3BoxHeader> QVCR3Box::header() const { return boxHeader; }

@@ -13,10 +13,10 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
+  BoxContext context = {" before a moov box was met"};
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
-    BoxContext const context = {" before a moov box was met"};
     if (!stepOverBox(stream, context, header)) {
       return false;
     }

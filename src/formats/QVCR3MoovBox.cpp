@@ -28,7 +28,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
-  BoxContext const context = {" in the ", {box::Moov, stream->baseOffset + start}};
+  BoxContext context = {" in the ", {box::Moov, stream->baseOffset + start}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (!stepOverBox(stream, context, child)) {

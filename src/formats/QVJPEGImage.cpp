@@ -48,7 +48,7 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd9, 2},  // EOI
 }};
 
-/// Moves to the next segment. False: no read may start there.
+/// Moves to the next segment, or beyond the end of the data. False: no offset reaches there.
 bool seekNext(QVStream& stream, std::int64_t offset) {
   return seek(stream, offset) || refuseCut(journalOf(stream), stream.baseOffset + offset,
                                            kMarkerSize, "the marker of the next segment");
@@ -121,8 +121,8 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   if (marker == kSOS && walk.firstScan < 0) {
     walk.firstScan = walk.start;
     bool const sawNeither = !walk.sawAPP1 && !walk.sawSOF0;
-    char const* const theOther = walk.sawAPP1 ? "SOF0" : "APP1";  // with both, the walk ends
-    walk.missingAtScan = sawNeither ? "SOF0 or APP1" : theOther;
+    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // the walk ends with both
+    walk.missingAtScan = sawNeither ? "SOF0 or APP1" : missingOne;
   }
   // Once the scan has begun, these two bytes are picture data.
   if (marker == kSOF2 && walk.firstScan < 0) {

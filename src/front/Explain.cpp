@@ -91,7 +91,8 @@ constexpr Signature kSignatures[] = {
     {0, 4, "MM\0+", "a BigTIFF structure", kTiffFamilies},
     {0, 3, "\xff\xd8\xff", "a JPEG file", kJpeg},
     {0, 8, "FUJIFILM", "a RAF file", kRaf},
-    {4, 4, "ftyp", "an ISO base media file", kCr3},
+    {4, 8, "ftypcrx ", "an ISO base media file", kCr3},
+    {4, 4, "ftyp", "an ISO base media file", 0},
     {0, 4, "\x89PNG", "a PNG file", 0},
     {0, 4, "GIF8", "a GIF file", 0},
     {0, 4, "RIFF", "a RIFF file (WebP, for example)", 0},
@@ -124,7 +125,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
       for (QVNote& note : journal.notes) {
-        if (note.kind == QVNoteKind::Refusal) {
+        if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
           note.reason = QVReason::OtherKind;  // says more than where the wrong reader failed
         }
       }

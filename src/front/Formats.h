@@ -40,11 +40,11 @@ void noteAbsences(Format const& format, QVMetadata const& record, Journal& journ
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null. The journal may be null, here and below.
-std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal);
+std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal = nullptr);
 
 /// The record of the file that the stream holds, or null.
 std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
-                                       std::string const& extension, Journal* journal);
+                                       std::string const& extension, Journal* journal = nullptr);
 
 }  // namespace detail
 }  // namespace quavel

@@ -5,12 +5,10 @@
 
 namespace quavel {
 
-QVReader::QVReader(std::string const& path)
-    : metadata(detail::readPath(path, /*journal=*/nullptr)) {}
+QVReader::QVReader(std::string const& path) : metadata(detail::readPath(path)) {}
 
 QVReader::QVReader(unsigned char* buffer, unsigned long const& length, std::string const& extension)
-    : metadata(detail::readStream(std::make_shared<QVMStream>(buffer, length), extension,
-                                  /*journal=*/nullptr)) {}
+    : metadata(detail::readStream(std::make_shared<QVMStream>(buffer, length), extension)) {}
 
 QVReader::~QVReader() = default;
 

@@ -22,7 +22,9 @@ bool isLimit(QVReason reason) {
 }  // namespace
 
 void Journal::add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text) {
-  notes.push_back({kind, reason, position, /*field=*/"", std::move(text), /*systemError=*/0});
+  bool const isSystemFailure = reason == QVReason::CannotOpen || reason == QVReason::ReadError;
+  notes.push_back(
+      {kind, reason, position, /*field=*/"", std::move(text), isSystemFailure ? systemError : 0});
 }
 
 void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern, Words words) {
@@ -32,14 +34,11 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
   isRefused_ = true;
   QVNoteKind const kind = isLimit(reason) ? QVNoteKind::Limit : QVNoteKind::Refusal;
   add(kind, reason, position, composed(pattern, words));
-  if (reason == QVReason::CannotOpen || reason == QVReason::ReadError) {
-    notes.back().systemError = systemError;
-  }
 }
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
                         Words words) {
-  if (dataSize() == 0) {
+  if (position == 0 && !hasReadFailed && dataSize() == 0) {
     refuse(QVReason::Empty, -1, "the file is empty", {});
     return;
   }
@@ -64,7 +63,7 @@ std::string Journal::cutText(std::int64_t end) {
     return systemError == 0 ? "reading fails"
                             : "reading fails: " + std::generic_category().message(systemError);
   }
-  if (dataSize() < 0) {
+  if (dataSize() <= 0) {  // some file systems say 0 of files that have bytes
     return "the data ends before that";
   }
   bool const isInFile = end <= dataSize();

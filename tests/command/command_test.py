@@ -49,7 +49,9 @@ class Names(CommandTest):
     def test_nothing_steers_the_terminal(self):
         self.put(b"\x1b]0;owned\x07\xe9\xe2\x80\xae.cr3", photo("cr3", model=b"\x1b[31m\r\n\xff"))
         self.put(b"\x1b[1m.nef", b"")
-        steering = set("\x1b\x07\r\u202e")
+        self.put(b"delete\x7f.tif", photo())  # within eight bytes
+        self.put(b"12345\x7f78.tif", photo())  # and elsewhere
+        steering = set("\x1b\x07\r\x7f\u202e")
         for arguments in ([], ["--card"], ["--sort", "path"]):
             done = self.run_quavel(*arguments, ".", status=1)
             text = (done.stdout + done.stderr).decode()

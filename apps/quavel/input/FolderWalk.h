@@ -39,8 +39,7 @@ class FolderWalk {
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
   bool isAtEnd() const { return !unreadable_ && levels_.empty(); }
-  /// A short step of `next`, for callers with other things to do meanwhile. False: it found nothing
-  /// yet. Not to be called at the end.
+  /// A short step of `next`. False: it found nothing yet. Not to be called at the end.
   bool step(Input& input);
 
  private:

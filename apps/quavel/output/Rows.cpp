@@ -14,7 +14,8 @@ constexpr std::size_t kDay = 10;            // the length of "2018-02-21"
 constexpr std::size_t kMinute = 16;         // the length of "2018-02-21 12:08"
 
 std::vector<Column> defaultColumns() {
-  // Label, least width, rank (the highest is left out first, 0 never), whether it keeps its end.
+  // Label, least width, rank (the highest is left out first, 0 never), whether it is cut at its
+  // start.
   return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};

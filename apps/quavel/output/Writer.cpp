@@ -73,8 +73,7 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path, ended by a NUL. Without conditions, only files with a record are shown; with them,
-/// all that meet them, and no others get here.
+/// Each path, ended by a NUL: of files that meet the conditions or, without any, have a record.
 TextOf paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;

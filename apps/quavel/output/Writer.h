@@ -11,10 +11,7 @@ namespace app {
 /// Writes the output in one form.
 class Writer {
  public:
-  Writer() = default;
   virtual ~Writer() = default;
-  Writer(Writer const&) = delete;
-  Writer& operator=(Writer const&) = delete;
 
   /// Sets the outcome's text or cells and drops what they replace. Called on any thread.
   virtual void prepare(Outcome& outcome) const = 0;

@@ -45,7 +45,7 @@ std::string inWords(Field const& field, Outcome const& outcome);
 /// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
-/// The value to sort and select files by; for captureDate, the first date that is not blank.
+/// The value to sort and select files by: for captureDate, the first date that is not blank.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, a number with the digits that give it exactly

@@ -71,7 +71,7 @@ std::string whiteBalance(std::int32_t value) {
 }
 
 std::string exposureTime(float seconds) {
-  bool const isTiny = seconds <= 1e-6F;  // too short to show as 1/N; also 0 or less
+  bool const isTiny = seconds <= 1e-6F;  // 1/N would be a long number; also 0 or less
   // As on cameras: a fraction up to 1/4 s, decimals from 0.3 s on.
   if (!isTiny && seconds < 0.26F) {
     return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";

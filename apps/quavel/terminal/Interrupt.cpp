@@ -68,8 +68,7 @@ void write(int fd, std::string_view bytes) {
 
 void install() {
   struct sigaction action = {};
-  // Without SA_RESTART, so that a blocked write of Output fails with EINTR and can be given up.
-  action.sa_handler = handle;
+  action.sa_handler = handle;  // without SA_RESTART: a blocked write of Output ends with EINTR
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);

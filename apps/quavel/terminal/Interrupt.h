@@ -6,8 +6,7 @@
 #include <string_view>
 
 /// On SIGINT, SIGTERM and SIGHUP, a signal handler closes the output (see `setTail`) and ends the
-/// process at once. There is no waiting thread for this: a single thread reads files faster, since
-/// the system need not guard open files against other threads.
+/// process at once. A thread that waits for the signals would slow down the reading of files.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
