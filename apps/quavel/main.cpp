@@ -16,20 +16,19 @@
 #ifdef __GLIBC__
 #include <malloc.h>
 #endif
+#ifndef O_PATH  // which not every system has
+#define O_PATH O_RDONLY
+#endif
 
 namespace {
 
-/// Opens /dev/null in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. The mode is the wrong one, so that using the stream still fails: a standard input
-/// that could be read would look like an empty list.
+/// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
+/// descriptor. Using the stream still fails, even by way of /dev/stdin: a standard input that could
+/// be read would look like an empty list.
 void holdStandardStreams() {
-  // Each `open` takes the lowest free descriptor.
-  if (::fcntl(STDIN_FILENO, F_GETFD) == -1) {
-    static_cast<void>(::open("/dev/null", O_WRONLY | O_CLOEXEC));
-  }
   int fd = -1;
-  do {
-    fd = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
+  do {  // each `open` takes the lowest free descriptor
+    fd = ::open("/", O_PATH | O_CLOEXEC);
   } while (0 <= fd && fd <= STDERR_FILENO);
   if (fd > STDERR_FILENO) {
     ::close(fd);

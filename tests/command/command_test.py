@@ -191,6 +191,20 @@ class Endings(CommandTest):
             for line in lines[form == "--csv":]:
                 check(line)
 
+    def test_few_files_wait_for_one_that_takes_long(self):
+        self.put("list", b"a.tif\n" * 3 + b"slow.tif\n" + (b"./" * 1000 + b"a.tif\n") * 1000)
+        signal.signal(signal.SIGIO, signal.SIG_IGN)  # it would tell that the command waits in open
+        held = os.open(self.put("slow.tif", photo()), os.O_RDWR)
+        fcntl.fcntl(held, fcntl.F_SETLEASE, fcntl.F_WRLCK)  # whoever opens the file waits until this ends
+        with self.start("-q", "-j", "2", "--csv", "--files-from", "list", stdout=subprocess.PIPE) as process:
+            time.sleep(0.2)
+            process_folder = Path(f"/proc/{process.pid}")
+            lists = [fd.name for fd in (process_folder / "fd").iterdir() if os.readlink(fd).endswith("/list")]
+            read = [int((process_folder / "fdinfo" / fd).read_text().split()[1]) for fd in lists]
+            os.close(held)
+            self.assertEqual(len(process.stdout.read().splitlines()), 1005)
+        self.assertTrue(read and read[0] < 200_000, read)  # no list: it has been read to its end
+
     def test_interrupt_completes_json_that_lacks_only_its_end(self):
         length = len(self.run_quavel("-q", "--json", "a.tif").stdout.removesuffix(b"\n]\n"))
         end, start = os.pipe()
