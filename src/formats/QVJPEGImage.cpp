@@ -32,7 +32,8 @@ constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// No length is read after these markers; so many bytes are skipped instead. A constant, so that
+// How many bytes to skip after these markers, of which no length is read: the length and interval
+// of DRI; 2 bytes of any kind after the others, which have no payload. This is a constant, so that
 // readers work even before the public map below is initialised.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
@@ -173,6 +174,7 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   if (walk.sof0 < 0 || width > walk.frameWidth || height > walk.frameHeight) {
     walk.sof0 = walk.start;
   }
+  // Until an APP1 is met, the walk goes on and may find more frames: the greatest sides count.
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
   walk.sawSOF0 = true;

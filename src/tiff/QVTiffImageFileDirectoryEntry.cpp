@@ -22,9 +22,9 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   }
   std::array<std::uint8_t, kEntryFieldSize> field;
   entry.field = field.data();
-  entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
+  entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));  // without any padding
   if (entry.typeCode == kUndefinedCode) {
-    // Up to 4 bytes are stored even if the data ends within them; an offset only if it is whole.
+    // If the data ends within up to 4 bytes, they are stored all the same; an offset is not.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, bytesOrOffsetOf(entry, needsReversal(*stream)), *this);
     }

@@ -1,7 +1,6 @@
 #include "output/Rows.h"
 
 #include "photo/Words.h"
-#include "terminal/Text.h"
 
 namespace app::rows {
 
@@ -38,7 +37,7 @@ std::string withoutVerb(std::string const& orientation) {
 }
 
 Row defaultRow(Outcome const& outcome) {
-  return {escapedPath(outcome.path),       toTheMinute(wordsOf("captureDate", outcome)),
+  return {wordsOf("path", outcome),        toTheMinute(wordsOf("captureDate", outcome)),
           words::size(*outcome.record),    withoutVerb(wordsOf("orientation", outcome)),
           wordsOf("model", outcome),       wordsOf("lensModel", outcome),
           words::exposure(*outcome.record)};
