@@ -28,8 +28,9 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   // From the last box, `leaveBox` may have gone to an offset at which no read may start.
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
-    return refuseCut(journal, wrappingSum(stream->baseOffset, std::max(start, context.lastEnd)),
-                     box::kHeaderSize, "the header of the next box{}", context);
+    std::int64_t const wanted = std::max(std::int64_t{start}, context.lastEnd);
+    return refuseCut(journal, wrappingSum(stream->baseOffset, wanted), box::kHeaderSize,
+                     "the header of the next box{}", context);
   }
   // A smaller size would leave the walk where it is, or inside this header. The standard gives 0
   // and 1 a meaning, but no metadata follows such a box.
@@ -39,8 +40,8 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
                   PlacedBox{header.boxType, position}, context, header.boxSize,
                   meaningOf(header.boxSize));
   }
-  context.lastEnd = endOfBox(start, header);
-  leaveBox(*stream, context.lastEnd);
+  context.lastEnd = wrappingSum(start, header.boxSize);
+  leaveBox(*stream, endOfBox(start, header));
   return true;
 }
 

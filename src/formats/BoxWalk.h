@@ -27,8 +27,8 @@ void append(std::string& out, PlacedBox box);
 /// Where a box was met, as a note says it after the box: " in the moov box at 0x18 (24)".
 struct BoxContext {
   char const* text = "";
-  PlacedBox parent = {};  ///< Appended to the text; type 0: there is none.
-  long lastEnd = 0;       ///< Where the last box ends, even if the stream cannot go there.
+  PlacedBox parent = {};     ///< Appended to the text; type 0: there is none.
+  std::int64_t lastEnd = 0;  ///< Where the last box ends, even if the stream cannot go there.
 };
 void append(std::string& out, BoxContext context);
 
