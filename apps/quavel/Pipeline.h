@@ -29,7 +29,8 @@ struct Batch {
 
 // A batch should be short enough for results to flow and long enough to be worth handing over.
 constexpr double kLongBatch = 0.002;  ///< In seconds.
-/// Doubles or halves `size`, the number of files in a new batch, by what the finished one took.
+/// How many files the next batch should have: twice `size`, within bounds, or half of it if the
+/// finished one took too long or gave too much text.
 std::size_t nextBatchSize(Batch const& done, std::size_t size);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
@@ -62,8 +63,8 @@ class Pipeline {
   void workOn(Batch& batch);
   void runThread();
 
-  std::atomic<unsigned> jobs_;
-  unsigned busyJobs_;
+  std::atomic<unsigned> jobs_;  // lowered when no more threads can be started; workers read it
+  unsigned busyJobs_;           // used by the caller's thread only
   std::atomic<bool> waitsForDisk_;
   Work work_;
   std::vector<std::thread> threads_;

@@ -21,7 +21,7 @@ inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
     std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB
-    std::uint64_t{1} << 24U,  // steps: enough for 32 MB of zeros in a JPEG, one every 2 bytes
+    std::uint64_t{1} << 24U,  // steps: a JPEG's reader takes one for every 2 bytes of padding
 };
 
 /// One read of a file: the work done so far, and the journal.

@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// A position that every file system accepts in a seek. Their limits differ, but all lie above it.
+/// Every file system accepts a seek to any position up to this; what lies beyond depends on it.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read states its position, so that a seek needs no system
@@ -34,8 +34,8 @@ class PositionedFile : public QVFStream {
   int reads_ = 0;                  // calls of `readBuffer`
 };
 
-/// Opens the file at `path` as a stream that reads ahead. Sets `*fd`, if given, to the descriptor,
-/// which the stream owns; -1: the file cannot be opened, and `errno` says why.
+/// Opens the file at `path` as a stream that reads ahead; an empty one if it cannot be opened. Sets
+/// `*fd`, if given, to the descriptor, which the stream owns; -1: not opened, `errno` says why.
 std::shared_ptr<QVStream> openReadAhead(std::string const& path, int* fd = nullptr);
 
 }  // namespace quavel::detail

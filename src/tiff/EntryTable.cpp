@@ -56,7 +56,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // The walk has read ahead: a stream that ignores `readValues`' seek is to read from here.
+    // This seek is for a stream that ignores the one to the values, in `readValues`: it then reads
+    // them from here, and not from wherever the walk's own reading ahead has left it.
     if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
@@ -67,7 +68,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     }
   }
 
-  // Reading the values may have moved the stream anywhere.
+  // Reading the values may have moved the stream anywhere. Only beyond all offsets does this fail.
   if (!seek(stream, walk.end())) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }

@@ -18,8 +18,8 @@ class PathList {
 
   /// Whether `next` returns without waiting for the process that writes the list.
   bool isReady();
-  /// The next path that is not empty, with a problem if no file can have it. False: the list has
-  /// ended, or a read failed.
+  /// The next path that is not empty, with a problem if it is too long or has a NUL in it. False:
+  /// the list has ended, or a read failed.
   bool next(Input& input);
 
   int error = 0;  ///< The `errno` of a read that failed.
