@@ -76,6 +76,7 @@ TEST(LargeFile, IsWalkedAsFarAsOffsetsReach) {
 
 Bytes repeated(std::size_t count, Bytes const& bytes) {
   Bytes all;
+  all.reserve(count * bytes.size());
   for (std::size_t i = 0; i < count; ++i) {
     all += bytes;
   }

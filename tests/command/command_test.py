@@ -239,7 +239,7 @@ class Endings(CommandTest):
                               preexec_fn=lambda: fcntl.ioctl(0, termios.TIOCSCTTY, 0)) as process:
             os.close(side)
             self.assertEqual(os.read(main, 99), b"1\r\n")
-            time.sleep(0.3)
+            time.sleep(0.1)
             os.write(main, b"\x03")
             self.assertEqual(process.wait(60), -signal.SIGINT)
             self.assertEqual(os.read(main, 99), b"^C")
@@ -256,20 +256,24 @@ class Endings(CommandTest):
             names = piped.communicate(b"a.tif\n" * 30000, 60)[0]
             self.assertEqual(names.count(b"\0"), 30000)  # its files are not counted ahead: a pipe is read once
             shown = b""
-            for megabytes in range(0, 20, 2):
+            for size in (20_000, 20_000, 20_000, 2_000_000, 2_000_000):
+                process.stdout.read(size)
+                time.sleep(0.15)
                 shown += written(main)
-                if megabytes == 6:
-                    fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
-                process.stdout.read(2000000)
-                time.sleep(0.15 if process.poll() is None else 0)
+            fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
             process.stdout.read()
             process.wait(60)  # the summary comes last
             shown += written(main)
             os.close(main)
         shown = shown.decode()
         self.assertRegex(shown, r"^\r\x1b\[K\d+ files, \d+ files/s\r")
-        self.assertRegex(shown, r"\r\x1b\[K\d+ of 20000 files, \d+ files/s, \d+ s left\r\x1b\[K")
-        self.assertRegex(shown, r"\r\x1b\[K\d{5} of 20000 files, …\r\x1b\[K")  # 23 of 24 cells
+        estimates = re.findall(r"\[K(\d+) of 20000 files, (\d+) files/s, (\d+) (s|min) left\r", shown)
+        self.assertEqual({unit for *_, unit in estimates}, {"s", "min"})
+        for files, rate, left, unit in estimates:  # both are rounded down, then a second is added
+            seconds = 60 if unit == "min" else 1
+            self.assertGreaterEqual((20000 - int(files)) / int(rate), int(left) * seconds - 1)
+            self.assertLess((20000 - int(files)) / (int(rate) + 1), (int(left) + 1) * seconds - 1)
+        self.assertRegex(shown, r"\r\x1b\[K(?=[^\r]{23}\r)\d+ of 20000 files, [^\r]*…\r\x1b\[K")  # of 24 cells
         self.assertRegex(shown, r"\r\x1b\[Kquavel: 20000 files, 20000 records, 0 without record, .* files/s\r\n$")
         seconds, rate = re.search(r"(\d+\.\d+) s, (\d+) files/s\r\n$", shown).groups()
         self.assertAlmostEqual(float(seconds) * int(rate), 20000, delta=200)
