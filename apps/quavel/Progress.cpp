@@ -18,7 +18,7 @@ namespace {
 
 constexpr auto kQuietStart = std::chrono::milliseconds(500);   // without a progress line
 constexpr auto kInterval = std::chrono::milliseconds(100);     // between updates of the line
-constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // then counting files rests
+constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // of `countTotal`, before a rest
 constexpr int kRestFactor = 4;  // a rest is this many times as long as the spell before it
 
 double secondsSince(std::chrono::steady_clock::time_point start) {
@@ -59,7 +59,7 @@ Progress::~Progress() {
     std::lock_guard<std::mutex> const lock(mutex_);
     isEnding_ = true;
   }
-  hasEnded_.notify_all();
+  endSignal_.notify_all();
   if (counter_.joinable()) {
     counter_.join();
   }
@@ -71,30 +71,30 @@ void Progress::tick() {
     return;
   }
   if (nextTick_ == start_ + kQuietStart) {  // the first update
-    startCountingAhead();
+    startCountingTotal();
   }
   nextTick_ = now + kInterval;
   console_.showProgress(line(secondsSince(start_)));
 }
 
-void Progress::startCountingAhead() {
+void Progress::startCountingTotal() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::BlockSignals const block;
+  interrupt::BlockSignals const block;  // for the new thread
   try {
     counter_ = std::thread([this] {
       try {
-        countAhead();
+        countTotal();
       } catch (std::exception const&) {  // the total stays unknown
       }
     });
-  } catch (std::system_error const&) {  // likewise
+  } catch (std::system_error const&) {  // no thread: the total stays unknown too
   }
 }
 
-void Progress::countAhead() {
-  Source source(options_.inputs, [](auto&&...) {});  // the run itself reports what is skipped
+void Progress::countTotal() {
+  Source source(options_.inputs, [](auto&&...) {});  // silent: the run itself makes the remarks
   Input input;
   std::size_t count = 0;
   auto spellStart = Clock::now();
@@ -104,7 +104,7 @@ void Progress::countAhead() {
     auto const spell = Clock::now() - spellStart;
     if (spell >= kCountingSpell) {
       std::unique_lock<std::mutex> lock(mutex_);
-      if (hasEnded_.wait_for(lock, kRestFactor * spell, [this] { return isEnding_; })) {
+      if (endSignal_.wait_for(lock, kRestFactor * spell, [this] { return isEnding_; })) {
         return;
       }
       spellStart = Clock::now();
@@ -116,7 +116,7 @@ void Progress::countAhead() {
 std::string Progress::line(double seconds) const {
   std::size_t const files = records_ + failures_;
   std::size_t const total = total_;
-  bool const isTotalKnown = total > 0 && total >= files;  // files added since make it too low
+  bool const isTotalKnown = total > 0 && total >= files;  // too low if files were added since
   std::string text = std::to_string(files);
   if (isTotalKnown) {
     text += " of " + std::to_string(total);
@@ -131,8 +131,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  bool const isOutputEnough = files == 1 && (failures_ == 0 || options_.form.isExplanation());
-  if (options_.isQuiet || isOutputEnough) {
+  bool const isEachInOutput = failures_ == 0 || options_.form.isExplanation();
+  if (options_.isQuiet || (files == 1 && isEachInOutput)) {  // a single file needs no sum
     return;
   }
   double const seconds = secondsSince(start_);

@@ -17,13 +17,12 @@ class Console;
 /// Counts the files read, shows progress once the work takes long, and sums it up at the end.
 class Progress {
  public:
-  /// Both arguments must outlive it.
   Progress(Console& console, Options const& options);
   ~Progress();
 
-  void count(bool hasRecord, bool isShown) {
+  void count(bool hasRecord, bool meetsConditions) {
     ++(hasRecord ? records_ : failures_);
-    shown_ += isShown ? 1 : 0;
+    shown_ += meetsConditions ? 1 : 0;
   }
   /// Updates the progress line when it is due.
   void tick();
@@ -34,8 +33,8 @@ class Progress {
  private:
   using Clock = std::chrono::steady_clock;
 
-  void startCountingAhead();
-  void countAhead();
+  void startCountingTotal();
+  void countTotal();
   std::string line(double seconds) const;
 
   Console& console_;
@@ -46,11 +45,11 @@ class Progress {
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
   std::size_t shown_ = 0;
-  std::thread counter_;  // runs `countAhead`
+  std::thread counter_;  // runs `countTotal`
   std::mutex mutex_;     // guards `isEnding_`
-  std::condition_variable hasEnded_;
+  std::condition_variable endSignal_;
   bool isEnding_ = false;
-  std::atomic<std::size_t> total_{0};  // of all files, by `countAhead`; 0: unknown
+  std::atomic<std::size_t> total_{0};  // of all files, by `countTotal`; 0: unknown
 };
 
 }  // namespace app

@@ -23,8 +23,7 @@
 namespace {
 
 /// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. Using the stream still fails, even by way of /dev/stdin: a standard input that could
-/// be read would look like an empty list.
+/// descriptor. Reading a folder fails, while /dev/null would look like an empty list.
 void holdStandardStreams() {
   int fd = -1;
   do {  // each `open` takes the lowest free descriptor
@@ -36,7 +35,7 @@ void holdStandardStreams() {
 }
 
 int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
-  if (!parsed.status) {
+  if (!parsed.status) {  // else there is only a text to print, such as that of --help
     return app::run(parsed.options, output, console);
   }
   if (*parsed.status == app::kSuccess) {
@@ -52,7 +51,7 @@ int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Conso
 
 int main(int argc, char** argv) {
   holdStandardStreams();
-  ::signal(SIGPIPE, SIG_IGN);  // writing to a closed pipe then fails instead
+  ::signal(SIGPIPE, SIG_IGN);  // writing to a closed pipe then fails instead of ending the command
 #ifdef __GLIBC__
   // Each arena takes 64 MB of address space; one for each thread could exceed `ulimit -v`.
   ::mallopt(M_ARENA_MAX, 4);
@@ -68,7 +67,7 @@ int main(int argc, char** argv) {
     console.printMessage("the output cannot be written: " + error.code().message() +
                          "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {
-    output.giveUp();  // writes what is held, and the end of JSON
+    output.giveUp();  // writes what is held, and ends a JSON array
     console.printMessage("not enough memory; leave out --sort, or name fewer files at a time");
   } catch (std::exception const& error) {
     output.giveUp();

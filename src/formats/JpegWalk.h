@@ -6,26 +6,25 @@
 
 namespace quavel {
 
-/// What the walk over the segments has met so far. The members from `start` on are for notes only;
-/// their numbers are positions in the file, -1 where no such segment was met.
+/// What the walk over the segments has met so far.
 struct QVJPEGImage::WalkState {
   bool sawAPP1 = false;  ///< An APP1 segment, Exif or not.
   bool sawSOF0 = false;
   bool sawExif = false;
   unsigned short frameWidth = 0;   ///< The greatest that an SOF0 segment has declared.
   unsigned short frameHeight = 0;  ///< Likewise.
-  std::int64_t nextOffset = 0;     ///< Where the next segment begins, as an offset of the stream.
-  std::int64_t start = 0;          ///< Where the segment being read begins.
-  std::int64_t sof0 = -1;          ///< The first SOF0 segment, or a later one with a greater side.
-  std::int64_t sof2 = -1;          ///< The last SOF2 segment before the scan.
+  std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
+  // For notes only. The numbers are positions in the file; -1: no such segment was met.
+  std::int64_t start = 0;          ///< The segment being read.
+  std::int64_t sof0 = -1;          ///< The first SOF0 segment, or the last that raised a side.
+  std::int64_t sof2 = -1;          ///< The last SOF2 segment before `firstScan`.
   std::int64_t firstScan = -1;     ///< The first SOS segment.
-  char const* missingAtScan = "";  ///< Which segments were not met before that.
+  char const* missingAtScan = "";  ///< Which segments were not met before `firstScan`.
 };
 
 namespace detail {
 
-/// Notes that the walk ends because no marker can be read at a position, which may lie beyond the
-/// end of the data.
+/// Notes that the walk ends at a position, maybe beyond the data, where no marker can be read.
 void noteEnd(Journal* journal, std::int64_t position);
 
 /// Notes what size an Exif directory gives. The note is shown only if the record gets no size.

@@ -17,9 +17,9 @@ namespace quavel::detail::file {
 
 namespace {
 
-/// The path in UTF-16; when it is not UTF-8, empty, which names no file.
+/// A UTF-8 path in UTF-16. If it is not valid UTF-8: an empty path, which names no file.
 std::wstring widened(std::string const& path) {
-  int const size =  // with the NUL; 0: the path is not UTF-8
+  int const size =  // with the NUL; 0: not valid UTF-8
       ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, nullptr, 0);
   std::vector<wchar_t> wide(static_cast<std::size_t>(size) + 1);  // a NUL even for size 0
   ::MultiByteToWideChar(CP_UTF8, MB_ERR_INVALID_CHARS, path.c_str(), -1, wide.data(), size);
@@ -30,9 +30,12 @@ std::wstring widened(std::string const& path) {
 /// the prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
-  std::vector<wchar_t> whole(std::size_t{size} + 1);  // too small if the current folder changes now
-  if (size < MAX_PATH || ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
+  if (size < MAX_PATH) {
     return path;
+  }
+  std::vector<wchar_t> whole(size);
+  if (::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
+    return path;  // the current folder has changed meanwhile, and `whole` is too small
   }
   std::wstring const full = whole.data();
   if (full.compare(0, 4, L"\\\\?\\") == 0) {

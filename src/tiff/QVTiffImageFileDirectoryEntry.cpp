@@ -22,9 +22,9 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   }
   std::array<std::uint8_t, kEntryFieldSize> field;
   entry.field = field.data();
-  entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));  // without any padding
+  entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // If the data ends within up to 4 bytes, they are stored all the same; an offset is not.
+    // Up to 4 bytes are stored even if the data ends among them; an offset must be whole.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, bytesOrOffsetOf(entry, needsReversal(*stream)), *this);
     }

@@ -16,8 +16,7 @@ namespace {
 constexpr std::size_t kReadSize = std::size_t{1} << 16;
 constexpr std::size_t kMaxPathLength = 4096;  // Linux's PATH_MAX
 
-/// Tries to read 0 bytes, so that a list that cannot be read, such as a folder, is reported before
-/// anything is written. Returns the `errno`, or 0 if the list can be read.
+/// The `errno` with which reading fails, as it does for a folder; else 0.
 int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input inputFor(std::string const& path) {
@@ -64,9 +63,9 @@ bool PathList::isReady() {
 bool PathList::next(Input& input) {
   std::string path;
   while (path.empty() && (start_ < buffer_.size() || refill())) {
-    auto const end = buffer_.find(separator_, start_);
-    if (end == std::string::npos && refill()) {
-      continue;  // the path goes on in what was just read
+    auto end = buffer_.find(separator_, start_);
+    while (end == std::string::npos && refill()) {
+      end = buffer_.find(separator_, start_);
     }
     path = buffer_.substr(start_, end - start_);  // all the rest if the last separator is missing
     start_ = end == std::string::npos ? buffer_.size() : end + 1;

@@ -30,8 +30,8 @@ class PathList {
   int fd_;
   char separator_;
   std::string buffer_;
-  std::size_t start_ = 0;  // in `buffer_`, of what `next` has not returned yet
-  bool atEnd_ = false;     // or a read failed
+  std::size_t start_ = 0;  // of the next path in `buffer_`
+  bool atEnd_ = false;     // of the list, or a read has failed
 };
 
 }  // namespace app

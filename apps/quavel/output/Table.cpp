@@ -17,7 +17,7 @@ namespace {
 
 constexpr std::size_t kMostRows = 500;                      // in a page
 constexpr auto kPageTime = std::chrono::milliseconds(200);  // a terminal waits no longer for a page
-constexpr auto kFirstPageTime = std::chrono::milliseconds(12);  // the first seems to come at once
+constexpr auto kFirstPageTime = std::chrono::milliseconds(12);  // seems to come at once
 
 /// The folder that all paths in the column are in, with a "/" at its end; empty when there is none.
 std::string commonFolder(std::vector<rows::Row> const& rows, std::size_t column) {
@@ -26,7 +26,8 @@ std::string commonFolder(std::vector<rows::Row> const& rows, std::size_t column)
     std::string const& path = row[column];
     auto const difference = std::mismatch(folder.begin(), folder.end(), path.begin(), path.end());
     folder.erase(difference.first, folder.end());
-    folder.erase(folder.rfind('/') + 1);  // without a "/": from npos + 1, which is 0
+    auto const lastSlash = folder.rfind('/');
+    folder.resize(lastSlash == std::string::npos ? 0 : lastSlash + 1);
   }
   return folder.size() <= 2 ? "" : folder;  // such as "./": too short to save room
 }
@@ -47,7 +48,7 @@ class Table : public Writer {
   bool pageFitsLayout(std::size_t width) const;
   void writeHeader();
   Widths naturalWidths(bool mustShowEmpty = false) const;
-  rows::Row inLayout(rows::Row row) const;
+  rows::Row asShown(rows::Row row) const;
 
   Form const& form_;
   Output& output_;
@@ -55,7 +56,7 @@ class Table : public Writer {
   bool isTerminal_;
   std::size_t pathColumn_ = 0;  // columns_.size() when the path is not shown
   std::size_t files_ = 0;
-  std::atomic<bool> keepsRecords_{true};  // until the first file is added
+  std::atomic<bool> keepsRecords_{true};  // `prepare` drops them once the first file is added
   Outcome first_;  // with its record, because it becomes a card if no other file follows
   std::vector<rows::Row> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
@@ -73,7 +74,7 @@ Table::Table(Form const& form, Output& output)
       columns_(rows::columnsOf(form.fields)),
       isTerminal_(output.isTerminal()) {
   while (pathColumn_ < columns_.size() && !columns_[pathColumn_].keepsEnd) {
-    ++pathColumn_;  // only the path's column keeps its end
+    ++pathColumn_;  // when cut, only the path keeps its end
   }
 }
 
@@ -92,7 +93,7 @@ void Table::add(Outcome&& outcome) {
     keepsRecords_ = false;
   }
   auto const now = std::chrono::steady_clock::now();
-  bool const isFirstPage = natural_.empty();  // its time counts from the start of the command
+  bool const isFirstPage = natural_.empty();  // timed from the start of the command
   if (page_.empty() && !isFirstPage) {
     pageStart_ = now;
   }
@@ -131,7 +132,7 @@ void Table::writePage(bool isLast) {
     layOutUncut(isLast);
   }
   for (auto& row : page_) {
-    row = inLayout(std::move(row));
+    row = asShown(std::move(row));
     std::replace(row.begin(), row.end(), std::string(), std::string("-"));
     output_.add(lineOf(columns_, widths_, row));
   }
@@ -165,12 +166,12 @@ void Table::layOutForTerminal() {
   natural_ = naturalWidths();
   if (lineWidth(natural_) > width && pathColumn_ < columns_.size()) {
     folder_ = commonFolder(page_, pathColumn_);
-    natural_ = naturalWidths();
+    natural_ = naturalWidths();  // without the folder
   }
   widths_ = fit(columns_, natural_, width);
   auto const hidden = [](Widths const& all) { return std::count(all.begin(), all.end(), 0U); };
   bool const dropsColumns = hidden(widths_) > hidden(natural_);
-  if (dropsColumns && form_.fields.empty()) {  // without times, they may fit
+  if (dropsColumns && form_.fields.empty()) {  // the default columns may fit without times
     hasDaysOnly_ = true;
     natural_ = naturalWidths();
     widths_ = fit(columns_, natural_, width);
@@ -199,12 +200,12 @@ void Table::writeHeader() {
   output_.add(lineOf(columns_, widths_, labels));
 }
 
-/// The columns' widths if no text of the page, as `inLayout` gives it, is cut; 0: empty, hidden.
+/// The widths at which no column cuts a text of the page, `asShown`; 0 hides an empty column.
 Widths Table::naturalWidths(bool mustShowEmpty) const {
   bool const showEmpty = mustShowEmpty || form_.showAbsent.value_or(!form_.fields.empty());
   Widths natural(columns_.size(), 0);
   for (auto const& row : page_) {
-    auto const shown = inLayout(row);
+    auto const shown = asShown(row);
     for (std::size_t i = 0; i < shown.size(); ++i) {
       natural[i] = std::max(natural[i], widthOf(shown[i]));
     }
@@ -217,7 +218,7 @@ Widths Table::naturalWidths(bool mustShowEmpty) const {
   return natural;
 }
 
-rows::Row Table::inLayout(rows::Row row) const {
+rows::Row Table::asShown(rows::Row row) const {
   if (!folder_.empty()) {
     row[pathColumn_].erase(0, folder_.size());
   }
