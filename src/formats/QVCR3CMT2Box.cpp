@@ -10,24 +10,24 @@ using namespace detail;
 
 namespace {
 
-/// Stores the low 16 bits of the tag's number, whatever its type. Absent: true, the field
+/// Stores the low 16 bits of the entry's number, whatever its type. No entry: true, the field
 /// untouched. Not exactly one value: false.
 bool storeShort(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
-  bool const isRead = findNumber(directory, tag, value);
+  bool const isValid = findNumber(directory, tag, value);
   if (value != nullptr) {
     field = value->shortValue();
   }
-  return isRead;
+  return isValid;
 }
 
-/// Stores the tag's fraction. Absent: true, the field untouched. Not one value of this type: false.
+/// Stores the entry's fraction. No entry: true, field untouched. Not one value of `type`: false.
 bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
   ValuePointer value = nullptr;
-  bool const isRead = findNumber(directory, tag, value);
+  bool const isValid = findNumber(directory, tag, value);
   if (value == nullptr) {
-    return isRead;
+    return isValid;
   }
   if (value->type != type) {
     return refuseContent(
@@ -49,12 +49,12 @@ bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  auto const exifIFD = readFirstDirectory(
+  auto const mainIFD = readFirstDirectory(
       stream, "the CMT2 box",
       {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
        tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,
        tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber});
-  return exifIFD && storeInfoFromMainIFD(exifIFD);
+  return mainIFD && storeInfoFromMainIFD(mainIFD);
 }
 
 bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
@@ -69,8 +69,8 @@ bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory
          storeFraction(ifd, tag::FNumber, EntryValueType::RATIONAL, fNumber);
 }
 
-// APEX values are base-2 logarithms (Exif, annex C): the f-number is 2^(Av/2), the exposure time is
-// 2^-Tv seconds. Of an absent value, which is NaN, the result is NaN too.
+// APEX values are base-2 logarithms (Exif, annex C): the f-number is 2^(ApertureValue/2), the
+// exposure time is 2^-ShutterSpeedValue seconds. An absent value is NaN, and so is the result.
 
 bool QVCR3CMT2Box::storeAperture(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   if (!storeFraction(ifd, tag::ApertureValue, EntryValueType::RATIONAL, apertureValue)) {

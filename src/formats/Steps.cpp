@@ -8,8 +8,7 @@ namespace {
 
 constexpr unsigned short kTiffMagic = 42;
 
-// Marks a number in the record as absent. One that the file gives as -1 counts as absent too.
-constexpr std::int32_t kAbsentNumber = -1;
+constexpr std::int32_t kAbsentNumber = -1;  // in the record; a -1 in the file counts as absent too
 
 }  // namespace
 
@@ -101,7 +100,7 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
                "no {} in {}", TagName{tag::ExifIFDPointer}, placed(mainIFD));
     return true;
   }
-  // A host's class may override `storeInfoFromExifIFD` and keep any part of the directory.
+  // An override of `storeInfoFromExifIFD` in a host's class needs the directory's public `entries`.
   if (!readingOf(*stream).isOwnRecord) {
     exifIFD = static_cast<ReaderDirectory&>(*exifIFD).forHost();
   }
@@ -131,8 +130,7 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   }
 }
 
-// The next two functions are called only for a tag that has an entry. If they find no row for it,
-// the directory is a host's, of which no notes are kept.
+// In the next two functions, `row` is null only for a host's directory, of which notes say nothing.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
   auto const* const own = ReaderDirectory::of(*directory);
@@ -149,7 +147,7 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  bool const isUndefined = row->typeCode == kUndefinedCode;  // never refused as a text
+  bool const isUndefined = row->typeCode == kUndefinedCode;  // `storeText` never refuses it
   return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
                 PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},

@@ -11,24 +11,23 @@
 #include "tiff/ReaderDirectory.h"
 #include "tiff/WantedTags.h"
 
-// Steps that the readers of several formats share. A step that fails has told the journal why. What
-// an absent entry means differs between formats, so each reader decides that.
+// Steps that the readers of several formats share. A step that fails has told the journal why.
 namespace quavel::detail {
 
-/// Finds the only value of a tag's entry. Absent: true and null. Not exactly one value: false.
+/// Finds the only value of a tag's entry. No entry: true, null `value`. Not exactly one: false.
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value);
 
-/// Stores the tag's number. Absent: true, the field untouched. Not exactly one value: false.
+/// Stores the entry's number. No entry: true, the field untouched. Not exactly one value: false.
 bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field);
 
-/// The same for a number that must be present. Absent: false, and the note ends with `rule`.
+/// The same for a number that must be present. No entry: false, and the refusal states the `rule`.
 bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field);
 
-/// Stores the tag's text. Absent: true, the field untouched. Not all ASCII: false.
+/// Stores the entry's text. No entry: true, the field untouched. A value not of type ASCII: false.
 bool storeText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
 
-/// Reads the directory at an offset from the TIFF header; null on failure.
+/// Reads the directory at `offset`, counted from the TIFF header's start; null on failure.
 DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName const& name,
                                  std::uint32_t offset, TagList tags);
 
@@ -37,14 +36,14 @@ DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName con
 DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
                                     TagList tags);
 
-/// Reads the directory whose offset is in the entry with the tag `pointer`. Absent: true, `result`
-/// is null. Not exactly one value, or the directory cannot be read: false.
+/// Reads the directory whose offset is in the entry with the tag `pointer`. No entry: true,
+/// `result` is null. Not exactly one value, or the directory cannot be read: false.
 bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& directory,
                    unsigned short pointer, char const* name, TagList tags,
                    DirectoryPointer& result);
 
 /// Follows ExifIFDPointer and gives the Exif directory to the record's `storeInfoFromExifIFD`.
-/// Absent: true, `exifIFD` is null. The directory cannot be read or stored: false.
+/// No entry: true, `exifIFD` is null. The directory cannot be read or stored: false.
 bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
                  DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD);
 
@@ -53,10 +52,10 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
 bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainIFD,
                 std::uint32_t index, TagList tags, DirectoryPointer& rawIFD);
 
-/// Notes that the tag's field stays absent because there is no entry for it.
+/// Notes that the record's field for this tag stays absent: the tag has no entry.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// Notes that the tag's field stays absent because the entry's value is no use, as `pattern` says.
+/// The same when the entry's value is no use. `pattern` says so of the entry, its count and type.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
 /// Refuses the tag's entry, which must exist: it does not hold what is `wanted`. Returns false.
@@ -65,18 +64,18 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
 /// Whether NewSubfileType's bit 0 marks a reduced-resolution version of another image.
 inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileType & 1U) != 0; }
 
-/// Stores the image size from a directory that must describe a full-size image. False: a side or
-/// NewSubfileType is absent or not exactly one value, or the image is a reduced one.
+/// Stores the image size from a directory that must describe a full-size image. False: width,
+/// height or NewSubfileType is absent or not exactly one value, or the image is a reduced one.
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory as notes name it. For a host's there is no table, but no note either.
+/// A directory as notes name it. One made by a host has no table, but no note names it either.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};
 }
 
-/// Where a directory begins in the file; -1 for a host's.
+/// Where a directory begins in the file; -1 for one made by a host.
 inline std::int64_t positionOf(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return own == nullptr ? -1 : own->table.position();

@@ -41,7 +41,7 @@ std::int32_t quotient(SRational const& fraction) {
   if (fraction.denominator == 0) {
     return 0;
   }
-  // INT32_MIN / -1 does not fit 32 bits: computed in 64, it is truncated to INT32_MIN.
+  // INT32_MIN / -1 does not fit 32 bits: computed in 64, it wraps to INT32_MIN.
   return static_cast<std::int32_t>(std::int64_t{fraction.numerator} / fraction.denominator);
 }
 
@@ -131,8 +131,8 @@ Float toFloat(EntryValue const& value) {
   });
 }
 
-/// For all integer accessors but `longValue`, where floats saturate at the limits of uint32.
-std::uint32_t signedBits(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
+/// What all integer accessors but `longValue` start from: floats saturate at the limits of int32.
+std::uint32_t int32Bits(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace
 
@@ -161,23 +161,23 @@ unsigned int QVTiffImageFileDirectoryEntryValue::sizeOfValueOfType(EntryValueTyp
 }
 
 char QVTiffImageFileDirectoryEntryValue::charValue() const {
-  return static_cast<char>(signedBits(*this));
+  return static_cast<char>(int32Bits(*this));
 }
 
 std::uint8_t QVTiffImageFileDirectoryEntryValue::byteValue() const {
-  return static_cast<std::uint8_t>(signedBits(*this));
+  return static_cast<std::uint8_t>(int32Bits(*this));
 }
 
 std::int8_t QVTiffImageFileDirectoryEntryValue::sbyteValue() const {
-  return static_cast<std::int8_t>(signedBits(*this));
+  return static_cast<std::int8_t>(int32Bits(*this));
 }
 
 std::uint16_t QVTiffImageFileDirectoryEntryValue::shortValue() const {
-  return static_cast<std::uint16_t>(signedBits(*this));
+  return static_cast<std::uint16_t>(int32Bits(*this));
 }
 
 std::int16_t QVTiffImageFileDirectoryEntryValue::sshortValue() const {
-  return static_cast<std::int16_t>(signedBits(*this));
+  return static_cast<std::int16_t>(int32Bits(*this));
 }
 
 std::uint32_t QVTiffImageFileDirectoryEntryValue::longValue() const {
@@ -185,7 +185,7 @@ std::uint32_t QVTiffImageFileDirectoryEntryValue::longValue() const {
 }
 
 std::int32_t QVTiffImageFileDirectoryEntryValue::slongValue() const {
-  return static_cast<std::int32_t>(signedBits(*this));
+  return static_cast<std::int32_t>(int32Bits(*this));
 }
 
 float QVTiffImageFileDirectoryEntryValue::floatValue() const { return toFloat<float>(*this); }

@@ -14,13 +14,13 @@ struct TagName {
   unsigned short number;
 };
 
-/// A number of values: "2 SHORT values". The type must be known.
+/// A number of values: "2 SHORT values". The code must stand for a field type.
 struct TypedCount {
   std::uint32_t count;
   std::uint16_t typeCode;
 };
 
-/// For `PartName::structure`: the TIFF structure is the whole file, so notes do not name it.
+/// Stands for the name of a TIFF structure that is the whole file: notes do not name it.
 inline constexpr char const* kWholeFile = nullptr;
 
 /// The name of a directory or a header in a TIFF structure: "IFD0 of the Exif segment".
@@ -35,7 +35,7 @@ void append(std::string& out, TagName tag);
 void append(std::string& out, TypedCount values);
 void append(std::string& out, PartName const& part);
 
-/// The record's field that is filled from the tag's entry; null for none.
+/// The name of the record's field that is filled from the tag's entry; null for none.
 char const* fieldOf(unsigned short tag);
 
 }  // namespace quavel::detail

@@ -16,7 +16,7 @@ namespace app {
 
 namespace {
 
-/// Writes all bytes, unless an interrupt comes before any of them has been written.
+/// Writes all bytes, or ends the process if an interrupt comes while the first byte waits.
 void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -57,8 +57,8 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes a write of up to PIPE_BUF bytes whole or not at all, so an interrupt cuts no piece
-  // while the pipe's reader keeps us waiting. A regular file never does, so it gets all at once.
+  // A pipe takes a write of up to PIPE_BUF bytes whole or not at all, so an interrupt while a pipe
+  // is full cuts no piece. Writing to a regular file never waits, so a file gets all at once.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
@@ -84,9 +84,9 @@ void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
   if (char const* const tail = std::exchange(tail_, nullptr)) {
-    writeWhole(tail);  // if an interrupt comes before any of it is written, the interrupt writes it
+    writeWhole(tail);
   }
-  interrupt::setTail(nullptr);
+  interrupt::setTail(nullptr);  // not earlier: an interrupt that ends `writeWhole` writes the tail
 }
 
 void Output::giveUp() noexcept {

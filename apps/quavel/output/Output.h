@@ -21,9 +21,9 @@ class Output {
   void add(std::string_view piece);
   /// Writes what is held. Throws OutputClosed, or std::system_error for any other failure.
   void flush();
-  /// Writes the head now, the tail at `finish` or on an interrupt. The tail is not copied.
+  /// Writes a head like "[" now, the tail at `finish` or on an interrupt. The tail is not copied.
   void enclose(std::string_view head, char const* tail);
-  /// Flushes, and writes the tail unless that has been done.
+  /// Flushes, and writes the tail unless an earlier call has.
   void finish();
   /// Tries to finish after a failure; throws nothing.
   void giveUp() noexcept;

@@ -22,7 +22,7 @@ std::string decimal(float value, int digits) {
   std::string result = text;
   if (result.find('.') != std::string::npos) {
     result.erase(result.find_last_not_of('0') + 1);
-    result.erase(result.find_last_not_of('.') + 1);
+    result.erase(result.find_last_not_of('.') + 1);  // the dot, if it is last now
   }
   return result == "-0" ? "0" : result;
 }
@@ -71,15 +71,16 @@ std::string whiteBalance(std::int32_t value) {
 }
 
 std::string exposureTime(float seconds) {
-  bool const isTiny = seconds <= 1e-6F;  // 1/N would be a long number; also 0 or less
-  // As on cameras: a fraction up to 1/4 s, decimals from 0.3 s on.
-  if (!isTiny && seconds < 0.26F) {
-    return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";
+  if (seconds <= 1e-6F) {  // 0, negative, or so short that the N of 1/N would be long
+    return decimal(seconds, 9) + " s";
   }
-  return decimal(seconds, isTiny ? 9 : 1) + " s";
+  if (seconds < 0.26F) {  // as on cameras: a fraction up to 1/4 s, decimals from 0.3 s on
+    return "1/" + decimal(1 / seconds, seconds > 0.1F ? 1 : 0) + " s";  // "1/7.5 s", "1/80 s"
+  }
+  return decimal(seconds, 1) + " s";
 }
 
-std::string fNumber(float value) { return "f/" + decimal(value, value < 1 ? 2 : 1); }
+std::string fNumber(float value) { return "f/" + decimal(value, value < 1 ? 2 : 1); }  // "f/0.95"
 
 std::string apex(float value) { return decimal(value, 2) + " APEX"; }
 
@@ -103,7 +104,8 @@ std::string exposure(quavel::QVMetadata const& record) {
       std::isnan(record.focalLength) ? "" : focalLength(record.focalLength)};
   std::string text;
   for (auto const& part : parts) {
-    text.append(text.empty() || part.empty() ? "" : " ").append(part);
+    bool const needsSpace = !text.empty() && !part.empty();
+    text.append(needsSpace ? " " : "").append(part);
   }
   return text;
 }
