@@ -25,15 +25,15 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
-  // From the last box, `leaveBox` may have gone to an offset at which no read may start.
+  // From the last box, `leaveBox` may have gone short of its end, to where no read may start.
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
-    std::int64_t const wanted = std::max(std::int64_t{start}, context.lastEnd);
-    return refuseCut(journal, wrappingSum(stream->baseOffset, wanted), box::kHeaderSize,
+    std::int64_t const nextBox = std::max(std::int64_t{start}, context.lastEnd);
+    return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
                      "the header of the next box{}", context);
   }
-  // A smaller size would leave the walk where it is, or inside this header. The standard gives 0
-  // and 1 a meaning, but no metadata follows such a box.
+  // A size below the header's would lead the walk back to this box, or into its header. The
+  // standard gives 0 and 1 a meaning, but no metadata follows such a box.
   if (header.boxSize < box::kHeaderSize) {
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",

@@ -28,7 +28,7 @@ void append(std::string& out, PlacedBox box);
 struct BoxContext {
   char const* text = "";
   PlacedBox parent = {};     ///< Appended to the text; type 0: there is none.
-  std::int64_t lastEnd = 0;  ///< Where the last box ends, even if the stream cannot go there.
+  std::int64_t lastEnd = 0;  ///< The offset where the last box ends; perhaps out of reach.
 };
 void append(std::string& out, BoxContext context);
 
@@ -39,8 +39,7 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box, or to `kOutOfReach` if no offset reaches the end. The boxes around it
-/// end further on still, so the walks over them look for another box there and are refused.
+/// Moves to the end of a box, or to `kOutOfReach`, where no read succeeds, if that comes first.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

@@ -33,7 +33,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
                   {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength}, rawIFD)) {
     return false;
   }
-  return !rawIFD || storeInfoFromSubIFD0(rawIFD);
+  return !rawIFD || storeInfoFromSubIFD0(rawIFD);  // without a raw IFD, the record has no size
 }
 
 bool QVARWImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

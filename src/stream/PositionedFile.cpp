@@ -14,7 +14,7 @@ namespace {
 
 // Most photos take one to four reads; a walk through the image data takes dozens.
 constexpr int kReadsOfAWalk = 16;
-constexpr std::int64_t kAdvisedSize = std::int64_t{4} << 20;  // bytes to fetch at a time
+constexpr std::int64_t kFetchSize = std::int64_t{4} << 20;  // bytes to fetch at a time
 
 // The first block holds all metadata of most files; later ones are read for a single directory or
 // segment each. docs/speed.md shows how both sizes were measured.
@@ -22,10 +22,10 @@ constexpr std::size_t kFirstBlockSize = 16384;
 constexpr std::size_t kNextBlockSize = 2048;
 
 // Advice against reading ahead keeps the system from fetching several times too much. It costs a
-// call and helps only with uncached files: it is given while reads are as slow as from a disk.
+// call and helps only with uncached files: the first file gets it, and those after a slow read.
 constexpr auto kSlowRead = std::chrono::microseconds(40);  // a cached block takes about 3
 constexpr int kFilesAfterSlowRead = 64;
-std::atomic<int> filesToAdvise{1};  // the first file may come from a disk; lost updates do no harm
+std::atomic<int> filesToAdvise{1};  // how many more get the advice; lost updates do no harm
 
 /// A file and the stream that reads it ahead, in one allocation.
 struct ReadAheadFile {
@@ -56,9 +56,9 @@ std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t co
 }
 
 std::int64_t PositionedFile::readFurther(std::uint8_t* destination, std::size_t count) {
-  if (reads_ >= kReadsOfAWalk && position_ >= advisedEnd_) {
-    file::expectReads(fd, position_, kAdvisedSize);
-    advisedEnd_ = position_ + kAdvisedSize;
+  if (reads_ >= kReadsOfAWalk && position_ >= fetchEnd_) {
+    file::expectReads(fd, position_, kFetchSize);
+    fetchEnd_ = position_ + kFetchSize;
   }
   return file::readAt(fd, destination, count, position_);
 }
@@ -98,7 +98,7 @@ long PositionedFile::getOffset() {
 
 void PositionedFile::setOffset(long const& offset) {
   std::int64_t const target = wrappingSum(baseOffset, offset);
-  bool const isAccepted =  // the file system is asked only where its limit may matter
+  bool const isAccepted =  // the seek only asks the file system for its limit: no read needs it
       target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
   if (isAccepted) {
     position_ = target;

@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// Every file system accepts a seek to any position up to this; what lies beyond depends on it.
+/// Every file system accepts a seek to any position up to this; some refuse higher ones.
 inline constexpr std::int64_t kSurelyAccepted = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read states its position, so that a seek needs no system
@@ -28,9 +28,9 @@ class PositionedFile : public QVFStream {
   std::int64_t readFurther(std::uint8_t* destination, std::size_t count);
   std::int64_t readPipe(std::uint8_t* destination, std::size_t count);
 
-  std::int64_t position_ = 0;      // absolute
+  std::int64_t position_ = 0;      // in the file, whatever `baseOffset` is
   std::int64_t pipePosition_ = 0;  // how much of a pipe has been read
-  std::int64_t advisedEnd_ = 0;    // of the range that the system was advised to fetch
+  std::int64_t fetchEnd_ = 0;      // of the range that the system was advised to fetch
   int reads_ = 0;                  // calls of `readBuffer`
 };
 

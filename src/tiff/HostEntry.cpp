@@ -18,7 +18,7 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
 }
 
 std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed) {
-  if (entry.count > kEntryFieldSize) {
+  if (entry.count > kEntryFieldSize) {  // each value of an UNDEFINED entry is one byte
     return valueOffset(entry, isReversed);
   }
   std::uint32_t bytes = 0;

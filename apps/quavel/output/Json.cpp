@@ -1,4 +1,3 @@
-#include <algorithm>
 #include <cmath>
 #include <nlohmann/json.hpp>
 
@@ -89,9 +88,9 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // A path that is not valid UTF-8 comes with its pathBytes; other paths have none.
-  bool const addsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, addsPathBytes, ofRecord = membersOf(fields),
+  // Where there is a path, its pathBytes follow; only a path that is not valid UTF-8 has any.
+  bool const recordLacksPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
+  return [&form, isForTerminal, recordLacksPathBytes, ofRecord = membersOf(fields),
           ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
                                  fieldNamed("position")}),
           pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
@@ -99,12 +98,11 @@ TextOf jsonObjects(Form const& form, bool isForTerminal) {
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
     appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome,
                   form.showAbsent.value_or(true), isForTerminal);
-    if (addsPathBytes || !outcome.record) {
+    if (!outcome.record || recordLacksPathBytes) {
       appendMembers(object, pathBytes, outcome, /*showAbsent=*/false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
-    object.resize(std::max<std::size_t>(object.size(), 1));  // it may have no members
-    object.front() = '{';                                    // in place of the first comma
+    object.replace(0, 1, "{");  // in place of the first comma, if there are members
     object += form.kind == FormKind::Jsonl ? "}\n" : "}";
     return object;
   };

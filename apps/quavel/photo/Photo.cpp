@@ -23,7 +23,7 @@ constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
 Problem irregular(mode_t mode) {
-  if (S_ISDIR(mode)) {  // named in a list of paths: a folder among the arguments is walked
+  if (S_ISDIR(mode)) {  // from a list of paths (a folder given as an argument is walked)
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
   char const* const socketOrDevice = S_ISSOCK(mode) ? "socket" : "device";
@@ -32,7 +32,7 @@ Problem irregular(mode_t mode) {
           std::string("a ") + kind + ", not a regular file; give a photo, or use --stdin"};
 }
 
-/// Why the path must not be given to the library; no problem if it may.
+/// Why the path must not be given to the library; empty if it may.
 Problem whyUnfit(std::string const& path) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
@@ -77,7 +77,7 @@ bool isDate(std::string const& text) {
   return isWhole && hasOneBlank && isReal;
 }
 
-/// Calls `read` to fill the outcome, unless it has a problem. `read` itself may set a problem.
+/// Fills the outcome by calling `read`, unless there is a problem already. `read` may set one.
 template <class Read>
 void fill(Outcome& outcome, Detail detail, Read read) {
   if (outcome.problem) {
@@ -112,7 +112,7 @@ std::string extensionOf(std::string_view path) {
 
 bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");  // reads no file; is only asked for formats
-  // For a known extension, the library makes a record: too expensive for each name in a folder.
+  // `createMetadata` makes a whole record: too expensive for each name in a folder.
   thread_local std::unordered_set<std::string> known;
   if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
     known.insert(extension);
@@ -133,7 +133,7 @@ Outcome readPhoto(Input input, Detail detail) {
   Outcome outcome;
   outcome.path = std::move(input.path);
   outcome.problem = std::move(input.problem);
-  if (!input.isPhoto && !outcome.problem) {
+  if (!input.isPhoto && !outcome.problem) {  // not yet known to be a regular file
     outcome.problem = whyUnfit(outcome.path);
   }
   fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });

@@ -29,7 +29,7 @@ void Console::printFileMessage(std::string const& path, std::string const& probl
 void Console::showProgress(std::string const& line) {
   isProgressShown_ = true;
   interrupt::setProgressShown(true);  // first, so that an interrupt erases a half-written line too
-  // Some terminals go to the next line once the last cell is written, so it stays free.
+  // Some terminals go to the next line once the last cell is written, so that cell stays free.
   interrupt::write(STDERR_FILENO,
                    interrupt::kEraseLine + keepStart(line, terminalWidth(STDERR_FILENO) - 1));
 }

@@ -39,7 +39,7 @@ std::size_t cellsOf(Character const& character) {
     case UTF8PROC_BOUNDCLASS_T:
       return 0;  // the later letters of a Hangul syllable, within the cells of the first
     case UTF8PROC_BOUNDCLASS_PREPEND:
-      return 1;  // the Arabic signs that enclose a number have a charwidth of 0
+      return 1;  // the Arabic signs that enclose a number: visible, but their charwidth is 0
     default:
       // Spacing marks too have a charwidth of 0, although they stand beside their letter.
       return property->category == UTF8PROC_CATEGORY_MC ? 1 : property->charwidth;
@@ -90,13 +90,14 @@ bool isPlain(std::string_view text) {
   // subtracted, and 0x7f when 1 is added. Printable bytes never get it, and never borrow or carry.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
-  std::uint64_t word = kSpaces;
+  std::uint64_t word = 0;
   std::uint64_t found = 0;
   for (; text.size() >= sizeof word; text.remove_prefix(sizeof word)) {
     std::memcpy(&word, text.data(), sizeof word);
     found |= word | (word - kSpaces) | (word + kOnes);
   }
-  for (char const c : text) {  // fewer than eight; the other bytes are spaces or already seen
+  word = kSpaces;
+  for (char const c : text) {  // fewer than eight: spaces stay before them
     word = (word << 8U) | static_cast<unsigned char>(c);
   }
   found |= word | (word - kSpaces) | (word + kOnes);
@@ -162,17 +163,17 @@ std::string keepStart(std::string const& text, std::size_t width, std::size_t ma
   if (text.size() <= maxBytes && widthOf(text) <= width) {
     return text;
   }
-  std::size_t kept = 0;
-  std::size_t used = 0;
+  std::size_t keptBytes = 0;
+  std::size_t cells = 0;
   for (std::string_view rest = text; !rest.empty();) {
     Character const next = takeCharacter(rest);
-    used += cellsOf(next);
-    if (used >= width || kept + next.bytes.size() > maxBytes) {  // the last cell is for the "…"
+    cells += cellsOf(next);
+    if (cells >= width || keptBytes + next.bytes.size() > maxBytes) {  // the "…" needs a cell
       break;
     }
-    kept += next.bytes.size();
+    keptBytes += next.bytes.size();
   }
-  return width == 0 ? "" : text.substr(0, kept).append(kEllipsis);
+  return width == 0 ? "" : text.substr(0, keptBytes).append(kEllipsis);
 }
 
 std::string keepEnd(std::string const& text, std::size_t width) {
@@ -181,12 +182,14 @@ std::string keepEnd(std::string const& text, std::size_t width) {
     return text;
   }
   std::string_view kept = text;
-  for (std::string_view rest = text; !rest.empty(); kept = rest) {
+  while (!kept.empty()) {
+    std::string_view rest = kept;
     std::size_t const firstCells = cellsOf(takeCharacter(rest));
-    if (keptCells < width && firstCells > 0) {  // a mark of no cells would attach to the "…"
+    if (keptCells < width && firstCells > 0) {  // the "…" needs a cell, and no mark upon it
       break;
     }
     keptCells -= firstCells;
+    kept = rest;
   }
   return width == 0 ? "" : std::string(kEllipsis).append(kept);
 }
