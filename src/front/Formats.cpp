@@ -24,8 +24,8 @@ namespace quavel::detail {
 
 namespace {
 
-/// Memory for a record of any class. The classes add no members to QVMetadata, so that one type is
-/// enough, and the library has one type of `shared_ptr` control block instead of ten.
+/// Memory for a record of any class, as none adds members to QVMetadata. One storage type keeps
+/// the library small: `make_shared` is compiled once instead of ten times.
 struct RecordStorage {
   RecordStorage() {}  // with `= default`, `make_shared` would set the bytes to zero
   ~RecordStorage() { record->~QVMetadata(); }
@@ -67,7 +67,7 @@ void refuseExtension(Journal* journal, std::string const& extension) {
     return;
   }
   auto const* const bytes = reinterpret_cast<std::uint8_t const*>(extension.data());
-  // At most 100 bytes, so that the known ones fit into the note too.
+  // At most 100 bytes of it, so that the known extensions fit into the note too.
   QuotedBytes const quoted = {bytes, std::min<std::size_t>(extension.size(), 100)};
   refuse(journal, QVReason::UnknownExtension, -1,
          "the extension \"{}\" names no format; these do: {}", quoted, known);
@@ -95,7 +95,7 @@ std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) 
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
   auto stream = openReadAhead(path, journal == nullptr ? nullptr : &journal->fd);
   if (journal != nullptr && journal->fd == -1) {
-    // The reader below will refuse the empty stream too, but only the first refusal counts.
+    // `readStream` will refuse the empty stream too, but only the first refusal counts.
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));

@@ -32,7 +32,7 @@ std::string extensionOf(std::string const& path);
 /// The format of an extension in lower case, or null.
 Format const* formatOf(std::string_view extension);
 
-/// Notes, for each field that the record lacks, why it is absent.
+/// Adds a note for each field that the record lacks: why it is absent.
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
 /// If the refused file, which begins at `start`, looks like another format: notes which one, and

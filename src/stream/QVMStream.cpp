@@ -12,7 +12,7 @@ QVMStream::QVMStream(unsigned char* bytes, unsigned long const& count)
 std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count) {
   auto const delivered = static_cast<std::size_t>(std::min<std::uint64_t>(count, length - offset));
   if (delivered == 0) {
-    return 0;  // before `buffer` is used, which may be null
+    return 0;  // `buffer` may be null, which `copyBytes` must not get
   }
   detail::copyBytes(destination, buffer + offset, delivered);
   offset += delivered;
@@ -20,13 +20,13 @@ std::int64_t QVMStream::readBuffer(std::uint8_t* destination, std::size_t count)
 }
 
 long QVMStream::getOffset() {
-  return static_cast<long>(offset - static_cast<std::uint64_t>(baseOffset));
+  return static_cast<long>(
+      detail::wrappingDifference(static_cast<std::int64_t>(offset), baseOffset));
 }
 
 void QVMStream::setOffset(long const& newOffset) {
   // As an unsigned number, a target before the start is larger than any length.
-  std::uint64_t const target =
-      static_cast<std::uint64_t>(baseOffset) + static_cast<std::uint64_t>(newOffset);
+  auto const target = static_cast<std::uint64_t>(detail::wrappingSum(baseOffset, newOffset));
   offset = std::min(target, length);
 }
 

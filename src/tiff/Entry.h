@@ -16,7 +16,7 @@ namespace detail {
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
 /// A view of the values of an entry in a reader's own directory or in a host's. The values must
-/// outlive it. As a bool: whether there is such an entry.
+/// outlive it. As a bool: false when no entry was found.
 class Entry {
  public:
   Entry() = default;
@@ -34,7 +34,7 @@ class Entry {
 
  private:
   bool exists_ = false;
-  ValuePointer values_ = nullptr;  // the first value, in a reader's directory
+  ValuePointer values_ = nullptr;  // the values in a reader's own directory
   std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // in a host's
   std::size_t size_ = 0;
 };

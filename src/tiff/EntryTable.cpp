@@ -13,7 +13,7 @@ namespace quavel::detail {
 
 namespace {
 
-// At 9 bytes each, just below 1 KB: enough for most directories, and fast to allocate.
+// Enough for most directories. At 9 bytes each just below 1 KB, up to which allocators are fast.
 constexpr std::size_t kReservedValues = 112;
 
 // A damaged directory may declare 65535 entries: what is reserved for them has a bound.
@@ -47,7 +47,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   values_.reserve(kReservedValues);
   EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
   for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
-    if (!walk.hasTag()) {
+    if (!walk.bufferEntry()) {
       return refuseCut(journal_, walk.position(), kEntryTagSize, "entry {} of {} of {}",
                        walk.number(), entryCount_, PlacedDirectory{this});
     }
@@ -56,9 +56,9 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // This seek is for a stream that ignores the one to the values, in `readValues`: it then reads
-    // them from here, and not from wherever the walk's own reading ahead has left it.
-    if (!seek(stream, walk.nextOffset()) || !walk.readRest(&entry)) {
+    // If the stream ignores the later seek to the values, they are read from where it stands. That
+    // must be after this entry, not where the walk's reading ahead has ended.
+    if (!seek(stream, walk.nextOffset()) || !walk.parseRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
                        PlacedEntry{*this, tag, walk.position()});
@@ -68,8 +68,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     }
   }
 
-  // Reading the values may have moved the stream anywhere. Only beyond all offsets does this fail.
-  if (!seek(stream, walk.end())) {
+  // Reading values may have moved the stream. The seek fails only beyond all offsets.
+  if (!seek(stream, walk.endOffset())) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }
   return reading.spend(Work::Entries, walk.passed());

@@ -22,8 +22,7 @@ namespace detail {
 
 class Journal;
 
-/// The wanted entries of a directory, with all their values in one array. A host gets a map that is
-/// made from the table, and may keep any entry and any value of that map.
+/// The wanted entries of a directory, with all their values in one array.
 class EntryTable {
  public:
   struct Row {
@@ -31,7 +30,7 @@ class EntryTable {
     std::uint16_t typeCode;
     std::uint32_t count;
     std::int64_t position;        ///< Of the entry, in the file.
-    std::uint32_t bytesOrOffset;  ///< Of an UNDEFINED entry: see `bytesOrOffsetOf`.
+    std::uint32_t bytesOrOffset;  ///< Of an UNDEFINED entry: up to 4 bytes, or the offset of more.
     std::uint32_t firstValue;     ///< The index of its first value in the array.
 
     std::uint32_t valueCount() const { return typeCode == kUndefinedCode ? 0 : count; }
@@ -61,7 +60,7 @@ class EntryTable {
   }
 
   using Map = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
-  /// Moves the values out: the table has none afterwards.
+  /// The entries, for a host to keep. Moves the values out: the table has none afterwards.
   std::shared_ptr<Map> takeEntries();
 
   PartName const& name() const { return name_; }
@@ -91,8 +90,8 @@ using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// What a row keeps of an UNDEFINED entry. Of up to 4 bytes: the bytes as in the file, with zeros
-/// for those that lie beyond the end of the data. Of more: their offset.
+/// What a row keeps of an UNDEFINED entry. If it has up to 4 bytes: the bytes as in the file, with
+/// zeros for those beyond the end of the data. If it has more: their offset.
 std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed);
 
 /// Stores in an entry for a host what `bytesOrOffsetOf` gave, and the `count` of the bytes.
@@ -101,7 +100,7 @@ void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
 
 /// A directory in a note: "IFD0 at 8".
 struct PlacedDirectory {
-  EntryTable const* table;
+  EntryTable const* table;  ///< Null for a host's directory, which no note names.
 };
 void append(std::string& out, PlacedDirectory directory);
 

@@ -19,52 +19,51 @@ class EntryWalk {
         bufferOffset_(stream.getOffset()),
         firstPosition_(position),
         count_(count),
-        left_(count) {}
+        entriesLeft_(count) {}
 
-  bool isAtEnd() const { return left_ == 0; }
+  bool isAtEnd() const { return entriesLeft_ == 0; }
 
   void advance() {
     entry_ += kEntrySize;
-    --left_;
+    --entriesLeft_;
   }
 
   /// How many entries come before the current one.
-  std::uint32_t passed() const { return count_ - left_; }
+  std::uint32_t passed() const { return count_ - entriesLeft_; }
   /// The current entry, counted from 1.
   std::uint32_t number() const { return passed() + 1; }
   /// Where the current entry begins in the file.
-  std::int64_t position() const { return firstPosition_ + kStep * passed(); }
+  std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
-  /// Buffers the current entry, which may move the stream. False: the data ends before its tag
-  /// does.
-  bool hasTag() { return isBufferedUpTo(kEntryTypePosition) || fillBuffer(); }
+  /// Buffers the current entry, which may move the stream. False: its tag is not all there.
+  bool bufferEntry() { return isBufferedUpTo(kEntryTypePosition) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
   /// Takes what follows the tag from the buffer, which holds whole entries unless the data ends.
   /// False: the data ends within the type or the count.
-  bool readRest(RawEntry* entry) const {
+  bool parseRest(RawEntry* entry) const {
     if (!isBufferedUpTo(kEntryFieldPosition)) {
       return false;
     }
     entry->typeCode = numberIn<std::uint16_t>(kEntryTypePosition);
     entry->count = numberIn<std::uint32_t>(kValueCountPosition);
     entry->field = entry_ + kEntryFieldPosition;
-    auto const left = static_cast<std::size_t>(bufferEnd_ - entry->field);
-    entry->fieldSize = std::min(left, kEntryFieldSize);
+    auto const available = static_cast<std::size_t>(bufferEnd_ - entry->field);
+    entry->fieldSize = std::min(available, kEntryFieldSize);
     return true;
   }
 
-  /// The stream's offsets at which the next entry begins and the last one ends.
-  std::int64_t nextOffset() const { return offset() + kStep; }
-  std::int64_t end() const { return offset() + kStep * left_; }
+  /// The stream's offsets at which the next entry begins and the last entry ends.
+  std::int64_t nextOffset() const { return offset() + kSignedEntrySize; }
+  std::int64_t endOffset() const { return offset() + kSignedEntrySize * entriesLeft_; }
 
  private:
-  static constexpr std::int64_t kStep = kEntrySize;  // signed, as offsets are
+  static constexpr std::int64_t kSignedEntrySize = kEntrySize;  // for sums with offsets
 
   std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
-  /// Whether the buffer holds the current entry up to this position in it.
+  /// Whether the buffer holds the current entry up to this position in the entry.
   bool isBufferedUpTo(std::size_t position) const {
     return bufferEnd_ - entry_ >= static_cast<std::ptrdiff_t>(position);
   }
@@ -76,11 +75,12 @@ class EntryWalk {
 
   /// Buffers the current entry and as many of those after it as fit.
   bool fillBuffer() {
-    bufferOffset_ = offset();  // of the current entry: `entry_` still points into the old buffer
+    bufferOffset_ = offset();  // before `entry_` changes, on which `offset` depends
     entry_ = buffer_.data();
-    std::size_t const size = std::min(kEntrySize * left_, buffer_.size());
+    std::size_t const size = std::min(kEntrySize * entriesLeft_, buffer_.size());
     bool const isReached = seek(stream_, bufferOffset_);
-    bufferEnd_ = entry_ + (isReached ? readUpTo(stream_, buffer_.data(), size) : 0);
+    std::size_t const received = isReached ? readUpTo(stream_, buffer_.data(), size) : 0;
+    bufferEnd_ = entry_ + received;
     return isBufferedUpTo(kEntryTypePosition);
   }
 
@@ -89,7 +89,7 @@ class EntryWalk {
   std::int64_t bufferOffset_;         // of the buffer's first byte, in the stream
   std::int64_t const firstPosition_;  // of the first entry, in the file
   std::uint32_t const count_;
-  std::uint32_t left_;  // entries, the current one included
+  std::uint32_t entriesLeft_;  // the current one included
   std::array<std::uint8_t, 64 * kEntrySize> buffer_;
   std::uint8_t const* entry_ = buffer_.data();
   std::uint8_t const* bufferEnd_ = buffer_.data();

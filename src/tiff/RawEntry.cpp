@@ -11,7 +11,7 @@ namespace {
 using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
 // How many bytes are read at a time: a multiple of every value's size.
-constexpr std::size_t kPartSize = 512;
+constexpr std::size_t kMaxPartSize = 512;
 
 template <class Number>
 void copyNumber(std::uint8_t const* bytes, bool isReversed, std::uint8_t* destination) {
@@ -50,14 +50,14 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
     return false;
   }
 
-  std::array<std::uint8_t, kPartSize> part;
+  std::array<std::uint8_t, kMaxPartSize> part;
   for (std::size_t left = entry.count; left > 0;) {
-    std::size_t const partCount = std::min(left, kPartSize / size);
-    if (!isInField && readUpTo(stream, part.data(), partCount * size) < partCount * size) {
+    std::size_t const partCount = std::min(left, kMaxPartSize / size);
+    std::size_t const partSize = partCount * size;
+    if (!isInField && readUpTo(stream, part.data(), partSize) < partSize) {
       return false;
     }
-    std::uint8_t const* bytes =
-        isInField ? entry.field : part.data();  // a field's values fit in one part
+    std::uint8_t const* bytes = isInField ? entry.field : part.data();  // a field fits in one part
     std::size_t const oldSize = values.size();
     values.resize(oldSize + partCount);
     EntryValue* value = values.data() + oldSize;

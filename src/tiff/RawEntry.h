@@ -35,7 +35,7 @@ struct RawEntry {
 // entry with a damaged count takes less than 2 MB of memory.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
-/// Bytes of one value in a file, by EntryValueType (not by the type's code in the file).
+/// Bytes of one value, by EntryValueType (not by the type's code in the file); 0 for UNDEFINED.
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
 /// Whether the code stands for a field type.
@@ -44,7 +44,7 @@ inline bool isKnown(std::uint16_t typeCode) {
 }
 
 /// Whether the type is known and there are not too many values. Any number of UNDEFINED bytes is
-/// allowed, because only up to 4 are read, those in the field.
+/// allowed: those outside the entry's field are never read.
 inline bool isAllowed(RawEntry const& entry) {
   return isKnown(entry.typeCode) &&
          (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);
@@ -64,7 +64,7 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
 /// Whether the data holds all the bytes of the field that the entry uses.
 inline bool hasWholeField(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
-/// The offset that the field holds, all 4 bytes of which must be there.
+/// The offset that the field holds. `entry.fieldSize` must be 4.
 inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }

@@ -28,7 +28,7 @@ bool Source::nextOfPaths(Input& input) {
       }
       walk_.reset();
       if (isWalkEmpty_) {
-        std::string const refusal = whyUnknown({});  // ends with ": " and the known extensions
+        std::string const refusal = whyUnknown("");  // ends with ": " and the known extensions
         report_(inputs_.paths[nextPath_ - 1],
                 "no photos found in it; hidden and excluded names are "
                 "skipped, and others must end in" +
@@ -44,8 +44,8 @@ bool Source::nextOfPaths(Input& input) {
       isWalkEmpty_ = true;
       continue;
     }
-    bool const isRegular = exists && S_ISREG(status.st_mode);
-    input = {path, isRegular && isPhotoExtension(extensionOf(path)), {}};
+    bool const isPhoto = exists && S_ISREG(status.st_mode) && isPhotoExtension(extensionOf(path));
+    input = {path, isPhoto, /*problem=*/{}};
     return true;
   }
   return false;
@@ -54,14 +54,14 @@ bool Source::nextOfPaths(Input& input) {
 /// Drops the CR that lists from other systems have after each path, unless a file's name has it.
 void Source::dropCarriageReturn(std::string& path) {
   struct stat status = {};
-  bool const mayDrop = !inputs_.isNulSeparated && path.back() == '\r';
+  bool const mayDrop = !inputs_.isNulSeparated && path.back() == '\r';  // no path is empty
   if (!mayDrop || ::lstat(path.c_str(), &status) == 0) {
     return;
   }
   path.pop_back();
-  if (!hasCrlf_) {
+  if (!isCrlfReported_) {
     report_(inputs_.list, "its lines end with CRLF; each CR counts as part of the line end");
-    hasCrlf_ = true;
+    isCrlfReported_ = true;
   }
 }
 
@@ -71,7 +71,7 @@ bool Source::nextOfList(Input& input) {
   }
   while (list_->next(input)) {
     dropCarriageReturn(input.path);
-    if (!input.path.empty()) {
+    if (!input.path.empty()) {  // else it was only a CR
       return true;
     }
   }

@@ -13,9 +13,9 @@ namespace app {
 /// Where the photos' paths come from.
 struct Inputs {
   std::vector<std::string> paths;
-  std::string list;  ///< A file of paths; "-": standard input; empty: none.
-  bool isNulSeparated = false;
-  Filter filter;  ///< For the folders among the paths.
+  std::string list;             ///< A file of paths; "-": standard input; empty: none.
+  bool isNulSeparated = false;  ///< The list: its paths end with a NUL, not with a line feed.
+  Filter filter;                ///< For the folders among the paths.
 };
 
 /// The files that the inputs name, in their order: paths, then the list.
@@ -37,9 +37,9 @@ class Source {
   Inputs const& inputs_;
   Report report_;
   std::size_t nextPath_ = 0;
-  std::optional<FolderWalk> walk_;  // of the folder at `nextPath_ - 1`
+  std::optional<FolderWalk> walk_;  // through the folder `inputs_.paths[nextPath_ - 1]`
   bool isWalkEmpty_ = true;         // so far
-  bool hasCrlf_ = false;            // the lines of the list end with CR LF
+  bool isCrlfReported_ = false;     // that the list's lines end with CR LF
   std::optional<PathList> list_;
 };
 
