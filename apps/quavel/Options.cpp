@@ -23,7 +23,7 @@ constexpr char kFooter[] =
     "Fields, such as model, path, captureDate or reason, are listed in quavel(1).\n"
     "Exit status: 0 every file gave a record, 1 some did not, 2 wrong usage.";
 
-/// Help without the options that an option excludes or needs: an error message names those.
+/// Help that does not say which options an option excludes or needs: an error message does.
 class ShortFormatter : public CLI::Formatter {
  public:
   std::string make_option_opts(CLI::Option const* option) const override {
@@ -126,7 +126,7 @@ void addChoices(CLI::App& command, Options& options) {
 /// Refuses what the parser cannot judge, and normalizes the extension.
 void finish(Options& options) {
   if (options.fromStdin) {
-    options.extension = extensionOf("." + options.extension);  // takes "nef" and ".nef"
+    options.extension = extensionOf("." + options.extension);  // of "nef" and ".nef" alike: "nef"
     std::string const unknown = whyUnknown(options.extension);
     if (!unknown.empty()) {
       throw CLI::ValidationError("--extension: " + unknown);
@@ -150,7 +150,7 @@ void refuseOddValues(CLI::App const& command, int argc, char const* const* argv)
     std::string const word = argv[i];
     auto const equals = word.find('=');
     auto const* const option = command.get_option_no_throw(word.substr(0, equals));
-    // Without a dash, it is a file, even if it begins with "PATH=", a name that the parser knows.
+    // A word without a dash is a file, even "PATH=x", though the parser knows an option "PATH".
     bool const isAssignment = word[0] == '-' && equals != std::string::npos && option != nullptr;
     if (isAssignment && option->get_items_expected_max() == 0) {
       throw CLI::ValidationError("'" + word + "': this option takes no value");
@@ -161,7 +161,7 @@ void refuseOddValues(CLI::App const& command, int argc, char const* const* argv)
   }
 }
 
-/// The parser puts two blank lines between some groups.
+/// The help with one blank line between groups; the parser puts two between some.
 std::string helpOf(CLI::App const& command) {
   std::string help = command.help();
   for (auto at = help.find("\n\n\n"); at != std::string::npos; at = help.find("\n\n\n")) {

@@ -51,8 +51,8 @@ Pipeline::~Pipeline() {
 void Pipeline::submit(std::unique_ptr<Batch> batch) {
   Batch* const submitted = batch.get();
   order_.push_back(std::move(batch));
-  // The first batch may be all there is, often a single file: it is not worth starting a thread.
   std::size_t const usefulThreads = std::min(maxThreads(), order_.size());
+  // The first batch may be all there is, often a single file: it is not worth starting a thread.
   if (jobs_ > 1 && hasSubmitted_ && threads_.size() < usefulThreads) {
     startThread();
   }
@@ -81,10 +81,12 @@ std::unique_ptr<Batch> Pipeline::take() {
 }
 
 bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
+  if (order_.empty()) {
+    return false;
+  }
   std::unique_lock<std::mutex> lock(mutex_);
   auto const isDone = [this] { return order_.front()->isDone; };
-  return !order_.empty() &&
-         (isDone() || (patience.count() > 0 && batchDone_.wait_for(lock, patience, isDone)));
+  return patience.count() > 0 ? batchDone_.wait_for(lock, patience, isDone) : isDone();
 }
 
 bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 3 * maxThreads()); }
@@ -92,7 +94,7 @@ bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 3 * ma
 std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_.load() : busyJobs_; }
 
 void Pipeline::startThread() {
-  interrupt::BlockSignals const block;
+  interrupt::BlockSignals const block;  // the new thread gets no signals
   try {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
@@ -129,7 +131,7 @@ void Pipeline::runThread() {
     workOn(*batch);
     lock.lock();
     batch->isDone = true;
-    lock.unlock();  // or the notified thread would wake up only to wait for it
+    lock.unlock();  // or the notified thread would wake up only to wait for the lock
     batchDone_.notify_one();
     lock.lock();
   }

@@ -17,7 +17,7 @@
 
 namespace app {
 
-/// Consecutive files, worked on by one thread.
+/// Consecutive files, worked on by one thread. The work sets `outcomes`, `seconds` and `bytes`.
 struct Batch {
   std::vector<Input> inputs;
   std::vector<Outcome> outcomes;
@@ -27,10 +27,10 @@ struct Batch {
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-// A batch should be short enough for results to flow and long enough to be worth handing over.
-constexpr double kLongBatch = 0.002;  ///< In seconds.
-/// How many files the next batch should have: twice `size`, within bounds, or half of it if the
-/// finished one took too long or gave too much text.
+/// In seconds: a longer batch holds results back, a far shorter one is not worth handing over.
+constexpr double kLongBatch = 0.002;
+/// How many files the next batch should have, if the last one had `size`: half as many if the batch
+/// `done` took too long or gave too much text, else twice as many, up to a maximum.
 std::size_t nextBatchSize(Batch const& done, std::size_t size);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
@@ -47,12 +47,12 @@ class Pipeline {
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
 
-  /// Works on the first batch itself, and on every batch if there is only one job.
+  /// Hands a batch to the threads. Works on the first itself, and on all if there is only one job.
   void submit(std::unique_ptr<Batch> batch);
   /// Waits for the oldest batch, which must exist, and returns it or throws what its work threw.
   std::unique_ptr<Batch> take();
   bool isEmpty() const { return order_.empty(); }
-  /// Whether enough batches are under way to keep the threads busy: three for each.
+  /// Whether enough batches are under way: three for each thread, or one if there is only one job.
   bool isFull() const;
   /// Waits up to `patience` for the oldest batch; false if it is still not done or there is none.
   bool isOldestDone(std::chrono::milliseconds patience = {});

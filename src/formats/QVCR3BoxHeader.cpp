@@ -8,12 +8,11 @@
 namespace quavel {
 
 bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
-  // One read for both numbers, since walks do little but read headers. As with two reads, the size
-  // is stored even if the data ends within the type.
+  // One read for both numbers is faster than two, and walks do little but read headers.
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);
-  if (received >= sizeof(boxSize)) {
+  if (received >= sizeof(boxSize)) {  // stored even if the data ends within the type
     boxSize = detail::numberAt<std::uint32_t>(bytes.data(), isReversed);
   }
   if (received < bytes.size()) {

@@ -34,7 +34,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   }
   long const end = endOfBox(start, *boxHeader);
 
-  stream->setOffset(start + static_cast<long>(box::kHeaderSize));
+  stream->setOffset(start + static_cast<long>(box::kHeaderSize));  // back from the box's end
   for (auto& word : userType) {
     if (!stream->readLong(&word)) {
       return refuseCut(journal, uuid.position + box::kHeaderSize, sizeof(userType),
@@ -44,7 +44,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   bool const isMetadata = userType == metadataUUID;
   notePassed(journal, uuid.position, "{}: {}", uuid,
              isMetadata ? "the metadata" : "another identifier");
-  bool const isRead = !isMetadata || readChildren(stream, end);
+  bool const isRead = !isMetadata || readChildren(stream, end);  // any other box is skipped
   leaveBox(*stream, end);
   return isRead;
 }

@@ -16,7 +16,7 @@ constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 /// A field of the record that can be absent.
 struct FieldRow {
   char name[22];
-  std::uint8_t rowsToOrigin;  ///< Down to the field that it is computed from; 0: not computed.
+  std::uint8_t rowsToOrigin;  ///< How far down is the field it is computed from; 0: not computed.
   std::uint8_t families;      ///< Whose readers fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
@@ -119,7 +119,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       continue;
     }
     if ((row.families & format.family) == 0) {
-      // Only the signature of ISO base media files is not at 0, and their brand follows it.
+      // Only ISO base media files have their signature elsewhere than at 0; a brand follows it.
       bool const hasBrand = row.position != 0 && received >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;

@@ -14,13 +14,12 @@ class Journal;
 /// Work that a file can make a read do many times over. A step goes over a segment or a box.
 enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
 
-/// The most work of each kind in one read, far above what cameras' files need. The formats set no
-/// such limits: any number of directories, segments or boxes may come before the wanted one, and a
-/// file can refer to the same large directory again and again.
+/// The most work of each kind in one read, far above what cameras' files need. The formats
+/// themselves set no limit: a file can refer to the same large directory again and again.
 inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
-    std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB
+    std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB of memory
     std::uint64_t{1} << 24U,  // steps: a JPEG's reader takes one for every 2 bytes of padding
 };
 
@@ -36,11 +35,11 @@ class Reading {
 
   Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
-  /// The record's class is one of the library's, so no host's override sees the directories.
+  /// False: the record may be of a host's class, which must get directories with `entries`.
   bool isOwnRecord = false;
 
  private:
-  bool refuseWork(Work work) const;
+  bool refuseWork(Work work) const;  // always false
 
   std::array<std::uint64_t, 4> done_ = {};
 };
@@ -73,7 +72,7 @@ class ReadScope {
   Reading begun_;   // not used after joining `outer_`
 };
 
-/// The read that the stream serves. There is one in every public operation: each opens a scope.
+/// The read that the stream serves. Only to be called while a `ReadScope` lives.
 inline Reading& readingOf(QVStream const& stream) { return *ReadScope::current(stream); }
 
 /// The journal of the read that the stream serves; null without a read or a journal.
@@ -82,14 +81,13 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal what `readBuffer` returned (negative: it failed) and, after a failure, the
-/// `errno`, or 0 if that is not known. A refusal that follows states the failure.
+/// Tells the journal whether `readBuffer` failed (`delivered` < 0) and why (`errno`; 0: unknown).
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.
 inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }
 
-/// The position for a note; 0, without asking the stream, when there is no journal for it.
+/// `positionOf` for a note; without a journal 0, as asking the stream may cost a system call.
 inline std::int64_t notedPosition(Journal const* journal, QVStream& stream) {
   return journal == nullptr ? 0 : positionOf(stream);
 }

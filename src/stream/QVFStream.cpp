@@ -21,7 +21,7 @@ std::int64_t QVFStream::readBuffer(std::uint8_t* destination, std::size_t count)
 
 long QVFStream::getOffset() {
   std::int64_t const position = fd == -1 ? 0 : file::position(fd);
-  return static_cast<long>(detail::wrappingDifference(position, baseOffset));
+  return static_cast<long>(detail::wrappingDifference(position, baseOffset));  // hosts set any base
 }
 
 void QVFStream::setOffset(long const& offset) {

@@ -23,13 +23,13 @@ std::string explanationOf(Outcome const& outcome);
 std::string csvHeader(Form const& form);
 TextOf csvRows(Form const& form, bool isForTerminal);
 
-/// JSON objects, each on one line; the line end is only added for JSON Lines, as in an array a
-/// comma may follow. An infinity, for which JSON has no number, is "Infinity" or "-Infinity".
+/// JSON objects, each on one line. The line end is there only for JSON Lines: in an array, a comma
+/// may come before it. An infinity, for which JSON has no number, is "Infinity" or "-Infinity".
 TextOf jsonObjects(Form const& form, bool isForTerminal);
 
 /// A table for people, laid out page by page so that no more than a page is ever held. On a
-/// terminal it fits the width; elsewhere nothing is cut, and no page ends early because rows come
-/// slowly. A single file becomes a card, unless a table is asked for.
+/// terminal it fits the width, and a page ends early if rows come slowly; elsewhere nothing is cut
+/// and each page is filled. A single file becomes a card, unless a table is asked for.
 std::unique_ptr<Writer> makeTable(Form const& form, Output& output);
 
 }  // namespace app

@@ -38,7 +38,7 @@ constexpr Relation kRelations[] = {
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// Parses the whole text as the type that `field.words` takes; absent if it is no such value.
+/// Visits a field's `words`: the whole text as a value of the type that they take, or absent.
 struct ParseFor {
   std::string_view text;
 
@@ -61,8 +61,9 @@ struct ParseFor {
 /// Dates compare alike in every notation: as files have them, as people see them and in ISO 8601.
 Value comparable(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
-  auto const* const function = std::get_if<std::string (*)(std::string const&)>(&field.words);
-  if (text != nullptr && function != nullptr && *function == words::date) {
+  auto const* const textWords = std::get_if<std::string (*)(std::string const&)>(&field.words);
+  bool const isDateField = textWords != nullptr && *textWords == words::date;
+  if (isDateField && text != nullptr) {
     std::replace(text->begin(), text->end(), ':', '-');
     std::replace(text->begin(), text->end(), 'T', ' ');
   }
