@@ -11,7 +11,7 @@ inline constexpr std::uint32_t Uuid = 0x75756964;
 inline constexpr std::uint32_t CMT1 = 0x434d5431;
 inline constexpr std::uint32_t CMT2 = 0x434d5432;
 
-/// Bytes of a box's size and type.
+/// A box begins with its size and its type, of 4 bytes each.
 inline constexpr std::uint32_t kHeaderSize = 8;
 
 }  // namespace quavel::box

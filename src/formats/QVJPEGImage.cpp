@@ -32,9 +32,9 @@ constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// How many bytes to skip after these markers, of which no length is read: the length and interval
-// of DRI; 2 bytes of any kind after the others, which have no payload. This is a constant, so that
-// readers work even before the public map below is initialised.
+// How many bytes to skip after markers of which no length is read. DRI: its length and interval.
+// The others have no payload: the next 2 bytes, whatever they are. The walk does not use the public
+// map below, which may not be initialised yet when a host's static object reads a file.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -49,7 +49,7 @@ constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = 
     {0xffd9, 2},  // EOI
 }};
 
-/// Moves to the next segment, or beyond the end of the data. False: no offset reaches there.
+/// Moves to the next segment, or beyond the end of the data. False: `offset` is too large.
 bool seekNext(QVStream& stream, std::int64_t offset) {
   return seek(stream, offset) || refuseCut(journalOf(stream), stream.baseOffset + offset,
                                            kMarkerSize, "the marker of the next segment");
@@ -122,10 +122,10 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   if (marker == kSOS && walk.firstScan < 0) {
     walk.firstScan = walk.start;
     bool const sawNeither = !walk.sawAPP1 && !walk.sawSOF0;
-    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // the walk ends with both
+    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // both would end the walk
     walk.missingAtScan = sawNeither ? "SOF0 or APP1" : missingOne;
   }
-  // Once the scan has begun, these two bytes are picture data.
+  // After an SOS segment, picture data may look like an SOF2 marker.
   if (marker == kSOF2 && walk.firstScan < 0) {
     walk.sof2 = walk.start;
   }
@@ -134,7 +134,6 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
 
 bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   Journal* const journal = journalOf(*stream);
-  std::int64_t const outerBase = stream->baseOffset;
   std::array<std::uint8_t, 4> identifier;
   if (!readExactly(*stream, identifier.data(), identifier.size())) {
     return refuseCut(journal, walk.start + kPayloadPosition, identifier.size(),
@@ -144,18 +143,19 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   notePassed(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
              isExif ? "Exif" : "not Exif");
   if (isExif) {
-    unsigned short twoZeros = 0;
+    unsigned short twoZeros = 0;  // not checked
     if (!stream->readShort(&twoZeros)) {
       return refuseCut(journal, walk.start + kPayloadPosition + std::int64_t{identifier.size()},
                        sizeof(twoZeros), "the end of the Exif identifier of the APP1 segment at {}",
                        Offset{walk.start});
     }
+    std::int64_t const outerBase = stream->baseOffset;  // `readExifSegment` changes it
     if (!readExifSegment(stream)) {
       return false;
     }
+    stream->baseOffset = outerBase;
     walk.sawExif = true;
   }
-  stream->baseOffset = outerBase;
   walk.sawAPP1 = true;
   return true;
 }
@@ -171,10 +171,10 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   }
   notePassed(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
              Offset{walk.start}, width, height);
+  // Until an APP1 is met, the walk goes on and may find more frames: the greatest sides count.
   if (walk.sof0 < 0 || width > walk.frameWidth || height > walk.frameHeight) {
     walk.sof0 = walk.start;
   }
-  // Until an APP1 is met, the walk goes on and may find more frames: the greatest sides count.
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
   walk.sawSOF0 = true;
@@ -208,7 +208,7 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;
+  DirectoryPointer exifIFD;  // not used: `readExifIFD` stores its values
   return readExifIFD(*this, stream, mainIFD,
                      {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
                       tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
@@ -223,7 +223,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!QVMetadata::storeInfoFromExifIFD(ifd)) {
     return false;
   }
-  int exifWidth = width;  // stays so if this directory gives none
+  int exifWidth = width;  // kept if the directory gives none
   int exifHeight = height;
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;

@@ -28,13 +28,13 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;
+  DirectoryPointer exifIFD;  // not used: `readExifIFD` stores its values
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;
   }
 
-  // The second SubIFD describes the raw image, whether or not there is an Exif directory.
+  // The second SubIFD, if there is one, describes the raw image.
   DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, /*index=*/1,
                   {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType}, rawIFD)) {

@@ -40,7 +40,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
   journal.knownSize = static_cast<std::int64_t>(length);
   auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
   if constexpr (sizeof(unsigned long) < sizeof(length)) {
-    memory->length = length;  // for which the constructor's `unsigned long` is too small
+    memory->length = length;  // the constructor's `unsigned long` may have cut it
   }
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));
 }
@@ -59,7 +59,7 @@ QVNote const* QVJournal::refusal() const {
 }
 
 detail::Journal QVJournal::begin() {
-  notes_.clear();  // at once: a host's stream may throw before `keep`
+  notes_.clear();  // not left to `keep`, which is not reached if a host's stream throws
   furtherSteps_ = 0;
   format_ = "";
   return detail::Journal(detail_);

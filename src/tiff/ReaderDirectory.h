@@ -22,7 +22,7 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   ReaderDirectory(ReaderDirectory const&) = delete;
   ReaderDirectory& operator=(ReaderDirectory const&) = delete;
 
-  /// The directory as a reader's own; null when a host made it.
+  /// The directory itself if it is a ReaderDirectory, else null.
   static ReaderDirectory const* of(QVTiffImageFileDirectory const& directory) {
     return directory.ofReader;
   }
@@ -41,7 +41,7 @@ bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* 
 /// The entry kept for the tag; false as a bool when there is none.
 Entry findEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The journal of the read that a reader's directory belongs to; null for a host's.
+/// The journal of the read that filled the directory; null for a directory made by a host.
 inline Journal* journalOf(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return own == nullptr ? nullptr : own->table.journal();

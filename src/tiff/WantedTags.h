@@ -10,8 +10,8 @@
 
 namespace quavel::detail {
 
-/// The tags that a reader wants. It lists some whose values it does not use, such as
-/// OffsetTimeOriginal: a file in which such an entry is damaged is refused.
+/// The tags that a reader wants. Some, such as OffsetTimeOriginal, are listed only so that a file
+/// is refused if their entry is damaged.
 using TagList = std::initializer_list<unsigned short>;
 
 /// The tags that are still wanted while a directory is read. A listed tag is wanted until it is
@@ -31,7 +31,7 @@ class WantedTags {
 
   /// Whether the tag is still wanted. A listed tag no longer is after this call.
   bool take(unsigned short tag) {
-    if ((mask_ & bitOf(tag)) == 0) {
+    if (!mayBeWanted(tag)) {
       return false;
     }
     return wantsAll_ || (longList_ ? takeFromLongList(tag) : takeFromShortList(tag));
@@ -48,12 +48,13 @@ class WantedTags {
   using LongList = std::bitset<std::size_t{UINT16_MAX} + 1>;
 
   static std::uint64_t bitOf(unsigned short tag) { return std::uint64_t{1} << (tag % 64); }
+  bool mayBeWanted(unsigned short tag) const { return (mask_ & bitOf(tag)) != 0; }
 
   void add(unsigned short tag) {
     if (longList_) {
       left_ += longList_->test(tag) ? 0 : 1;
       longList_->set(tag);
-    } else if ((mask_ & bitOf(tag)) == 0 || find(tag) == left_) {  // not yet listed
+    } else if (!mayBeWanted(tag) || find(tag) == left_) {  // not yet listed
       shortList_[left_++] = tag;
     }
     mask_ |= bitOf(tag);
@@ -85,7 +86,7 @@ class WantedTags {
   }
 
   bool const wantsAll_;
-  std::uint64_t mask_ = 0;  // a bit for each listed tag modulo 64: rules out most others quickly
+  std::uint64_t mask_ = 0;  // the `bitOf` of all listed tags: rules out most others quickly
   std::size_t left_ = 0;    // listed tags that are still to be met
   std::array<unsigned short, kMaxShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null while the short list is enough

@@ -10,8 +10,8 @@ namespace {
 
 constexpr std::size_t kGap = 2;  // blanks between columns
 
-/// Shortens the widest columns first, each down to its minimum, until the line fits or no column
-/// can be shortened further.
+/// Takes one cell at a time from whichever column is then the widest, never below a column's least
+/// width, until the line fits or no column can give more.
 void shorten(std::vector<Column> const& columns, Widths& widths, std::size_t maxWidth) {
   while (lineWidth(widths) > maxWidth) {
     std::size_t widest = columns.size();  // none found yet
@@ -70,15 +70,15 @@ Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t maxWi
 std::string lineOf(std::vector<Column> const& columns, Widths const& widths,
                    std::vector<std::string> const& texts) {
   std::string line;
-  std::size_t gap = 0;  // blanks before the next text, so that no line ends with blanks
+  std::size_t blanks = 0;  // before the next text; none follow the last one
   for (std::size_t i = 0; i < columns.size(); ++i) {
     if (widths[i] == 0) {
       continue;
     }
     std::string const text =
         columns[i].keepsEnd ? keepEnd(texts[i], widths[i]) : keepStart(texts[i], widths[i]);
-    line.append(gap, ' ').append(text);
-    gap = widths[i] - widthOf(text) + kGap;
+    line.append(blanks, ' ').append(text);
+    blanks = widths[i] - widthOf(text) + kGap;
   }
   return line + '\n';
 }

@@ -12,7 +12,7 @@ struct Column {
   std::string label;
   std::size_t least;  ///< The fewest terminal cells that it can be shortened to.
   int rank;           ///< The column with the highest rank is left out first; 0: never.
-  bool keepsEnd;      ///< Shortened at its start; true only for the path.
+  bool keepsEnd;      ///< A long text is cut at its start; true only for the path.
 };
 
 /// The widths of all columns, in terminal cells; 0: the column is left out.

@@ -11,14 +11,13 @@ namespace app {
 
 namespace {
 
-/// Shows each file by a text of its own, with `start` before the first one and `separator` before
-/// the others.
+/// Writes a text for each file, with `start` before the first and `separator` before the others.
 class TextWriter : public Writer {
  public:
   TextWriter(Output& output, TextOf textOf, std::string start, std::string separator)
       : output_(output),
         textOf_(std::move(textOf)),
-        start_(std::move(start)),
+        beforeNext_(std::move(start)),
         separator_(std::move(separator)) {}
 
   void prepare(Outcome& outcome) const override {
@@ -28,16 +27,16 @@ class TextWriter : public Writer {
   }
   void add(Outcome&& outcome) override {
     if (!outcome.text.empty()) {
-      output_.add(outcome.text.insert(0, start_));
-      start_ = separator_;
+      output_.add(outcome.text.insert(0, beforeNext_));
+      beforeNext_ = separator_;
     }
   }
-  void end() override { output_.finish(); }  // writes the end of a JSON array
+  void end() override { output_.finish(); }  // with the "]" of a JSON array
 
  private:
   Output& output_;
   TextOf textOf_;
-  std::string start_;  // of the next text
+  std::string beforeNext_;
   std::string separator_;
 };
 
@@ -47,7 +46,7 @@ class SortingWriter : public Writer {
   SortingWriter(Form const& form, std::unique_ptr<Writer> next)
       : form_(form), next_(std::move(next)) {}
 
-  void prepare(Outcome&) const override {}  // in `end`: sorting needs the record
+  void prepare(Outcome&) const override {}  // not before `end`: sorting needs the record
   void add(Outcome&& outcome) override { outcomes_.push_back(std::move(outcome)); }
   void end() override {
     auto const isBefore = [this](Outcome const& a, Outcome const& b) {
@@ -62,7 +61,7 @@ class SortingWriter : public Writer {
     for (auto& outcome : outcomes_) {
       next_->prepareSafely(outcome);
       next_->add(std::move(outcome));
-      outcome = {};  // frees its memory
+      outcome = {};  // frees what `add` did not take
     }
     next_->end();
   }
@@ -73,11 +72,12 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path, ended by a NUL: of files that meet the conditions or, without any, have a record.
+/// Each path, ended by a NUL. Without conditions, only of files that have a record.
 TextOf paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
-    return outcome.record || hasConditions ? path + '\0' : std::string();
+    bool const isListed = outcome.record || hasConditions;
+    return isListed ? path + '\0' : std::string();
   };
 }
 
@@ -99,7 +99,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
       return writer(paths(form, isTerminal), "", "");
     case FormKind::Card:
       return writer([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
-    default:  // Automatic with notes: `makeTable` makes all tables
+    default:  // only Automatic with notes: tables do not come here
       return writer(explanationOf, "", "\n");
   }
 }

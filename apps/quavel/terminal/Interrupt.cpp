@@ -24,7 +24,7 @@ std::atomic<int> pendingSignal{0};
   ::signal(signal, SIG_DFL);
   ::pthread_sigmask(SIG_UNBLOCK, &onlyThis, nullptr);  // a handler runs with its signal blocked
   ::raise(signal);
-  ::_exit(128 + signal);  // the status by which shells report a death by signal
+  ::_exit(128 + signal);  // if `raise` fails: the status that shells give a death by signal
 }
 
 /// Erases the progress line and completes the output, then dies.
@@ -41,7 +41,7 @@ std::atomic<int> pendingSignal{0};
 
 void handle(int signal) {
   if (pendingSignal != 0) {
-    if (signal == SIGALRM) {  // the second is over
+    if (signal == SIGALRM) {  // the second that `alarm(1)` gives is over
       die();
     }
     return;  // the process is ending already
@@ -68,7 +68,7 @@ void write(int fd, std::string_view bytes) {
 
 void install() {
   struct sigaction action = {};
-  action.sa_handler = handle;  // without SA_RESTART: a blocked write of Output ends with EINTR
+  action.sa_handler = handle;  // without SA_RESTART, so that a blocked write of Output returns
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);

@@ -5,8 +5,8 @@
 
 #include <string_view>
 
-/// On SIGINT, SIGTERM and SIGHUP, a signal handler closes the output (see `setTail`) and ends the
-/// process at once. A thread that waits for the signals would slow down the reading of files.
+/// On SIGINT, SIGTERM and SIGHUP, a signal handler completes the output (see `setTail`) and ends
+/// the process. A thread for the signals would slow each system call where only one thread reads.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
@@ -37,8 +37,7 @@ void setTail(char const* tail);
 /// Sets whether the terminal shows a progress line, which an interrupt would then erase.
 void setProgressShown(bool isShown);
 
-/// A signal that arrives while this lives ends the process only when this is destroyed, or after a
-/// second. Further signals have no effect.
+/// If a signal arrives while this lives, the process ends when this is destroyed or a second later.
 class WriteScope {
  public:
   WriteScope();
