@@ -47,7 +47,7 @@ void addConditions(std::vector<std::string> const& texts, Form& form) {
   for (auto const& text : texts) {
     std::string name = text.substr(0, text.find_first_of(Condition::kSigns));
     auto const comparison = std::string_view(text).substr(name.size());
-    name.erase(name.find_last_not_of(' ') + 1);  // blanks before the sign
+    name.erase(name.find_last_not_of(' ') + 1);  // drops the blanks before the sign
     auto const* const field = requireField("--where", name);
     try {
       form.conditions.emplace_back(*field, comparison);

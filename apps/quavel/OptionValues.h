@@ -6,7 +6,7 @@
 
 #include "output/Form.h"
 
-/// What the options' arguments mean. A CLI::ValidationError names an argument that is wrong.
+/// Turning options' arguments into values. For a wrong one, a CLI::ValidationError is thrown.
 namespace app::values {
 
 constexpr unsigned kMaxJobs = 256;
@@ -14,9 +14,9 @@ constexpr unsigned kMaxJobs = 256;
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
-/// Drops slashes at a glob's end. A glob with another slash matches whole paths and ends of paths.
+/// Drops slashes at a glob's end. A glob that still has one matches whole paths or ends of paths.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
-/// True for the choice `yes`, false for `no`; any other is wrong.
+/// For a choice of two texts, such as "skip" (`no`) and "show" (`yes`): whether it is `yes`.
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);
 /// A check that the parser calls: returns why the argument is wrong, or an empty text.

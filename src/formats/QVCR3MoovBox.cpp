@@ -15,10 +15,10 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   }
   // Back into the box, which the base class has stepped over.
   stream->setOffset(start + static_cast<long>(box::kHeaderSize));
-  PlacedBox const moov = {boxHeader->type(), stream->baseOffset + start};
-  if (moov.type != box::Moov) {
-    return refuse(journalOf(*stream), QVReason::OtherKind, moov.position,
-                  "the {} is not a moov box", moov);
+  PlacedBox const thisBox = {boxHeader->type(), stream->baseOffset + start};
+  if (thisBox.type != box::Moov) {
+    return refuse(journalOf(*stream), QVReason::OtherKind, thisBox.position,
+                  "the {} is not a moov box", thisBox);
   }
   long const end = endOfBox(start, *boxHeader);
 
@@ -38,7 +38,7 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, l
       continue;
     }
     stream->setOffset(childStart);
-    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last one counts, whatever its identifier
+    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last uuid box counts, of any identifier
     if (!uuidBox->read(stream)) {
       return false;
     }

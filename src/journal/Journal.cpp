@@ -63,7 +63,7 @@ std::string Journal::cutText(std::int64_t end) {
     return systemError == 0 ? "reading fails"
                             : "reading fails: " + std::generic_category().message(systemError);
   }
-  if (dataSize() <= 0) {  // some file systems say 0 of files that have bytes
+  if (dataSize() <= 0) {  // not known, or a 0 that may be wrong
     return "the data ends before that";
   }
   bool const isInFile = end <= dataSize();
@@ -71,17 +71,17 @@ std::string Journal::cutText(std::int64_t end) {
 }
 
 void Journal::passed(std::int64_t position, char const* pattern, Words words) {
-  if (steps_ == kMaxSteps) {
+  if (notedSteps_ == kMaxSteps) {
     ++furtherSteps;
     return;
   }
-  ++steps_;
+  ++notedSteps_;
   add(QVNoteKind::Step, QVReason::None, position, composed(pattern, words));
 }
 
 void Journal::hint(QVReason reason, std::int64_t position, char const* pattern, Words words) {
-  if (hints_ < kMaxHints) {
-    ++hints_;
+  if (notedHints_ < kMaxHints) {
+    ++notedHints_;
     add(QVNoteKind::Hint, reason, position, composed(pattern, words));
   }
 }
@@ -100,7 +100,7 @@ QVNote* Journal::absenceOf(char const* field) {
   return found == absences_.end() ? nullptr : &*found;
 }
 
-void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
+void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {  // see Reading.h
   if (Journal* const journal = journalOf(stream)) {
     journal->hasReadFailed = delivered < 0;
     journal->systemError = delivered < 0 ? error : 0;
@@ -108,7 +108,7 @@ void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
 }
 
 bool Reading::refuseWork(Work work) const {
-  // In the order of the enumerators.
+  // In the order of the enumerators of `Work`.
   static constexpr char const* kPatterns[] = {
       "the file makes the reader open more than {} directories",
       "the file makes the reader walk over more than {} directory entries",

@@ -35,9 +35,9 @@ class Journal {
   /// The reason given so far for a field's absence, or null.
   QVNote* absenceOf(char const* field);
 
-  /// The size of the data in bytes, for which the first call asks the system; -1: not known.
+  /// The size of the data in bytes. -1: not known. 0: may be wrong, as for files in /proc.
   std::int64_t dataSize();
-  /// Why the last read delivered too little, as a reason and as a text; it was to end at `end`.
+  /// Why the last bytes asked for, up to `end`, were not all delivered: as a reason, as a text.
   QVReason cutReason() const;
   std::string cutText(std::int64_t end);
 
@@ -46,7 +46,7 @@ class Journal {
   char const* format = "";      ///< See `QVJournal::format`.
   int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
-  bool hasReadFailed = false;   ///< The last read failed; the end of the data is not a failure.
+  bool hasReadFailed = false;   ///< The last `readBuffer` failed, not only met the end of the data.
   int systemError = 0;          ///< The `errno` of that failure, or of opening; 0: not known.
 
  private:
@@ -54,8 +54,8 @@ class Journal {
 
   bool wantsAll_;
   bool isRefused_ = false;
-  std::size_t steps_ = 0;
-  std::size_t hints_ = 0;
+  std::size_t notedSteps_ = 0;
+  std::size_t notedHints_ = 0;
   std::vector<QVNote> absences_;  // at most one for each field
 };
 

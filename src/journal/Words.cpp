@@ -9,16 +9,15 @@ namespace {
 
 constexpr std::size_t kMaxTextLength = 500;
 
-// Smaller offsets are a single digit, the same in decimal.
-constexpr std::int64_t kFirstHexadecimal = 10;
+constexpr std::int64_t kFirstHexadecimal = 10;  // below it, hexadecimal and decimal look the same
 
 void appendHex(std::string& out, std::uint64_t number, int minDigits) {
   int digits = minDigits;
   while (digits < 16 && (number >> (4 * digits)) != 0) {  // 64 bits are 16 digits
     ++digits;
   }
-  while (digits-- > 0) {
-    out += "0123456789abcdef"[(number >> (4 * digits)) & 0xfU];
+  for (int shift = 4 * (digits - 1); shift >= 0; shift -= 4) {
+    out += "0123456789abcdef"[(number >> shift) & 0xfU];
   }
 }
 
@@ -74,7 +73,7 @@ void append(std::string& out, QuotedBytes bytes) {
 
 std::string composed(char const* pattern, std::initializer_list<Word> words) {
   std::string text;
-  text.reserve(kMaxTextLength / 4);
+  text.reserve(kMaxTextLength / 4);  // most texts are shorter
   std::string_view rest = pattern;
   for (Word const& word : words) {
     auto const brace = rest.find('{');  // of a "{}": patterns have no other braces

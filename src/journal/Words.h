@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// An offset in the file: "0x1f2 (498)", or just "8" for a small one.
+/// An offset in the file, in a note: "0x1f2 (498)", or just "8" if it has one digit.
 struct Offset {
   std::int64_t value;
 };
@@ -46,8 +46,8 @@ void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 
-/// A part of a note's text: a value of any type that has an `append` function, above or beside the
-/// type itself. The value must outlive the word.
+/// A part of a note's text: a value of any type that has an `append` function, above or where the
+/// type is declared. The value must outlive the word.
 class Word {
  public:
   template <class Value>

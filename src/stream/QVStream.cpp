@@ -9,7 +9,7 @@ using detail::reverseBytes;
 namespace {
 
 template <class Number>
-void reverseUnlessHostIs(ByteOrder order, QVStream const& stream, Number* number) {
+void reverseUnlessHostOrderIs(ByteOrder order, QVStream const& stream, Number* number) {
   if (stream.hostOrder != order) {
     reverseBytes(number);
   }
@@ -56,27 +56,27 @@ void QVStream::swapL(unsigned int* value) const { reverseBytes(value); }
 void QVStream::swapLL(unsigned long long* value) const { reverseBytes(value); }
 
 void QVStream::swapSLittleToHost(unsigned short* value) const {
-  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::LittleEndian, *this, value);
 }
 
 void QVStream::swapLLittleToHost(unsigned int* value) const {
-  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::LittleEndian, *this, value);
 }
 
 void QVStream::swapLLLitleToHost(unsigned long long* value) const {
-  reverseUnlessHostIs(ByteOrder::LittleEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::LittleEndian, *this, value);
 }
 
 void QVStream::swapSBigToHost(unsigned short* value) const {
-  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::BigEndian, *this, value);
 }
 
 void QVStream::swapLBigToHost(unsigned int* value) const {
-  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::BigEndian, *this, value);
 }
 
 void QVStream::swapLLBigToHost(unsigned long long* value) const {
-  reverseUnlessHostIs(ByteOrder::BigEndian, *this, value);
+  reverseUnlessHostOrderIs(ByteOrder::BigEndian, *this, value);
 }
 
 }  // namespace quavel

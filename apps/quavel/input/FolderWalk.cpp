@@ -39,16 +39,15 @@ bool FolderWalk::step(Input& input) {
   }
   Entry const entry = level.entries.back();
   level.entries.pop_back();
-  constexpr std::size_t kUsualPath = 100;  // so that most paths take memory only once
   std::string path;
-  path.reserve(kUsualPath);
+  path.reserve(100);  // most paths are shorter, and so take memory only once
   path.append(level.path).append(&level.names[entry.name]);
   return visit(entry.type, std::move(path), input);
 }
 
 bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
-    case DT_REG:  // a photo: other files never get here
+    case DT_REG:  // with a photo's extension: others were left out before
       input = {std::move(path), /*isPhoto=*/true, {}};
       return true;
     case DT_DIR:
@@ -56,14 +55,14 @@ bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
       return false;
     case DT_LNK:
     case DT_UNKNOWN:  // not every file system gives the type here
-      return visitUnknown(std::move(path), input);
+      return visitLinkOrUnknown(std::move(path), input);
     default:
       report_(path, "is not a regular file; skipped");
       return false;
   }
 }
 
-bool FolderWalk::visitUnknown(std::string path, Input& input) {
+bool FolderWalk::visitLinkOrUnknown(std::string path, Input& input) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
     if (errno == ELOOP) {
@@ -75,12 +74,12 @@ bool FolderWalk::visitUnknown(std::string path, Input& input) {
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
-    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` applied the rule for files
-      enter(path, /*isFoundByLink=*/true);     // also for DT_UNKNOWN, which may be no link
+    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` took it for a file
+      enter(path, /*isFoundByLink=*/true);     // an unknown type counts as a link
     }
     return false;
   }
-  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // which `visit` skips
+  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR for any other
   return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
 }
 
@@ -91,7 +90,7 @@ void FolderWalk::enter(std::string const& path, bool isFoundByLink) {
     return setUnreadable(path, errno);
   }
   Identity const identity(status.st_dev, status.st_ino);
-  if (isRepeated(path, identity, isFoundByLink)) {
+  if (reportIfRepeated(path, identity, isFoundByLink)) {
     return;
   }
   Level level = {path.back() == '/' ? path : path + '/', identity, {}, {}};
@@ -99,7 +98,8 @@ void FolderWalk::enter(std::string const& path, bool isFoundByLink) {
   levels_.push_back(std::move(level));
 }
 
-bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, bool isFoundByLink) {
+bool FolderWalk::reportIfRepeated(std::string const& path, Identity const& identity,
+                                  bool isFoundByLink) {
   bool const isLoop = std::any_of(levels_.begin(), levels_.end(),
                                   [&](Level const& level) { return level.identity == identity; });
   if (isLoop) {
@@ -115,14 +115,15 @@ bool FolderWalk::isRepeated(std::string const& path, Identity const& identity, b
 
 bool FolderWalk::isHidden(std::string_view name, bool isFolder) const {
   // On foreign file systems, macOS keeps some data about IMG.JPG in ._IMG.JPG: not a photo.
-  return !filter_.showsHidden && name[0] == '.' && (isFolder || name.substr(1, 1) == "_");
+  std::string_view const prefix = isFolder ? "." : "._";
+  return !filter_.showsHidden && name.substr(0, prefix.size()) == prefix;
 }
 
 bool FolderWalk::isExcluded(std::string const& folder, std::string_view name) const {
   return std::any_of(filter_.excluded.begin(), filter_.excluded.end(), [&](auto const& glob) {
     bool const isForPaths = glob.find('/') != std::string::npos;
     std::string const candidate = (isForPaths ? folder : std::string()) + std::string(name);
-    return ::fnmatch(glob.c_str(), candidate.c_str(), 0) == 0;
+    return ::fnmatch(glob.c_str(), candidate.c_str(), /*flags=*/0) == 0;
   });
 }
 

@@ -33,13 +33,14 @@ struct Filter {
 /// the folders above it.
 class FolderWalk {
  public:
-  /// The filter must outlive it.
+  /// The filter must outlive the walk.
   FolderWalk(std::string const& folder, Filter const& filter, Report report);
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
   bool isAtEnd() const { return !unreadable_ && levels_.empty(); }
-  /// A short step of `next`. False: it found nothing yet. Not to be called at the end.
+  /// Does a short part of `next`, for a caller that must not wait long. False: nothing was found
+  /// yet. Not to be called at the end.
   bool step(Input& input);
 
  private:
@@ -56,14 +57,13 @@ class FolderWalk {
   };
 
   void enter(std::string const& path, bool isFoundByLink);
-  bool isRepeated(std::string const& path, Identity const& identity,
-                  bool isFoundByLink);  // reports it
+  bool reportIfRepeated(std::string const& path, Identity const& identity, bool isFoundByLink);
   bool isHidden(std::string_view name, bool isFolder) const;
   bool isExcluded(std::string const& folder, std::string_view name) const;
   void readEntries(DIR* folder, Level& level);
   void setUnreadable(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);
-  bool visitUnknown(std::string path, Input& input);
+  bool visitLinkOrUnknown(std::string path, Input& input);
 
   Filter const& filter_;
   Report report_;

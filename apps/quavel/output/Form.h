@@ -8,22 +8,22 @@
 
 namespace app {
 
-/// Automatic: an explanation with `hasNotes`, else a card for a single file, else a table.
+/// Automatic: the notes if they are wanted, else a card for a single file, else a table.
 enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 
 /// How the files are shown.
 struct Form {
   FormKind kind = FormKind::Automatic;
-  Fields fields;                      ///< Empty: the form chooses them.
+  Fields fields;                      ///< Empty: those that suit `kind`.
   Field const* sort = nullptr;        ///< Null: the order of the input.
   bool isDescending = false;          ///< With `sort`: in descending order.
-  std::vector<Condition> conditions;  ///< Only what meets all of them is shown.
-  std::optional<bool> showAbsent;     ///< Not set: the form decides.
+  std::vector<Condition> conditions;  ///< Only photos that meet them all are shown.
+  std::optional<bool> showAbsent;     ///< Not set: as suits `kind` and `fields`.
   bool hasNotes = false;              ///< The notes of the read are shown.
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
-  /// Whether it shows values to programs. Paths, the form of --print0, show none.
+  /// Whether programs read its values. `Paths`, the kind for --print0, has no values.
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }

@@ -25,20 +25,20 @@ struct Problem {
 struct Input {
   std::string path;
   bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
-  Problem problem;       ///< Set when it is not even to be read.
+  Problem problem;       ///< Set: why the file must not be read.
 };
 
 /// The result of reading one file.
 struct Outcome {
   std::string path;
-  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or `text` or `cells` replaced it.
+  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or no longer needed for output.
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< As the journal gives it.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
   std::uint64_t furtherSteps = 0;              ///< How many steps the notes leave out.
   bool isShown = true;                         ///< It meets all conditions.
   std::string text;                            ///< Its output in the chosen form, once prepared.
-  std::vector<std::string> cells;              ///< The same for the table.
+  std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.
 };
 
 }  // namespace app
