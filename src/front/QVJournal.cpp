@@ -39,9 +39,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t l
   detail::Journal journal = begin();
   journal.knownSize = static_cast<std::int64_t>(length);
   auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
-  if constexpr (sizeof(unsigned long) < sizeof(length)) {
-    memory->length = length;  // the constructor's `unsigned long` may have cut it
-  }
+  memory->length = length;  // the constructor takes an `unsigned long`: 32 bits on Windows
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));
 }
 
