@@ -286,8 +286,8 @@ class Refusals(CommandTest):
         self.folder.chmod(0o755)
         (self.folder / "a").chmod(0)
         self.addCleanup((self.folder / "a").chmod, 0o700)
-        nobody = {"user": 65534, "group": 65534, "extra_groups": []}  # root reads anything
-        options = nobody if os.geteuid() == 0 else {}
+        nobody = {"user": 65534, "group": 65534, "extra_groups": []}
+        options = nobody if os.geteuid() == 0 else {}  # root reads anything
         try:
             subprocess.run([COMMAND, "--version"], check=True, capture_output=True, **options)
         except PermissionError:
