@@ -24,7 +24,7 @@ class Runner {
 
  private:
   int runSource(Source& source);
-  std::unique_ptr<Batch> nextBatch(Source& source) const;  // waits only for its first file
+  std::unique_ptr<Batch> nextBatch(Source& source) const;  // waits for the first file only
   void work(Batch& batch) const;
   void prepare(Outcome& outcome) const;
   void emitOldest();
@@ -98,9 +98,11 @@ std::unique_ptr<Batch> Runner::nextBatch(Source& source) const {
   auto batch = std::make_unique<Batch>();
   batch->inputs.reserve(batchSize_);
   Input input;
-  while (batch->inputs.size() < batchSize_ && (batch->inputs.empty() || source.isReady()) &&
-         source.next(input)) {
+  while (source.next(input)) {
     batch->inputs.push_back(std::move(input));
+    if (batch->inputs.size() >= batchSize_ || !source.isReady()) {
+      break;
+    }
   }
   return batch;
 }
@@ -147,15 +149,14 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  progress_.count(!outcome.problem, outcome.isShown);
-  // With --why, the output for people states the problem already. Output for programs replaces the
-  // message only with --quiet.
-  bool const isOutputEnough =
-      outcome.isShown && (form.isExplanation() || (options_.isQuiet && form.isForMachines()));
-  if (outcome.problem && !isOutputEnough) {
+  progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
+  // With --quiet, output for programs replaces the message; with --why, output for people does.
+  bool const isOutputEnough = form.isForMachines() ? options_.isQuiet : form.isExplanation();
+  if (outcome.problem && !(outcome.isShown && isOutputEnough)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);
   }
-  if (outcome.problem && outcome.isShown && std::exchange(isErrorHintDue_, false)) {
+  if (outcome.problem && outcome.isShown && isErrorHintDue_) {
+    isErrorHintDue_ = false;
     console_.printMessage(
         "the rows of files without a record do not say why: add error to --fields");
   }

@@ -9,7 +9,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD that has NewSubfileType and is not reduced; null if none is, or on failure.
+/// The first SubIFD that has NewSubfileType and is no reduced image; null: none, or a failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);
@@ -19,7 +19,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
     auto subIFD =
         readDirectoryAt(stream, {"SubIFD", kWholeFile, i + 1, count}, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
-    ValuePointer type = nullptr;
+    ValuePointer type = nullptr;  // stays null if the entry is absent
     if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {
       return nullptr;
     }
@@ -68,7 +68,7 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;
+  DirectoryPointer exifIFD;  // not needed here
   return readExifIFD(*this, stream, mainIFD,
                      {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
                      exifIFD);

@@ -13,9 +13,9 @@
 
 namespace quavel::detail {
 
-/// Whether numbers read from the stream must have their bytes reversed for the host.
+/// Whether numbers read from the stream must have their bytes reversed for this machine.
 inline bool needsReversal(QVStream const& stream) {
-  bool const isKnown =  // with any other value, which a host may set, nothing is converted
+  bool const isKnown =  // a host may set any other value: then nothing is converted
       stream.byteOrder == ByteOrder::BigEndian || stream.byteOrder == ByteOrder::LittleEndian;
   return isKnown && stream.byteOrder != stream.hostOrder;
 }
@@ -52,7 +52,7 @@ Number numberAt(std::uint8_t const* bytes, bool isReversed) {
   return number;
 }
 
-/// Sum and difference that wrap around: hosts choose the numbers, and overflow would be undefined.
+/// Sum and difference that wrap around: hosts may set any offset, and overflow would be undefined.
 inline std::int64_t wrappingSum(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) + static_cast<std::uint64_t>(b));
 }
@@ -77,14 +77,14 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
   }
 }
 
-// The last offset at which a read may start. Where `long` has 32 bits, that is 1 MB before the
-// largest one: even a directory of 65535 entries that begins there ends at a valid offset.
 inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
+/// The last offset at which a read may start. Where `long` has 32 bits, that is 1 MB before the
+/// largest one: even a directory of 65535 entries that begins there ends at a valid offset.
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
-/// Where a walk goes when a box ends beyond all offsets; no read succeeds there. Where `long` has
-/// 32 bits, a box around it that does so too ends 1 later: the walk there goes on and then fails.
+/// Where `leaveBox` goes when a box ends beyond all offsets; no read succeeds there. Where `long`
+/// has 32 bits, `endOfBox` of the box around it is 1 more, so a walk inside that goes on and fails.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
@@ -102,22 +102,24 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered == static_cast<std::int64_t>(count)) {
     return true;
   }
-  if (delivered < 0) {  // a short read is no failure, or `QVReadAheadStream` has noted one
+  // Too few bytes need no note: the data ends, or `QVReadAheadStream` has noted a failure.
+  if (delivered < 0) {
     noteReadResult(stream, delivered, /*error=*/0);
   }
   return false;
 }
 
-/// Reads until `count` bytes are received or the data ends, since a stream may deliver fewer at a
-/// time than asked for. Returns how many were received.
+/// Calls `readBuffer` until `count` bytes are received or no more come. Returns how many came.
 inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::size_t count) {
   std::size_t received = 0;
   while (received < count) {
-    std::int64_t const delivered = stream.readBuffer(destination + received, count - received);
-    if (delivered <= 0 || static_cast<std::uint64_t>(delivered) > count - received) {
-      if (delivered != 0) {  // at 0 the data ends; more than asked for is a failure, as -1 is
-        noteReadResult(stream, -1, /*error=*/0);
-      }
+    std::size_t const wanted = count - received;
+    std::int64_t const delivered = stream.readBuffer(destination + received, wanted);
+    if (delivered == 0) {  // the data ends
+      break;
+    }
+    if (delivered < 0 || static_cast<std::uint64_t>(delivered) > wanted) {
+      noteReadResult(stream, -1, /*error=*/0);
       break;
     }
     received += static_cast<std::size_t>(delivered);

@@ -22,7 +22,7 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   source.setOffset(0);
   bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` now says 0; any other says the low bits of the target.
+  // A source that ignores `baseOffset` is still at 0; one that moved gives the target's low bits.
   return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -61,8 +61,8 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  // From 0: a source that refuses the seek stays there. Going to its end counts as accepting it.
   sourcePosition_ = -1;
+  // A source that refuses the seek stays at 0; one that goes to its end instead is taken to accept.
   source_->setOffset(0);
   if (fitsLong(target)) {
     source_->setOffset(static_cast<long>(target));
@@ -78,8 +78,8 @@ std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_
 
 std::size_t QVReadAheadStream::copyFrom(Block const& block, std::uint8_t* destination,
                                         std::size_t count) {
-  auto const skipped = static_cast<std::uint64_t>(position_ - block.start);
-  if (count == 0 || position_ < block.start || skipped >= block.size) {
+  std::int64_t const skipped = position_ - block.start;
+  if (count == 0 || skipped < 0 || static_cast<std::uint64_t>(skipped) >= block.size) {
     return 0;
   }
   std::size_t const copied = std::min(count, block.size - static_cast<std::size_t>(skipped));
@@ -94,21 +94,19 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
     fetch(first_, firstSize_, needed);
     return;
   }
-  std::size_t const longest = std::max(firstSize_, nextSize_);
+  std::size_t const largerSize = std::max(firstSize_, nextSize_);
   if (!last_.bytes) {
-    last_.bytes.reset(new std::uint8_t[longest]);
+    last_.bytes.reset(new std::uint8_t[largerSize]);
   }
-  // A sequential read is likely to go on, so it gets the larger block.
-  bool const isSequential = position_ == sourcePosition_;
-  fetch(last_, isSequential ? longest : nextSize_, needed);
+  bool const isSequential = position_ == sourcePosition_;  // such reads are likely to go on
+  fetch(last_, isSequential ? largerSize : nextSize_, needed);
 }
 
 void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t needed) {
-  block.size = 0;  // for a source that overwrites the bytes and then throws
+  block.size = 0;  // the source may overwrite the bytes and then throw
   errno = 0;       // a host's stream may fail without setting it
   std::int64_t delivered = readSource(block, wanted);
-  if (delivered < 0 && needed < wanted) {
-    // The fault may lie beyond the bytes that are needed.
+  if (delivered < 0 && needed < wanted) {  // the fault may lie beyond the needed bytes
     delivered = readSource(block, needed);
   }
   detail::noteReadResult(*this, delivered, errno);
@@ -117,12 +115,12 @@ void QVReadAheadStream::fetch(Block& block, std::size_t wanted, std::size_t need
 }
 
 std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count) {
-  // From here on the source's position is unknown, until the read succeeds.
-  bool const mustSeek = std::exchange(sourcePosition_, -1) != position_;
+  bool const mustSeek = sourcePosition_ != position_;
+  sourcePosition_ = -1;  // not known until the read succeeds
   if (mustSeek) {
     if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
-    } else if (!sourceAccepts(position_)) {  // which seeks there
+    } else if (!sourceAccepts(position_)) {  // moves the source there
       return -1;
     }
   }

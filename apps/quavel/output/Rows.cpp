@@ -6,15 +6,14 @@ namespace app::rows {
 
 namespace {
 
-constexpr std::size_t kLeastWidth = 3;      // of the column of a chosen field
-constexpr std::size_t kLeastPathWidth = 8;  // the same if the field is the path
+constexpr std::size_t kLeastWidth = 3;      // of a chosen field's column, in cells
+constexpr std::size_t kLeastPathWidth = 8;  // the same for the path's column
 constexpr std::size_t kDateColumn = 1;      // its index among the default columns
 constexpr std::size_t kDay = 10;            // the length of "2018-02-21"
 constexpr std::size_t kMinute = 16;         // the length of "2018-02-21 12:08"
 
 std::vector<Column> defaultColumns() {
-  // Label, least width, rank (the highest is left out first, 0 never), whether it is cut at its
-  // start.
+  // Label, least width, rank (the highest is left out first, 0 never), cut at its start or not.
   return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};

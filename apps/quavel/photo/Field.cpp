@@ -18,7 +18,7 @@ using quavel::QVMetadata;
 constexpr std::size_t kMaxCells = 200;            // of a terminal
 constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // combining marks take bytes, but no cells
 
-/// A member's value; absent when the member holds -1, NaN or an empty text, which stand for that.
+/// A member as a `Value`: none when the member is -1, NaN or an empty text.
 template <class T>
 Value presentOrAbsent(T value) {
   if constexpr (std::is_same_v<T, std::string>) {
@@ -41,7 +41,7 @@ Value captureDate(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The same, but skips blank dates; QVMetadata::captureDate does not.
+/// The first date for which `isAbsent` is false; QVMetadata::captureDate skips only empty ones.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -79,7 +79,7 @@ std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
 
-/// Puts a value, which must not be absent, into words by `field.words`.
+/// Visits the function in a field's `words`: calls it with the value, which must be present.
 struct PutIntoWords {
   Value const& value;
   template <class T>
@@ -164,7 +164,7 @@ Fields recordFields() {
 
 std::string inWords(Field const& field, Outcome const& outcome) {
   if (field.value == path) {
-    return escapedPath(outcome.path);  // shows bytes that are not UTF-8 too
+    return escapedPath(outcome.path);  // the value has lost the bytes that are not UTF-8
   }
   Value const value = field.value(outcome);
   if (isAbsent(value)) {
@@ -176,9 +176,10 @@ std::string inWords(Field const& field, Outcome const& outcome) {
 }
 
 bool isAbsent(Value const& value) {
-  auto const* const text = std::get_if<std::string>(&value);
-  return text != nullptr ? text->find_first_not_of(" :") == std::string::npos
-                         : std::holds_alternative<std::monostate>(value);
+  if (auto const* const text = std::get_if<std::string>(&value)) {
+    return text->find_first_not_of(" :") == std::string::npos;
+  }
+  return std::holds_alternative<std::monostate>(value);
 }
 
 Value comparedValue(Field const& field, Outcome const& outcome) {

@@ -11,7 +11,7 @@
 
 namespace app {
 
-/// An exact value; the first alternative is absence. Texts are UTF-8.
+/// An exact value; std::monostate: there is none. Texts are UTF-8.
 using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
 /// A function that puts a value of its parameter's type into words.
@@ -29,8 +29,7 @@ struct Field {
 
 using Fields = std::vector<Field const*>;
 
-/// All fields: path, captureDate, the record's members in their order, then error, reason,
-/// position and pathBytes.
+/// All fields: path, captureDate, the record's members, then error, reason, position, pathBytes.
 std::vector<Field> const& allFields();
 /// Null when there is no such field.
 Field const* fieldNamed(std::string_view name);
@@ -38,18 +37,18 @@ bool contains(Fields const& fields, std::string_view name);
 /// The fields of a file that gave a record: those before error.
 Fields recordFields();
 
-/// The field for people: in words, on one line, safe for a terminal and at most 200 of its cells
-/// long (a path is never cut). Empty when absent.
+/// The field for people: in words, on one line, safe for a terminal and at most 200 terminal
+/// cells long (a path is never cut). Empty if its value `isAbsent`.
 std::string inWords(Field const& field, Outcome const& outcome);
 
 /// Whether there is no value, or only blanks and colons, which cameras without a clock write.
 bool isAbsent(Value const& value);
 
-/// The value to sort and select files by: for captureDate, the first date that is not blank.
+/// The value to sort and select by: for captureDate, the first date for which `isAbsent` is false.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, a number with the digits that give it exactly
-/// when read back, or "Infinity", "true" or "false". Nothing when absent.
+/// when read back, or "Infinity", "true" or "false". Nothing when there is none.
 void appendExact(std::string& text, Value const& value);
 
 }  // namespace app
