@@ -25,22 +25,22 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
-  // From the last box, `leaveBox` may have gone short of its end, to where no read may start.
+  // If the previous box ends beyond all offsets, `leaveBox` has stopped at `kOutOfReach` instead.
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
-    std::int64_t const nextBox = std::max(std::int64_t{start}, context.lastEnd);
+    std::int64_t const nextBox = std::max(std::int64_t{start}, context.previousEnd);
     return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
                      "the header of the next box{}", context);
   }
   // A size below the header's would lead the walk back to this box, or into its header. The
-  // standard gives 0 and 1 a meaning, but no metadata follows such a box.
+  // standard gives 0 and 1 a meaning; they are refused too, as no metadata follows such a box.
   if (header.boxSize < box::kHeaderSize) {
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
                   PlacedBox{header.boxType, position}, context, header.boxSize,
                   meaningOf(header.boxSize));
   }
-  context.lastEnd = wrappingSum(start, header.boxSize);
+  context.previousEnd = wrappingSum(start, header.boxSize);
   leaveBox(*stream, endOfBox(start, header));
   return true;
 }

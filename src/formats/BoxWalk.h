@@ -27,8 +27,8 @@ void append(std::string& out, PlacedBox box);
 /// Where a box was met, as a note says it after the box: " in the moov box at 0x18 (24)".
 struct BoxContext {
   char const* text = "";
-  PlacedBox parent = {};     ///< Appended to the text; type 0: there is none.
-  std::int64_t lastEnd = 0;  ///< The offset where the last box ends; perhaps out of reach.
+  PlacedBox parent = {};         ///< Appended to the text; type 0: there is none.
+  std::int64_t previousEnd = 0;  ///< The offset where the previous box ends; perhaps out of reach.
 };
 void append(std::string& out, BoxContext context);
 
@@ -39,7 +39,7 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box, or to `kOutOfReach`, where no read succeeds, if that comes first.
+/// Moves to the end of a box, but no further than `kOutOfReach`, where no read succeeds.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

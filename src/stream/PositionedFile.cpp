@@ -27,7 +27,7 @@ constexpr auto kSlowRead = std::chrono::microseconds(40);  // a cached block tak
 constexpr int kFilesAfterSlowRead = 64;
 std::atomic<int> filesToAdvise{1};  // how many more get the advice; lost updates do no harm
 
-/// A file and the stream that reads it ahead, in one allocation.
+/// A file and the read-ahead stream over it, in one allocation.
 struct ReadAheadFile {
   explicit ReadAheadFile(std::string const& path) : file(path) {}
 
@@ -98,9 +98,9 @@ long PositionedFile::getOffset() {
 
 void PositionedFile::setOffset(long const& offset) {
   std::int64_t const target = wrappingSum(baseOffset, offset);
-  bool const isAccepted =  // the seek only asks the file system for its limit: no read needs it
-      target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
-  if (isAccepted) {
+  // Each read states its position: the seek only asks whether the file system accepts a high one.
+  bool const isValid = target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
+  if (isValid) {
     position_ = target;
   }
 }

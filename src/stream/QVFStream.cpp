@@ -21,7 +21,8 @@ std::int64_t QVFStream::readBuffer(std::uint8_t* destination, std::size_t count)
 
 long QVFStream::getOffset() {
   std::int64_t const position = fd == -1 ? 0 : file::position(fd);
-  return static_cast<long>(detail::wrappingDifference(position, baseOffset));  // hosts set any base
+  // A host may set any `baseOffset`: a plain difference might overflow.
+  return static_cast<long>(detail::wrappingDifference(position, baseOffset));
 }
 
 void QVFStream::setOffset(long const& offset) {

@@ -13,7 +13,7 @@ namespace quavel::detail {
 
 namespace {
 
-// Enough for most directories. At 9 bytes each just below 1 KB, up to which allocators are fast.
+// Enough for most directories, and at 9 bytes each just below 1 KB: more is slower to allocate.
 constexpr std::size_t kReservedValues = 112;
 
 // A damaged directory may declare 65535 entries: what is reserved for them has a bound.
@@ -56,8 +56,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // If the stream ignores the later seek to the values, they are read from where it stands. That
-    // must be after this entry, not where the walk's reading ahead has ended.
+    // A stream may ignore the seek to an entry's values: they are then read from where it stands.
+    // That must be right after the entry, however far the walk has read ahead.
     if (!seek(stream, walk.nextOffset()) || !walk.parseRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
@@ -68,7 +68,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     }
   }
 
-  // Reading values may have moved the stream. The seek fails only beyond all offsets.
+  // The walk may stop early, and values lie elsewhere. The seek fails only beyond all offsets.
   if (!seek(stream, walk.endOffset())) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }

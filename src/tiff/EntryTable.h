@@ -81,17 +81,15 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
-// Values as hosts get them: one block, which lives as long as a host keeps any of its values.
-
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
-/// Pointers to `count` values of a block from `first` on; each keeps the block alive.
+/// Pointers for a host to `count` values of a block from `first` on; each keeps the block alive.
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// What a row keeps of an UNDEFINED entry. If it has up to 4 bytes: the bytes as in the file, with
-/// zeros for those beyond the end of the data. If it has more: their offset.
+/// What is kept of an UNDEFINED entry: up to 4 bytes as in the file, with zeros for those that the
+/// data lacks. Of more than 4 bytes, only their offset.
 std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed);
 
 /// Stores in an entry for a host what `bytesOrOffsetOf` gave, and the `count` of the bytes.

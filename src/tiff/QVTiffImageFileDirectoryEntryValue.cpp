@@ -60,8 +60,7 @@ Integer truncated(double number) {
   return static_cast<Integer>(number);
 }
 
-/// The result of `convert` for the value in its own type. 0 for UNDEFINED and for an unknown type:
-/// a host may set `type` to anything.
+/// Calls `convert` with the value as a number of its own type. 0 for UNDEFINED or an unknown type.
 template <class Convert>
 auto converted(EntryValue const& value, Convert const& convert) -> decltype(convert(0)) {
   switch (value.type) {
@@ -92,8 +91,8 @@ auto converted(EntryValue const& value, Convert const& convert) -> decltype(conv
   return 0;
 }
 
-/// The value as 32 bits. Integers are sign- or zero-extended as their own type requires; floats
-/// saturate at the limits of `Integer`, which also has 32 bits; fractions are divided.
+/// The value as 32 bits. `Integer`, int32 or uint32, sets the limits at which floats saturate.
+/// Integers are sign- or zero-extended as their own type requires; fractions are divided.
 template <class Integer>
 std::uint32_t to32Bits(EntryValue const& value) {
   return converted(value, [](auto number) {
@@ -148,8 +147,8 @@ bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream)
       if (type == EntryValueType::DOUBLE) {
         return readInto(*this, *stream, &QVStream::readDouble);
       }
-      return readInto(*this, *stream, &QVStream::readLong) &&
-             readInto(*this, *stream, &QVStream::readLong, 4);  // a fraction is two numbers
+      return readInto(*this, *stream, &QVStream::readLong) &&  // a fraction: two numbers
+             readInto(*this, *stream, &QVStream::readLong, /*position=*/4);
     default:
       return false;  // UNDEFINED, or an unknown type: `type` is public
   }

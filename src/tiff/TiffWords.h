@@ -20,7 +20,7 @@ struct TypedCount {
   std::uint16_t typeCode;
 };
 
-/// Stands for the name of a TIFF structure that is the whole file: notes do not name it.
+/// In place of a TIFF structure's name: the structure is the whole file, which notes do not name.
 inline constexpr char const* kWholeFile = nullptr;
 
 /// The name of a directory or a header in a TIFF structure: "IFD0 of the Exif segment".

@@ -8,16 +8,17 @@ namespace app {
 
 namespace {
 
-bool needsEscape(std::string const& text) {
+bool mayNeedEscapes(std::string const& text) {
   return !isPlain(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
 }
 
-/// Appends a value that is not absent. The JSON library writes the few texts that need escapes. If
-/// such a text could steer a terminal, the terminal gets \uNNNN for all that is not ASCII.
+/// Appends a value that is not absent. An infinity is quoted: JSON has no number for it. The JSON
+/// library writes the few texts that may need escapes. If such a text could steer a terminal, the
+/// terminal gets \uNNNN for all that is not ASCII.
 void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
-  if (text != nullptr && needsEscape(*text)) {
+  if (text != nullptr && mayNeedEscapes(*text)) {
     bool const asAscii = isForTerminal && escaped(*text) != *text;
     json += nlohmann::json(*text).dump(-1, ' ', asAscii, nlohmann::json::error_handler_t::replace);
   } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
@@ -31,7 +32,7 @@ void appendValue(std::string& json, Value const& value, bool isForTerminal) {
 
 constexpr char const* kKinds[] = {"refusal", "limit", "step", "absence", "hint"};  // by QVNoteKind
 
-/// The notes as a JSON member; what does not apply to a note is left out.
+/// The notes as JSON members, such as `,"notes":[]`; what does not apply to a note is left out.
 std::string notesOf(Outcome const& outcome, bool isForTerminal) {
   auto notes = nlohmann::ordered_json::array();
   for (auto const& note : outcome.notes) {
@@ -49,7 +50,7 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
     notes.push_back(std::move(object));
   }
   std::string const further = ",\"furtherSteps\":" + std::to_string(outcome.furtherSteps);
-  return ",\"notes\":" + notes.dump(-1, ' ', isForTerminal) +
+  return ",\"notes\":" + notes.dump(-1, ' ', /*ensure_ascii=*/isForTerminal) +
          (outcome.furtherSteps == 0 ? "" : further);
 }
 
@@ -88,9 +89,9 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // Where there is a path, its pathBytes follow; only a path that is not valid UTF-8 has any.
-  bool const recordLacksPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, recordLacksPathBytes, ofRecord = membersOf(fields),
+  // An object with a path also gets its pathBytes, which only a path that is not UTF-8 has.
+  bool const recordNeedsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
+  return [&form, isForTerminal, recordNeedsPathBytes, ofRecord = membersOf(fields),
           ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
                                  fieldNamed("position")}),
           pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
@@ -98,11 +99,11 @@ TextOf jsonObjects(Form const& form, bool isForTerminal) {
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
     appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome,
                   form.showAbsent.value_or(true), isForTerminal);
-    if (!outcome.record || recordLacksPathBytes) {
+    if (!outcome.record || recordNeedsPathBytes) {
       appendMembers(object, pathBytes, outcome, /*showAbsent=*/false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
-    object.replace(0, 1, "{");  // in place of the first comma, if there are members
+    object.replace(0, 1, "{");  // in place of the first comma; an empty object has none
     object += form.kind == FormKind::Jsonl ? "}\n" : "}";
     return object;
   };
