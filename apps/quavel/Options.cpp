@@ -126,7 +126,7 @@ void addChoices(CLI::App& command, Options& options) {
 /// Refuses what the parser cannot judge, and normalizes the extension.
 void finish(Options& options) {
   if (options.fromStdin) {
-    options.extension = extensionOf("." + options.extension);  // of "nef" and ".nef" alike: "nef"
+    options.extension = extensionOf("." + options.extension);  // "nef" and ".nef" both give "nef"
     std::string const unknown = whyUnknown(options.extension);
     if (!unknown.empty()) {
       throw CLI::ValidationError("--extension: " + unknown);

@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  BoxContext context = {" before a moov box was met"};  // for notes: where a box was met
+  BoxContext context = {" before a moov box was met"};  // what notes say after a box
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
@@ -73,7 +73,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  // All fields of the box are copied, even these two dates, which are always empty.
+  // A CMT1 box gives neither of these two dates: what the record held before is cleared.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

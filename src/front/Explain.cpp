@@ -16,7 +16,7 @@ constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 /// A field of the record that can be absent.
 struct FieldRow {
   char name[22];
-  std::uint8_t rowsToOrigin;  ///< How far down is the field it is computed from; 0: not computed.
+  std::uint8_t rowsToOrigin;  ///< Rows down to the field that it is computed from; 0: not computed.
   std::uint8_t families;      ///< Whose readers fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
 };
@@ -119,14 +119,14 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       continue;
     }
     if ((row.families & format.family) == 0) {
-      // Only ISO base media files have their signature elsewhere than at 0; a brand follows it.
+      // Only the signatures of ISO base media files are not at 0. A brand follows their "ftyp".
       bool const hasBrand = row.position != 0 && received >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
       for (QVNote& note : journal.notes) {
         if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
-          note.reason = QVReason::OtherKind;  // says more than where the wrong reader failed
+          note.reason = QVReason::OtherKind;  // says more than how the wrong reader failed
         }
       }
       journal.hint(QVReason::OtherContent, start,

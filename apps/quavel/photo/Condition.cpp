@@ -34,11 +34,11 @@ constexpr Relation kRelations[] = {
     {"!=", meets<std::not_equal_to<>>},  {"==", meets<std::equal_to<>>},
     {"=", meets<std::equal_to<>>},       {">", meets<std::greater<>>},
     {"<", meets<std::less<>>},           {"~", containsText}};
-// What a value must be, by the index of its type in Words.
+// For each alternative of Words, in their order: what a value must be.
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// Visits a field's `words`: the whole text as a value of the type that they take, or absent.
+/// Parses the whole text as the type that the visited function of Words takes; absence if it fails.
 struct ParseFor {
   std::string_view text;
 
@@ -52,8 +52,8 @@ struct ParseFor {
     } else {
       auto const* const end = text.data() + text.size();
       auto const result = std::from_chars(text.data(), end, value);
-      bool const isWhole = result.ec == std::errc() && result.ptr == end;
-      return isWhole && value == value ? Value(value) : Value();  // NaN is not equal to itself
+      bool const isParsed = result.ec == std::errc() && result.ptr == end;
+      return isParsed && value == value ? Value(value) : Value();  // NaN is not equal to itself
     }
   }
 };

@@ -23,7 +23,7 @@ constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
 Problem irregular(mode_t mode) {
-  if (S_ISDIR(mode)) {  // from a list of paths (a folder given as an argument is walked)
+  if (S_ISDIR(mode)) {  // only from a list of paths: a folder given as an argument is walked
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
   char const* const socketOrDevice = S_ISSOCK(mode) ? "socket" : "device";
