@@ -52,7 +52,7 @@ void Pipeline::submit(std::unique_ptr<Batch> batch) {
   Batch* const submitted = batch.get();
   order_.push_back(std::move(batch));
   std::size_t const usefulThreads = std::min(maxThreads(), order_.size());
-  // The first batch may be all there is, often a single file: it is not worth starting a thread.
+  // The first batch may be all there is, often a single file: no thread is worth starting for it.
   if (jobs_ > 1 && hasSubmitted_ && threads_.size() < usefulThreads) {
     startThread();
   }
@@ -112,7 +112,7 @@ void Pipeline::workOn(Batch& batch) {
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file does not wait, reading any other does. The majority decides.
+  // Reading a cached file never waits; reading any other does, at least once. The majority decides.
   if (isMeasured) {
     waitsForDisk_ = 2 * (countWaits() - waitsBefore) > static_cast<long>(batch.inputs.size());
   }

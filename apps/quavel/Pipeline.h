@@ -29,8 +29,8 @@ struct Batch {
 
 /// In seconds: a longer batch holds results back, a far shorter one is not worth handing over.
 constexpr double kLongBatch = 0.002;
-/// How many files the next batch should have, if the last one had `size`: half as many if the batch
-/// `done` took too long or gave too much text, else twice as many, up to a maximum.
+/// How many files the next batch should have, `size` being the number so far: half as many if the
+/// batch `done` took too long or gave too much text, else twice as many, up to a maximum.
 std::size_t nextBatchSize(Batch const& done, std::size_t size);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.

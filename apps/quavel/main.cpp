@@ -23,7 +23,7 @@
 namespace {
 
 /// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. Reading a folder fails, while /dev/null would look like an empty list.
+/// descriptor. A list of paths cannot be read from a folder; /dev/null would pass for an empty one.
 void holdStandardStreams() {
   int fd = -1;
   do {  // each `open` takes the lowest free descriptor

@@ -17,7 +17,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;
+  DirectoryPointer exifIFD;  // `readExifIFD` stores its values
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;

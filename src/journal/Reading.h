@@ -35,7 +35,7 @@ class Reading {
 
   Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
-  /// False: the record may be of a host's class, which must get directories with `entries`.
+  /// False: the record may be of a host's class, which needs each directory's public `entries`.
   bool isOwnRecord = false;
 
  private:
@@ -53,7 +53,7 @@ class ReadScope {
       stream_.reading_.current = &begun_;
     }
   }
-  /// For `readStream` and a record of the library's own class: begins a read, even during another.
+  /// For `readStream`: begins a read even during another. The record is of the library's own class.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
     begun_.journal = journal;
     begun_.isOwnRecord = true;
@@ -81,7 +81,7 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal whether `readBuffer` failed (`delivered` < 0) and why (`errno`; 0: unknown).
+/// Tells the journal whether a read failed: `delivered` is then < 0, `error` the `errno` if known.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.

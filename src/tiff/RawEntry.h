@@ -12,16 +12,16 @@
 
 namespace quavel::detail {
 
-// The layout of a directory entry in bytes (TIFF 6.0). Positions are counted from its start.
+// A directory entry in bytes (TIFF 6.0): tag, type, value count, field for values or their offset.
 inline constexpr std::size_t kEntryTagSize = 2;
 inline constexpr std::size_t kEntryTypePosition = 2;
 inline constexpr std::size_t kValueCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize = 2;  // of the number of entries, before the first
+inline constexpr std::int64_t kEntryCountSize = 2;  // of the entry count, before the first entry
 
-inline constexpr std::uint16_t kUndefinedCode = 7;  // of the field type UNDEFINED
+inline constexpr std::uint16_t kUndefinedCode = 7;  // of the type UNDEFINED
 
 /// What follows the tag in a directory entry, not yet interpreted.
 struct RawEntry {
@@ -38,7 +38,6 @@ inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 /// Bytes of one value, by EntryValueType (not by the type's code in the file); 0 for UNDEFINED.
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
-/// Whether the code stands for a field type.
 inline bool isKnown(std::uint16_t typeCode) {
   return typeCode != 0 && typeCode < fieldTypeToValueType.size();
 }
@@ -56,7 +55,7 @@ inline std::uint64_t sizeOfValues(RawEntry const& entry) {
   return std::uint64_t{entry.count} * (entry.typeCode == kUndefinedCode ? 1 : kValueSizes[type]);
 }
 
-/// How many bytes of the field an entry of a known type uses.
+/// How many bytes of the field the values, or their offset, take. The type must be known.
 inline std::size_t usedFieldSize(RawEntry const& entry) {
   return static_cast<std::size_t>(std::min<std::uint64_t>(sizeOfValues(entry), kEntryFieldSize));
 }

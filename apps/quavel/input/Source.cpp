@@ -54,7 +54,7 @@ bool Source::nextOfPaths(Input& input) {
 /// Drops the CR that lists from other systems have after each path, unless a file's name has it.
 void Source::dropCarriageReturn(std::string& path) {
   struct stat status = {};
-  bool const mayDrop = !inputs_.isNulSeparated && path.back() == '\r';  // no path is empty
+  bool const mayDrop = !inputs_.isNulSeparated && path.back() == '\r';  // no listed path is empty
   if (!mayDrop || ::lstat(path.c_str(), &status) == 0) {
     return;
   }

@@ -93,8 +93,8 @@ void Table::add(Outcome&& outcome) {
     keepsRecords_ = false;
   }
   auto const now = std::chrono::steady_clock::now();
-  bool const isFirstPage = natural_.empty();  // timed from the start of the command
-  if (page_.empty() && !isFirstPage) {
+  bool const isFirstPage = natural_.empty();
+  if (page_.empty() && !isFirstPage) {  // the first is timed from the start of the command
     pageStart_ = now;
   }
   if (!outcome.cells.empty()) {
@@ -200,9 +200,10 @@ void Table::writeHeader() {
   output_.add(lineOf(columns_, widths_, labels));
 }
 
-/// The widths at which no column cuts a text of the page, `asShown`; 0 hides an empty column.
+/// The widths that hold the page's texts uncut, as `asShown` gives them; 0 hides an empty column.
 Widths Table::naturalWidths(bool mustShowEmpty) const {
-  bool const showEmpty = mustShowEmpty || form_.showAbsent.value_or(!form_.fields.empty());
+  bool const areFieldsChosen = !form_.fields.empty();  // empty columns then show by default
+  bool const showEmpty = mustShowEmpty || form_.showAbsent.value_or(areFieldsChosen);
   Widths natural(columns_.size(), 0);
   for (auto const& row : page_) {
     auto const shown = asShown(row);
