@@ -14,9 +14,9 @@ constexpr unsigned kMaxJobs = 256;
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
-/// Drops slashes at a glob's end. A glob that still has one matches whole paths or ends of paths.
+/// Drops slashes at a glob's end. A glob with a slash elsewhere matches whole paths or their ends.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
-/// For a choice of two texts, such as "skip" (`no`) and "show" (`yes`): whether it is `yes`.
+/// Whether the choice is `yes`, such as "show", and not `no`, such as "skip".
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);
 /// A check that the parser calls: returns why the argument is wrong, or an empty text.

@@ -36,7 +36,7 @@ class EntryWalk {
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
   /// Buffers the current entry, which may move the stream. False: its tag is not all there.
-  bool bufferEntry() { return isBufferedUpTo(kEntryTypePosition) || fillBuffer(); }
+  bool bufferEntry() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
@@ -55,13 +55,13 @@ class EntryWalk {
   }
 
   /// The stream's offsets at which the next entry begins and the last entry ends.
-  std::int64_t nextOffset() const { return offset() + kSignedEntrySize; }
-  std::int64_t endOffset() const { return offset() + kSignedEntrySize * entriesLeft_; }
+  std::int64_t nextOffset() const { return entryOffset() + kSignedEntrySize; }
+  std::int64_t endOffset() const { return entryOffset() + kSignedEntrySize * entriesLeft_; }
 
  private:
   static constexpr std::int64_t kSignedEntrySize = kEntrySize;  // for sums with offsets
 
-  std::int64_t offset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
+  std::int64_t entryOffset() const { return bufferOffset_ + (entry_ - buffer_.data()); }
 
   /// Whether the buffer holds the current entry up to this position in the entry.
   bool isBufferedUpTo(std::size_t position) const {
@@ -75,13 +75,13 @@ class EntryWalk {
 
   /// Buffers the current entry and as many of those after it as fit.
   bool fillBuffer() {
-    bufferOffset_ = offset();  // before `entry_` changes, on which `offset` depends
+    bufferOffset_ = entryOffset();  // before `entry_` changes
     entry_ = buffer_.data();
     std::size_t const size = std::min(kEntrySize * entriesLeft_, buffer_.size());
     bool const isReached = seek(stream_, bufferOffset_);
     std::size_t const received = isReached ? readUpTo(stream_, buffer_.data(), size) : 0;
     bufferEnd_ = entry_ + received;
-    return isBufferedUpTo(kEntryTypePosition);
+    return isBufferedUpTo(kEntryTagSize);
   }
 
   QVStream& stream_;

@@ -39,7 +39,7 @@ PathList::PathList(std::string const& name, char separator)
       separator_(separator) {
   int const openError = fd_ == -1 ? errno : whyUnreadable(fd_);
   if (openError != 0) {
-    if (fd_ > STDIN_FILENO) {
+    if (fd_ != -1 && fd_ != STDIN_FILENO) {
       ::close(fd_);
     }
     throw std::system_error(openError, std::generic_category());
@@ -62,7 +62,7 @@ bool PathList::isReady() {
 
 bool PathList::next(Input& input) {
   std::string path;
-  while (path.empty() && (start_ < buffer_.size() || refill())) {
+  while (path.empty() && (start_ < buffer_.size() || !atEnd_)) {
     auto end = buffer_.find(separator_, start_);
     while (end == std::string::npos && refill()) {
       end = buffer_.find(separator_, start_);
@@ -80,7 +80,7 @@ bool PathList::refill() {
   }
   buffer_.erase(0, start_);
   start_ = 0;
-  if (buffer_.size() > 2 * kMaxPathLength) {  // no separator in it: one path, which is too long
+  if (buffer_.size() > 2 * kMaxPathLength) {  // no separator in it: one path, far too long
     buffer_.resize(kMaxPathLength + 1);       // enough for `inputFor` to see that
   }
   std::size_t const size = buffer_.size();

@@ -16,7 +16,7 @@ class PathList {
   PathList(PathList const&) = delete;
   PathList& operator=(PathList const&) = delete;
 
-  /// Whether `next` returns without waiting for the process that writes the list.
+  /// False: `next` would wait for the process that writes the list.
   bool isReady();
   /// The next path that is not empty, with a problem if it is too long or has a NUL in it. False:
   /// the list has ended, or a read failed.
@@ -25,7 +25,7 @@ class PathList {
   int error = 0;  ///< The `errno` of a read that failed.
 
  private:
-  bool refill();
+  bool refill();  // false: nothing more can be read
 
   int fd_;
   char separator_;

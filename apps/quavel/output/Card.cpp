@@ -10,7 +10,7 @@ namespace {
 
 constexpr std::size_t kLabelWidth = 17;  // with the blanks behind the label
 
-/// The fields of a card for which none are chosen, in the order in which people look for them.
+/// The fields of a card when none are chosen, in the order in which people look for them.
 Fields cardFields() {
   std::istringstream names(
       "captureDate model lensModel exposureTime fNumber iso focalLength focalLengthIn35mmFilm "

@@ -18,13 +18,13 @@ std::string cardOf(Form const& form, Outcome const& outcome);
 /// Why a file gives no record, or which fields its record lacks and why: a verdict, then details.
 std::string explanationOf(Outcome const& outcome);
 
-/// Comma-separated values by RFC 4180: a row for each file below the header row. Absent values are
+/// Comma-separated values by RFC 4180: a header row, then a row for each file. Absent values are
 /// empty. For a terminal, texts are made safe by `escaped`.
 std::string csvHeader(Form const& form);
 TextOf csvRows(Form const& form, bool isForTerminal);
 
-/// JSON objects, each on one line. The line end is there only for JSON Lines: in an array, a comma
-/// may come before it. An infinity, for which JSON has no number, is "Infinity" or "-Infinity".
+/// JSON objects, each on one line. For JSON Lines, each includes its line end; in an array, the
+/// writer adds commas and line ends. An infinity, which JSON lacks, is "Infinity" or "-Infinity".
 TextOf jsonObjects(Form const& form, bool isForTerminal);
 
 /// A table for people, laid out page by page so that no more than a page is ever held. On a

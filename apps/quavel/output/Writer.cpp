@@ -72,7 +72,7 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path, ended by a NUL. Without conditions, only of files that have a record.
+/// Each path, ended by a NUL. Files without a record are left out unless conditions select them.
 TextOf paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;

@@ -51,11 +51,11 @@ bool isHidden(Character const& character) {
   constexpr utf8proc_int32_t kNonJoiner = 0x200c;
   constexpr utf8proc_int32_t kJoiner = 0x200d;
   switch (utf8proc_category(character.code)) {
-    case UTF8PROC_CATEGORY_CC:
-    case UTF8PROC_CATEGORY_ZL:
-    case UTF8PROC_CATEGORY_ZP:
+    case UTF8PROC_CATEGORY_CC:  // control characters
+    case UTF8PROC_CATEGORY_ZL:  // the line separator
+    case UTF8PROC_CATEGORY_ZP:  // the paragraph separator
       return true;
-    case UTF8PROC_CATEGORY_CF:
+    case UTF8PROC_CATEGORY_CF:  // format characters
       // Scripts and emoji need the joiners; the Arabic signs that enclose a number are visible.
       return character.code != kNonJoiner && character.code != kJoiner &&
              utf8proc_get_property(character.code)->boundclass != UTF8PROC_BOUNDCLASS_PREPEND;
@@ -185,7 +185,7 @@ std::string keepEnd(std::string const& text, std::size_t width) {
   while (!kept.empty()) {
     std::string_view rest = kept;
     std::size_t const firstCells = cellsOf(takeCharacter(rest));
-    if (keptCells < width && firstCells > 0) {  // the "…" needs a cell, and no mark upon it
+    if (keptCells < width && firstCells > 0) {  // the "…" fits, and no mark would stand upon it
       break;
     }
     keptCells -= firstCells;
