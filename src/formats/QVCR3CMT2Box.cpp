@@ -44,7 +44,7 @@ bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryV
 }  // namespace
 
 bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
-  return readMetadataBox(*this, box::CMT2, stream);
+  return readMetadataBox(*this, box::CMT2, stream);  // calls `readExif`
 }
 
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {

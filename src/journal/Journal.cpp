@@ -66,7 +66,7 @@ std::string Journal::cutText(std::int64_t end) {
   if (dataSize() <= 0) {  // not known, or a 0 that may be wrong
     return "the data ends before that";
   }
-  bool const isInFile = end <= dataSize();
+  bool const isInFile = end <= dataSize();  // as when the file has grown since
   return isInFile ? "reading there fails" : composed("the file ends at {}", {Offset{dataSize()}});
 }
 

@@ -37,17 +37,17 @@ class Journal {
 
   /// The size of the data in bytes. -1: not known. 0: may be wrong, as for files in /proc.
   std::int64_t dataSize();
-  /// Why the last bytes asked for, up to `end`, were not all delivered: as a reason, as a text.
+  /// Why the bytes asked for last were not all delivered. `end`: the position after those bytes.
   QVReason cutReason() const;
   std::string cutText(std::int64_t end);
 
   std::vector<QVNote> notes;
-  std::uint64_t furtherSteps = 0;
-  char const* format = "";      ///< See `QVJournal::format`.
-  int fd = -1;                  ///< Of the file being read; -1: the data is not a file.
-  std::int64_t knownSize = -1;  ///< What `dataSize` gives, once it is known.
-  bool hasReadFailed = false;   ///< The last `readBuffer` failed, not only met the end of the data.
-  int systemError = 0;          ///< The `errno` of that failure, or of opening; 0: not known.
+  std::uint64_t furtherSteps = 0;  ///< Parts that `passed` only counted.
+  char const* format = "";         ///< See `QVJournal::format`.
+  int fd = -1;                     ///< Of the file being read; -1: the data is not a file.
+  std::int64_t knownSize = -1;     ///< What `dataSize` gives, once it is known.
+  bool hasReadFailed = false;      ///< The last `readBuffer` failed, not only met the data's end.
+  int systemError = 0;             ///< The `errno` of that failure, or of opening; 0: not known.
 
  private:
   void add(QVNoteKind kind, QVReason reason, std::int64_t position, std::string text);
@@ -59,7 +59,7 @@ class Journal {
   std::vector<QVNote> absences_;  // at most one for each field
 };
 
-/// Whether there is a journal that wants more than the refusal.
+/// Whether there is a journal that wants all notes.
 inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
 
 /// States why the read ends. Always false, so that a step can `return refuse(...)`.

@@ -47,7 +47,7 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// The size of a regular file. Another kind of file gives -1 too, but leaves `errno` as it is.
+/// The size of a regular file; -1 for any other kind of file, with `errno` left as it is.
 inline std::int64_t size(int fd) {
   struct stat status = {};
   bool const isRegular = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);
@@ -60,7 +60,7 @@ inline std::int64_t size(int fd) {
 
 inline constexpr bool kTakesAdvice = true;
 
-/// Advises the system to read ahead nowhere in the file: reads will be few and far apart.
+/// Advises the system not to read ahead in the file: reads will be few and far apart.
 inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
 
 /// Advises the system to fetch these `count` bytes now: they will be read soon.

@@ -19,12 +19,12 @@ bool Entry::convertToString(std::string& out) const {
   std::size_t length = 0;
   bool isText = true;
   for (; length < size_; ++length) {
-    auto const& character = *(*this)[length];
-    isText = character.type == EntryValueType::ASCII;
-    if (!isText || character.value[0] == '\0') {
+    ValuePointer const character = (*this)[length];
+    isText = character->type == EntryValueType::ASCII;
+    if (!isText || character->value[0] == '\0') {
       break;
     }
-    text[length] = static_cast<char>(character.value[0]);
+    text[length] = static_cast<char>(character->value[0]);
   }
   out.resize(length);
   return isText;

@@ -16,7 +16,7 @@ namespace detail {
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
 /// A view of the values of an entry in a reader's own directory or in a host's. The values must
-/// outlive it. As a bool: false when no entry was found.
+/// outlive the view. As a bool: false when no entry was found.
 class Entry {
  public:
   Entry() = default;
@@ -25,7 +25,7 @@ class Entry {
 
   explicit operator bool() const { return exists_; }
 
-  /// The number of values; 0 for an UNDEFINED entry.
+  /// The number of values; 0 for an UNDEFINED entry, which has bytes instead.
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 

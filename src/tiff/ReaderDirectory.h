@@ -33,8 +33,8 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   EntryTable table;
 };
 
-/// Reads the header like `QVTiffHeader::read`. `structure` is what notes call the TIFF structure,
-/// such as "the Exif segment", or `kWholeFile`.
+/// Does what `QVTiffHeader::read` does. `structure` is what notes call the TIFF structure, such as
+/// "the Exif segment"; with `kWholeFile` they do not name it.
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);
 

@@ -8,7 +8,7 @@
 
 namespace app {
 
-/// Automatic: the notes if they are wanted, else a card for a single file, else a table.
+/// Automatic: the notes with `hasNotes`, else a card for a single file, else a table.
 enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 
 /// How the files are shown.
@@ -18,7 +18,7 @@ struct Form {
   Field const* sort = nullptr;        ///< Null: the order of the input.
   bool isDescending = false;          ///< With `sort`: in descending order.
   std::vector<Condition> conditions;  ///< Only photos that meet them all are shown.
-  std::optional<bool> showAbsent;     ///< Not set: as suits `kind` and `fields`.
+  std::optional<bool> showAbsent;     ///< Absent fields too. Not set: as suits `kind` and `fields`.
   bool hasNotes = false;              ///< The notes of the read are shown.
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.

@@ -21,7 +21,7 @@ using Widths = std::vector<std::size_t>;
 /// The width of a line with columns of these widths and the gaps between them.
 std::size_t lineWidth(Widths const& widths);
 
-/// The `natural` widths, reduced as `columns` allow, for lines of at most `maxWidth` cells.
+/// The `natural` widths, which cut no text, reduced to a line of `maxWidth` cells if possible.
 Widths fit(std::vector<Column> const& columns, Widths natural, std::size_t maxWidth);
 
 /// One line of the table, with its line end.
