@@ -21,7 +21,7 @@ int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input inputFor(std::string const& path) {
   Input input;
-  if (path.find('\0') != std::string::npos) {
+  if (path.find('\0') <= kMaxPathLength) {  // further on, `refill` may have cut it off
     input.problem = {reason::kBadPath,
                      "the path holds a NUL; if the list is NUL-separated, add -0"};
   } else if (path.size() > kMaxPathLength) {
