@@ -27,7 +27,7 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
   char const* const pattern =
       hasWidth && hasHeight
           ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
-          : "{} does not give both sides";
+          : "{} does not give both sides";  // leaves out the numbers
   // The casts give the sides as they are in the file: from 2^31 on, they are negative as an `int`.
   noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile, pattern, placed(exifIFD),
              static_cast<std::uint32_t>(width), static_cast<std::uint32_t>(height));
@@ -38,7 +38,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;
   }
-  // What `noteSize` said of the last Exif directory; the note made here replaces it.
+  // The note from `noteSize`, if any. The note below replaces it, and so repeats its text.
   QVNote const* const exifNote = journal->absenceOf("width");
   std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =

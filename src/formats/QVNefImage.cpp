@@ -28,7 +28,7 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not used: `readExifIFD` stores its values
+  DirectoryPointer exifIFD;  // not used here: `readExifIFD` stores its values in the record
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;
@@ -52,7 +52,7 @@ bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> 
   }
   if (thumbnailWidth != kThumbnailWidth || thumbnailHeight != kThumbnailHeight) {
     return refuse(journalOf(ifd), QVReason::WrongImage, positionOf(ifd), "{} declares {} x {}; {}",
-                  placed(ifd), static_cast<std::uint32_t>(thumbnailWidth),
+                  placed(ifd), static_cast<std::uint32_t>(thumbnailWidth),  // unsigned in the file
                   static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRule);
   }
   return storeNumber(ifd, tag::Orientation, orientation);

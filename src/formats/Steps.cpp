@@ -147,7 +147,7 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  bool const isUndefined = row->typeCode == kUndefinedCode;  // `storeText` never refuses it
+  bool const isUndefined = row->typeCode == kUndefinedCode;  // refused only as a number
   return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
                 PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},

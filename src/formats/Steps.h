@@ -55,7 +55,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the record's field for this tag stays absent: the tag has no entry.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same when the entry's value is no use. `pattern` says so of the entry, its count and type.
+/// The same when the entry's value is no use. `pattern` takes the entry, then its count and type.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
 /// Refuses the tag's entry, which must exist: it does not hold what is `wanted`. Returns false.
@@ -69,7 +69,7 @@ inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileTyp
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory as notes name it. One made by a host has no table, but no note names it either.
+/// A directory as notes name it. A host's directory has no table, and no note names it.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};

@@ -61,7 +61,7 @@ void refuseExtension(Journal* journal, std::string const& extension) {
   for (auto const& format : kFormats) {
     known.append(known.empty() ? "" : " ").append(format.extension);
   }
-  if (extension.empty() || extension.find('/') != std::string::npos) {  // the "." is a folder's
+  if (extension.empty() || extension.find('/') != std::string::npos) {  // as in "a.d/photo"
     refuse(journal, QVReason::UnknownExtension, -1,
            "there is no extension; these name a format: {}", known);
     return;

@@ -18,7 +18,6 @@ class Journal;
 /// Families of formats that are read alike. Each is one bit, so that a number can hold a set.
 enum Family : unsigned { kTiff = 1, kNef = 2, kArw = 4, kJpeg = 8, kRaf = 16, kCr3 = 32 };
 
-/// What an extension stands for.
 struct Format {
   std::string_view extension;
   char const* name;  ///< Such as "JPEG".
@@ -36,13 +35,13 @@ Format const* formatOf(std::string_view extension);
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
 /// If the refused file, which begins at `start`, looks like another format: notes which one, and
-/// makes that the reason of the refusal.
+/// sets the refusal's reason to `OtherKind`, unless reading failed.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null. The journal may be null, here and below.
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal = nullptr);
 
-/// The record of the file that the stream holds, or null.
+/// The record of the file that the stream holds, or null. The extension must be in lower case.
 std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
                                        std::string const& extension, Journal* journal = nullptr);
 

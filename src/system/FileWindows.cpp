@@ -34,14 +34,15 @@ std::wstring withLongPathPrefix(std::wstring const& path) {
     return path;
   }
   std::vector<wchar_t> whole(size);
-  if (::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr) >= size) {
-    return path;  // the current folder has changed meanwhile, and `whole` is too small
+  DWORD const length = ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr);  // no NUL
+  if (length >= size) {  // `whole` is too small: the current folder has changed meanwhile
+    return path;
   }
   std::wstring const full = whole.data();
-  if (full.compare(0, 4, L"\\\\?\\") == 0) {
+  if (full.compare(0, 4, LR"(\\?\)") == 0) {
     return full;
   }
-  return full.compare(0, 2, L"\\\\") == 0 ? L"\\\\?\\UNC" + full.substr(1) : L"\\\\?\\" + full;
+  return full.compare(0, 2, LR"(\\)") == 0 ? LR"(\\?\UNC)" + full.substr(1) : LR"(\\?\)" + full;
 }
 
 int errorNumber(DWORD error) {
@@ -58,7 +59,7 @@ int errorNumber(DWORD error) {
     case ERROR_NOT_READY:
       return EIO;
     default:
-      return EACCES;
+      return EACCES;  // for ERROR_ACCESS_DENIED, ERROR_SHARING_VIOLATION and others
   }
 }
 
@@ -66,7 +67,7 @@ int errorNumber(DWORD error) {
 
 int open(std::string const& path) {
   std::wstring const wide = withLongPathPrefix(widened(path));
-  // Others may go on reading, writing, renaming and deleting the file, as on other systems.
+  // Other programs may go on reading, writing, renaming and deleting the file, as on other systems.
   HANDLE const handle = ::CreateFileW(wide.c_str(), GENERIC_READ,
                                       FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
                                       nullptr, OPEN_EXISTING, FILE_ATTRIBUTE_NORMAL, nullptr);

@@ -24,7 +24,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   entry.field = field.data();
   entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Up to 4 bytes are stored even if the data ends among them; an offset must be whole.
+    // Up to 4 bytes are stored even if the data ends among them; the offset of more must be whole.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, bytesOrOffsetOf(entry, needsReversal(*stream)), *this);
     }

@@ -21,7 +21,7 @@ inline constexpr char kTooLong[] = "too-long";
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 
-std::string systemText(int error);
+std::string systemText(int error);  ///< The system's text for an `errno`.
 
 Problem cannotOpen(int error);
 Problem cannotRead(int error);

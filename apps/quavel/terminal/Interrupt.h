@@ -6,7 +6,7 @@
 #include <string_view>
 
 /// On SIGINT, SIGTERM and SIGHUP, a signal handler completes the output (see `setTail`) and ends
-/// the process. A thread for the signals would slow each system call where only one thread reads.
+/// the process. No thread waits for signals: system calls are faster in a process of one thread.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
@@ -31,13 +31,13 @@ inline constexpr char kEraseLine[] = "\r\x1b[K";
 /// Writes the bytes, up to the first failure. Safe to call in a signal handler.
 void write(int fd, std::string_view bytes);
 
-/// Sets what an interrupt writes to standard output last; null: nothing. The text is not copied.
+/// Sets the text that ends the output on an interrupt, such as "]"; null: none. It is not copied.
 void setTail(char const* tail);
 
 /// Sets whether the terminal shows a progress line, which an interrupt would then erase.
 void setProgressShown(bool isShown);
 
-/// If a signal arrives while this lives, the process ends when this is destroyed or a second later.
+/// Delays the process's end on a signal until this is destroyed, but by a second at most.
 class WriteScope {
  public:
   WriteScope();
