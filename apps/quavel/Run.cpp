@@ -150,7 +150,7 @@ void Runner::emitOldest() {
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
   progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
-  // With --quiet, output for programs replaces the message; with --why, output for people does.
+  // Whether output replaces the message: for programs with --quiet, for people with --why.
   bool const isOutputEnough = form.isForMachines() ? options_.isQuiet : form.isExplanation();
   if (outcome.problem && !(outcome.isShown && isOutputEnough)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);

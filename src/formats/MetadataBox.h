@@ -10,8 +10,8 @@
 
 namespace quavel::detail {
 
-/// Reads a metadata box of the given type. Its `readExif` is called with the stream's position and
-/// `baseOffset` at the payload's start. After a failure, the stream's state is unspecified.
+/// Reads a box whose type must be `type`, CMT1 or CMT2. Calls `readExif` with `baseOffset` at the
+/// payload's start and the stream at offset 0. After a failure, the stream's state is unspecified.
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {

@@ -78,13 +78,14 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
 }
 
 inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
-/// The last offset at which a read may start. Where `long` has 32 bits, that is 1 MB before the
-/// largest one: even a directory of 65535 entries that begins there ends at a valid offset.
+/// The last offset at which a read may start. Where `long` has 32 bits, 1 MB is left above it:
+/// enough for the largest directory, of 65535 entries, to end at a valid offset.
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
 /// Where `leaveBox` goes when a box ends beyond all offsets; no read succeeds there. Where `long`
-/// has 32 bits, `endOfBox` of the box around it is 1 more, so a walk inside that goes on and fails.
+/// has 32 bits, it is 1 less than the largest end that `endOfBox` gives. If an outer box has that
+/// end, the walk through it is not over: it looks for another box here, and fails.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
@@ -102,8 +103,7 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered == static_cast<std::int64_t>(count)) {
     return true;
   }
-  // Too few bytes need no note: the data ends, or `QVReadAheadStream` has noted a failure.
-  if (delivered < 0) {
+  if (delivered < 0) {  // otherwise the data ends, or `QVReadAheadStream` has noted a failure
     noteReadResult(stream, delivered, /*error=*/0);
   }
   return false;

@@ -15,14 +15,14 @@ namespace {
 
 bool fitsLong(std::int64_t number) { return number == static_cast<long>(number); }
 
-/// Seeks to a position that fits `baseOffset` but not a `long`. False: the seek failed.
+/// Seeks, by way of `baseOffset`, to a position that does not fit a `long`. False: the seek failed.
 bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = detail::wrappingSum(base, target);
   source.setOffset(0);
   bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` is still at 0; one that moved gives the target's low bits.
+  // A source that ignores `baseOffset` now says 0; one that has moved, the target cut to a `long`.
   return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -61,7 +61,7 @@ void QVReadAheadStream::setOffset(long const& offset) {
 }
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  sourcePosition_ = -1;
+  sourcePosition_ = -1;  // the source is moved below
   // A source that refuses the seek stays at 0; one that goes to its end instead is taken to accept.
   source_->setOffset(0);
   if (fitsLong(target)) {

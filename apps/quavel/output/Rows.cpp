@@ -13,7 +13,7 @@ constexpr std::size_t kDay = 10;            // the length of "2018-02-21"
 constexpr std::size_t kMinute = 16;         // the length of "2018-02-21 12:08"
 
 std::vector<Column> defaultColumns() {
-  // Label, least width, rank (the highest is left out first, 0 never), cut at its start or not.
+  // Label, least width, rank (the highest is left out first, 0 never), keeps its end when cut.
   return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};
@@ -23,7 +23,6 @@ std::string wordsOf(std::string_view name, Outcome const& outcome) {
   return inWords(*fieldNamed(name), outcome);
 }
 
-/// The date without its seconds, for which a table has no room.
 std::string toTheMinute(std::string const& date) {
   bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
   return isWellMade ? date.substr(0, kMinute) : date;
@@ -51,7 +50,7 @@ std::vector<Column> columnsOf(Fields const& fields) {
   std::vector<Column> columns;
   for (auto const* field : fields) {
     bool const isPath = field->name == "path";
-    columns.push_back({field->label, isPath ? kLeastPathWidth : kLeastWidth, 0, isPath});
+    columns.push_back({field->label, isPath ? kLeastPathWidth : kLeastWidth, /*rank=*/0, isPath});
   }
   return columns;
 }

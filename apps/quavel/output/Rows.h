@@ -15,7 +15,7 @@ using Row = std::vector<std::string>;
 std::vector<Column> columnsOf(Fields const& fields);
 /// The row of a file that gave a record; an absent value is empty.
 Row rowOf(Fields const& fields, Outcome const& outcome);
-/// Shortens the date to the day, in a row of the default columns: for a table that is too wide.
+/// Drops the time of day from the date in a row of the default columns, to make a table narrower.
 void dropTime(Row& row);
 
 }  // namespace app::rows

@@ -16,7 +16,7 @@ namespace {
 using quavel::QVMetadata;
 
 constexpr std::size_t kMaxCells = 200;            // of a terminal
-constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // combining marks take bytes, but no cells
+constexpr std::size_t kMaxBytes = 8 * kMaxCells;  // limits combining marks, which take no cells
 
 /// A member as a `Value`: none when the member is -1, NaN or an empty text.
 template <class T>

@@ -47,8 +47,8 @@ bool isAbsent(Value const& value);
 /// The value to sort and select by: for captureDate, the first date for which `isAbsent` is false.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
-/// Appends the value for programs: a text as it is, a number with the digits that give it exactly
-/// when read back, or "Infinity", "true" or "false". Nothing when there is none.
+/// Appends the value for programs: a text as it is, "true" or "false", "Infinity" or "-Infinity",
+/// any other number with the digits that give it exactly when read back. No value: nothing.
 void appendExact(std::string& text, Value const& value);
 
 }  // namespace app
