@@ -18,18 +18,18 @@ namespace {
 
 constexpr auto kQuietStart = std::chrono::milliseconds(500);   // without a progress line
 constexpr auto kInterval = std::chrono::milliseconds(100);     // between updates of the line
-constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // of `countTotal`, before a rest
+constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // after which `countTotal` rests
 constexpr int kRestFactor = 4;  // a rest is this many times as long as the spell before it
 
 double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-/// Whether the list, if any, can be read twice: not from standard input or a pipe.
+/// Whether the list of paths, if there is one, is a regular file, which can be read twice.
 bool isRereadable(std::string const& list) {
   struct stat status = {};
   bool const isFile = ::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode);
-  return list.empty() || (list != "-" && isFile);
+  return list.empty() || (list != "-" && isFile);  // "-": standard input
 }
 
 std::string rate(std::size_t files, double seconds) {
@@ -81,7 +81,7 @@ void Progress::startCountingTotal() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::BlockSignals const block;  // for the new thread
+  interrupt::BlockSignals const block;  // the new thread gets no signals
   try {
     counter_ = std::thread([this] {
       try {
@@ -131,8 +131,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  bool const isEachInOutput = failures_ == 0 || options_.form.isExplanation();
-  if (options_.isQuiet || (files == 1 && isEachInOutput)) {  // a single file needs no sum
+  bool const hasUnexplainedFailure = failures_ > 0 && !options_.form.isExplanation();
+  if (options_.isQuiet || (files == 1 && !hasUnexplainedFailure)) {  // one file's output is enough
     return;
   }
   double const seconds = secondsSince(start_);

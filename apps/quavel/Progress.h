@@ -49,7 +49,7 @@ class Progress {
   std::mutex mutex_;     // guards `isEnding_`
   std::condition_variable endSignal_;
   bool isEnding_ = false;
-  std::atomic<std::size_t> total_{0};  // of all files, by `countTotal`; 0: unknown
+  std::atomic<std::size_t> total_{0};  // how many files there are; 0: unknown
 };
 
 }  // namespace app

@@ -38,7 +38,7 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, l
       continue;
     }
     stream->setOffset(childStart);
-    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last uuid box counts, of any identifier
+    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last box counts, whatever its identifier
     if (!uuidBox->read(stream)) {
       return false;
     }

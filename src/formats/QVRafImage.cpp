@@ -76,7 +76,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
-  stream->baseOffset = imageOffset + kTiffHeaderInImage;  // a 32-bit sum, which may wrap around
+  stream->baseOffset = imageOffset + kTiffHeaderInImage;  // on purpose a 32-bit sum: it may wrap
   stream->setOffset(0);
   if (!readMainIFD(stream)) {
     noteOtherOpening(*stream, imageOffset);

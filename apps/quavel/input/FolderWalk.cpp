@@ -74,12 +74,12 @@ bool FolderWalk::visitLinkOrUnknown(std::string path, Input& input) {
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
-    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` took it for a file
+    if (!isHidden(name, /*isFolder=*/true)) {  // so far checked only as a file
       enter(path, /*isFoundByLink=*/true);     // an unknown type counts as a link
     }
     return false;
   }
-  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR for any other
+  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR: `visit` skips it
   return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
 }
 

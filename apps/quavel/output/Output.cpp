@@ -16,7 +16,7 @@ namespace app {
 
 namespace {
 
-/// Writes all bytes, or ends the process if an interrupt comes while the first byte waits.
+/// Writes all bytes, or ends the process if an interrupt comes while it waits to write the first.
 void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -86,7 +86,7 @@ void Output::finish() {
   if (char const* const tail = std::exchange(tail_, nullptr)) {
     writeWhole(tail);
   }
-  interrupt::setTail(nullptr);  // not earlier: an interrupt that ends `writeWhole` writes the tail
+  interrupt::setTail(nullptr);  // not earlier: an interrupt within `writeWhole` needs the tail
 }
 
 void Output::giveUp() noexcept {

@@ -33,10 +33,10 @@ struct Outcome {
   std::string path;
   std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or no longer needed for output.
   Problem problem;                             ///< Why there is no record.
-  char const* format = "";                     ///< As the journal gives it.
+  char const* format = "";                     ///< Such as "JPEG"; empty: the extension names none.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
   std::uint64_t furtherSteps = 0;              ///< How many steps the notes leave out.
-  bool isShown = true;                         ///< It meets all conditions.
+  bool isShown = true;                         ///< It meets the conditions of --where.
   std::string text;                            ///< Its output in the chosen form, once prepared.
   std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.
 };
