@@ -118,7 +118,7 @@ void addChoices(CLI::App& command, Options& options) {
       });
   add("-j,--jobs", "N", "Files read at a time [the processors; 32 if cold]",
       [&options](std::string const& jobs) {
-        options.jobs = options.cachedJobs = values::jobsOf(jobs);
+        options.jobs = options.busyJobs = values::jobsOf(jobs);
       });
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
 }
@@ -181,8 +181,8 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.footer(kFooter);
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
-  options.cachedJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
-  options.jobs = std::max(options.cachedJobs, kUncachedJobs);
+  options.busyJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
+  options.jobs = std::max(options.busyJobs, kUncachedJobs);
   addInputs(command, options);
   addForms(command, options.form);
   addChoices(command, options);

@@ -50,7 +50,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       writer_(makeWriter(options.form, output)),
       detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
-      pipeline_(options.jobs, options.cachedJobs, [this](Batch& batch) { work(batch); }),
+      pipeline_(options.jobs, options.busyJobs, [this](Batch& batch) { work(batch); }),
       isErrorHintDue_(options.form.kind == FormKind::Csv && !options.form.fields.empty() &&
                       !contains(options.form.fields, "error")) {}
 
@@ -127,7 +127,7 @@ void Runner::prepare(Outcome& outcome) const {
   outcome.isShown = std::all_of(form.conditions.begin(), form.conditions.end(),
                                 [&](Condition const& each) { return each.holds(outcome); });
   if (outcome.isShown) {
-    writer_->prepareSafely(outcome);
+    writer_->prepareOrSetProblem(outcome);
   }
 }
 
@@ -150,9 +150,9 @@ void Runner::emitOldest() {
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
   progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
-  // Whether output replaces the message: for programs with --quiet, for people with --why.
-  bool const isOutputEnough = form.isForMachines() ? options_.isQuiet : form.isExplanation();
-  if (outcome.problem && !(outcome.isShown && isOutputEnough)) {
+  // JSON and CSV state the problem too: --quiet drops the message. So does --why, to people.
+  bool const outputStatesProblem = form.isForMachines() ? options_.isQuiet : form.isExplanation();
+  if (outcome.problem && !(outcome.isShown && outputStatesProblem)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);
   }
   if (outcome.problem && outcome.isShown && isErrorHintDue_) {

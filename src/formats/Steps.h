@@ -11,7 +11,8 @@
 #include "tiff/ReaderDirectory.h"
 #include "tiff/WantedTags.h"
 
-// Steps that the readers of several formats share. A step that fails has told the journal why.
+// Steps that the readers of several formats share. A step that fails has told the journal why. The
+// stream is passed as to the public `read`; no step replaces it.
 namespace quavel::detail {
 
 /// Finds the only value of a tag's entry. No entry: true, null `value`. Not exactly one: false.
@@ -32,7 +33,7 @@ DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName con
                                  std::uint32_t offset, TagList tags);
 
 /// Reads the TIFF header at the stream's position and the directory it refers to; null on failure.
-/// `structure` is what notes call the TIFF structure, or `kWholeFile`.
+/// `structure` is what notes call the TIFF structure; with `kWholeFile` they do not name it.
 DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
                                     TagList tags);
 
@@ -55,7 +56,8 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the record's field for this tag stays absent: the tag has no entry.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same when the entry's value is no use. `pattern` takes the entry, then its count and type.
+/// The same when the entry's value is no use. `pattern` names the entry by its first "{}", and the
+/// entry's count and type by a second.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
 /// Refuses the tag's entry, which must exist: it does not hold what is `wanted`. Returns false.

@@ -83,7 +83,7 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
     return refuseEntry(row, entry);
   }
   if (entry.typeCode == kUndefinedCode) {
-    row.bytesOrOffset = bytesOrOffsetOf(entry, needsReversal(stream));
+    row.bytesOrOffset = undefinedBytesOrOffset(entry, needsReversal(stream));
   } else if (!readingOf(stream).spend(Work::Values, entry.count)) {
     return false;
   } else if (!readValues(stream, entry, values_)) {

@@ -90,9 +90,9 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
 
 /// What is kept of an UNDEFINED entry: up to 4 bytes as in the file, with zeros for those that the
 /// data lacks. Of more than 4 bytes, only their offset.
-std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed);
+std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed);
 
-/// Stores in an entry for a host what `bytesOrOffsetOf` gave, and the `count` of the bytes.
+/// Stores in an entry for a host what `undefinedBytesOrOffset` gave, and the `count` of the bytes.
 void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
                     QVTiffImageFileDirectoryEntry& entry);
 

@@ -12,7 +12,8 @@ namespace quavel::detail {
 /// A walk over a directory's entries, of which it reads up to 64 at a time.
 class EntryWalk {
  public:
-  /// The stream stands at the first of `count` entries, which is at `position` in the file.
+  /// The stream stands at the first of `count` entries. Notes need the entry's `position` in the
+  /// file; the stream's own offsets count from its `baseOffset`.
   EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
         isReversed_(needsReversal(stream)),
@@ -35,13 +36,13 @@ class EntryWalk {
   /// Where the current entry begins in the file.
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
-  /// Buffers the current entry, which may move the stream. False: its tag is not all there.
+  /// Buffers the current entry, which may move the stream. False: its tag is not all there. The
+  /// buffer holds whole entries unless the data ends.
   bool bufferEntry() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
-  /// Takes what follows the tag from the buffer, which holds whole entries unless the data ends.
-  /// False: the data ends within the type or the count.
+  /// Takes what follows the tag. False: the data ends within the type or the count.
   bool parseRest(RawEntry* entry) const {
     if (!isBufferedUpTo(kEntryFieldPosition)) {
       return false;

@@ -1,3 +1,4 @@
+// What hosts get of a directory. Declared in EntryTable.h and ReaderDirectory.h.
 #include <cstring>
 #include <utility>
 
@@ -17,8 +18,8 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
   return list;
 }
 
-std::uint32_t bytesOrOffsetOf(RawEntry const& entry, bool isReversed) {
-  if (entry.count > kEntryFieldSize) {  // each value of an UNDEFINED entry is one byte
+std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed) {
+  if (entry.count > kEntryFieldSize) {  // in an UNDEFINED entry, each value is a byte
     return valueOffset(entry, isReversed);
   }
   std::uint32_t bytes = 0;

@@ -26,7 +26,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   if (entry.typeCode == kUndefinedCode) {
     // Up to 4 bytes are stored even if the data ends among them; the offset of more must be whole.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
-      storeUndefined(entry.count, bytesOrOffsetOf(entry, needsReversal(*stream)), *this);
+      storeUndefined(entry.count, undefinedBytesOrOffset(entry, needsReversal(*stream)), *this);
     }
     return hasWholeField(entry);
   }

@@ -17,7 +17,7 @@ using DirectoryPointer = std::shared_ptr<QVTiffImageFileDirectory>;
 class ReaderDirectory final : public QVTiffImageFileDirectory {
  public:
   ReaderDirectory(PartName const& name, std::int64_t position) : table(name, position) {
-    ofReader = this;
+    ofReader = this;  // for `of`
   }
   ReaderDirectory(ReaderDirectory const&) = delete;
   ReaderDirectory& operator=(ReaderDirectory const&) = delete;
@@ -33,7 +33,7 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
   EntryTable table;
 };
 
-/// Does what `QVTiffHeader::read` does. `structure` is what notes call the TIFF structure, such as
+/// The body of `QVTiffHeader::read`. `structure` is what notes call the TIFF structure, such as
 /// "the Exif segment"; with `kWholeFile` they do not name it.
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);

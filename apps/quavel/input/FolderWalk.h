@@ -22,7 +22,7 @@ using Report = std::function<void(std::string const& path, std::string const& re
 
 /// What a walk leaves out, besides files that are not photos.
 struct Filter {
-  /// False: folders whose names begin with "." and files whose names begin with "._" are left out.
+  /// False: folders named ".*" are left out, and files named "._*", which macOS adds to photos.
   bool showsHidden = false;
   std::vector<std::string> excluded;  ///< Globs of names or, with a "/" in them, of paths.
 };

@@ -59,7 +59,7 @@ class SortingWriter : public Writer {
     };
     std::stable_sort(outcomes_.begin(), outcomes_.end(), isBefore);
     for (auto& outcome : outcomes_) {
-      next_->prepareSafely(outcome);
+      next_->prepareOrSetProblem(outcome);
       next_->add(std::move(outcome));
       outcome = {};  // frees what `add` did not take
     }
@@ -106,7 +106,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
 
 }  // namespace
 
-void Writer::prepareSafely(Outcome& outcome) const {
+void Writer::prepareOrSetProblem(Outcome& outcome) const {
   try {
     prepare(outcome);
   } catch (std::exception const& error) {

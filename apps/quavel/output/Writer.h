@@ -15,8 +15,8 @@ class Writer {
 
   /// Sets the outcome's text or cells, and may then drop the record. Called on any thread.
   virtual void prepare(Outcome& outcome) const = 0;
-  /// The same, but an exception becomes the `problem` of the outcome.
-  void prepareSafely(Outcome& outcome) const;
+  /// The same, but an exception becomes the outcome's `problem`.
+  void prepareOrSetProblem(Outcome& outcome) const;
   /// Takes a prepared outcome, in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
   /// Writes what is held back. Called when the next outcome may take a while.
