@@ -23,7 +23,7 @@
 namespace {
 
 /// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. A list of paths cannot be read from a folder; /dev/null would pass for an empty one.
+/// descriptor. Not /dev/null: a list read from standard input would be empty instead of refused.
 void holdStandardStreams() {
   int fd = -1;
   do {  // each `open` takes the lowest free descriptor

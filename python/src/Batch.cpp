@@ -29,9 +29,9 @@ app::Problem whyUnfit(std::string const& path) {
                                  : app::Problem{app::reason::kSpecialFile, "not a regular file"};
 }
 
-void read(app::Outcome& outcome, bool isPhoto, QVJournal& journal) {
+void read(app::Outcome& outcome, bool isRegular, QVJournal& journal) {
   try {
-    if (!isPhoto) {
+    if (!isRegular) {
       outcome.problem = whyUnfit(outcome.path);
     }
     outcome.record = outcome.problem ? nullptr : journal.read(outcome.path);
@@ -69,7 +69,7 @@ void readBatch(app::Batch& batch, std::atomic<bool> const& isClosing) {
     outcome.path = std::move(input.path);
     outcome.problem = std::move(input.problem);
     if (!outcome.problem) {
-      read(outcome, input.isPhoto, journal);
+      read(outcome, input.isRegular, journal);
     }
   }
   batch.seconds = std::chrono::duration<double>(Clock::now() - start).count();

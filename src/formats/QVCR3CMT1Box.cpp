@@ -14,7 +14,7 @@ bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  // None of ExifIFDPointer, SubIFDs and NewSubfileType is stored, but a damaged one is refused.
+  // ExifIFDPointer, SubIFDs and NewSubfileType are listed only so that a damaged one is refused.
   auto const mainIFD =
       readFirstDirectory(stream, "the CMT1 box",
                          {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,

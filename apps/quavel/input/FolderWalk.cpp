@@ -48,7 +48,7 @@ bool FolderWalk::step(Input& input) {
 bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
   switch (type) {
     case DT_REG:  // with a photo's extension: others were left out before
-      input = {std::move(path), /*isPhoto=*/true, {}};
+      input = {std::move(path), /*isRegular=*/true, {}};
       return true;
     case DT_DIR:
       enter(path, /*isFoundByLink=*/false);
@@ -69,12 +69,12 @@ bool FolderWalk::visitLinkOrUnknown(std::string path, Input& input) {
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    input = {std::move(path), /*isPhoto=*/false, {}};  // reading it will show what is wrong
+    input = {std::move(path), /*isRegular=*/false, {}};  // such as a dangling link: reading tells
     return isPhotoExtension(extensionOf(input.path));
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
-    if (!isHidden(name, /*isFolder=*/true)) {  // so far checked only as a file
+    if (!isHidden(name, /*isFolder=*/true)) {  // until now, the rule for files was applied
       enter(path, /*isFoundByLink=*/true);     // an unknown type counts as a link
     }
     return false;
@@ -142,7 +142,7 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
     errno = 0;
   }
   if (errno != 0) {
-    setUnreadable(level.path, errno);
+    setUnreadable(level.path, errno);  // the photos found so far are read all the same
   }
   char const* const names = level.names.data();
   std::sort(level.entries.begin(), level.entries.end(), [names](Entry const& a, Entry const& b) {
@@ -153,7 +153,8 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
 void FolderWalk::setUnreadable(std::string const& path, int error) {
   std::string const why =
       "the folder cannot be read: " + reason::systemText(error) + "; its photos are missing";
-  unreadable_ = {path, /*isPhoto=*/false, {reason::kUnreadableFolder, why, /*position=*/-1, error}};
+  unreadable_ = {
+      path, /*isRegular=*/false, {reason::kUnreadableFolder, why, /*position=*/-1, error}};
 }
 
 }  // namespace app

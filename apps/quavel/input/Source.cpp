@@ -44,8 +44,8 @@ bool Source::nextOfPaths(Input& input) {
       isWalkEmpty_ = true;
       continue;
     }
-    bool const isPhoto = exists && S_ISREG(status.st_mode) && isPhotoExtension(extensionOf(path));
-    input = {path, isPhoto, /*problem=*/{}};
+    bool const isRegular = exists && S_ISREG(status.st_mode) && isPhotoExtension(extensionOf(path));
+    input = {path, isRegular, /*problem=*/{}};
     return true;
   }
   return false;

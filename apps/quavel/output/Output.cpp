@@ -57,8 +57,8 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A pipe takes a write of up to PIPE_BUF bytes whole or not at all, so an interrupt while a pipe
-  // is full cuts no piece. Writing to a regular file never waits, so a file gets all at once.
+  // An interrupt waits a second at most for a write. So that it cuts no piece, a pipe gets up to
+  // PIPE_BUF bytes at once: it takes them whole or, while it is full, not at all. A file gets all.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {

@@ -171,7 +171,7 @@ void Table::layOutForTerminal() {
   widths_ = fit(columns_, natural_, width);
   auto const hidden = [](Widths const& all) { return std::count(all.begin(), all.end(), 0U); };
   bool const dropsColumns = hidden(widths_) > hidden(natural_);
-  if (dropsColumns && form_.fields.empty()) {  // the default columns may fit without times
+  if (dropsColumns && form_.fields.empty()) {  // `dropTime` knows the default columns only
     hasDaysOnly_ = true;
     natural_ = naturalWidths();
     widths_ = fit(columns_, natural_, width);

@@ -24,8 +24,8 @@ struct Problem {
 /// One file to read.
 struct Input {
   std::string path;
-  bool isPhoto = false;  ///< Known to be a regular file with a photo's extension.
-  Problem problem;       ///< Set: why the file must not be read.
+  bool isRegular = false;  ///< A regular file with a photo's extension; false: not known yet.
+  Problem problem;         ///< Set: why the file must not be read.
 };
 
 /// The result of reading one file.

@@ -133,7 +133,7 @@ Outcome readPhoto(Input input, Detail detail) {
   Outcome outcome;
   outcome.path = std::move(input.path);
   outcome.problem = std::move(input.problem);
-  if (!input.isPhoto && !outcome.problem) {  // not yet known to be a regular file
+  if (!input.isRegular && !outcome.problem) {  // not yet known to be a regular file
     outcome.problem = whyUnfit(outcome.path);
   }
   fill(outcome, detail, [&](QVJournal& journal) { return journal.read(outcome.path); });

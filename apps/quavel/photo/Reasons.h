@@ -17,7 +17,7 @@ inline constexpr char kSpecialFile[] = "special-file";
 inline constexpr char kBadPath[] = "bad-path";
 inline constexpr char kUnreadableFolder[] = "unreadable-folder";
 inline constexpr char kUnreadableList[] = "unreadable-list";
-inline constexpr char kTooLong[] = "too-long";
+inline constexpr char kTooLong[] = "too-long";  // what standard input holds
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 
