@@ -149,7 +149,7 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
+  progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);  // `record` may be dropped
   // JSON and CSV state the problem too: --quiet drops the message. So does --why, to people.
   bool const outputStatesProblem = form.isForMachines() ? options_.isQuiet : form.isExplanation();
   if (outcome.problem && !(outcome.isShown && outputStatesProblem)) {

@@ -71,7 +71,7 @@ inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileTyp
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory as notes name it. A host's directory has no table, and no note names it.
+/// A directory to be named in notes. A host's has no journal, so its table, null, is never asked.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const own = ReaderDirectory::of(*directory);
   return {own == nullptr ? nullptr : &own->table};

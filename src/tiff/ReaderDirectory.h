@@ -38,7 +38,7 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                     QVTiffHeader& header);
 
-/// The entry kept for the tag; false as a bool when there is none.
+/// The first entry with the tag; false as a bool when there is none.
 Entry findEntry(DirectoryPointer const& directory, unsigned short tag);
 
 /// The journal of the read that filled the directory; null for a directory made by a host.

@@ -61,7 +61,7 @@ std::string explanationOf(Outcome const& outcome) {
   if (outcome.furtherSteps != 0) {
     text += "  read: " + std::to_string(outcome.furtherSteps) + " more\n";
   }
-  return text + linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n") +
+  return text + linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n") +  // sentences
          absencesOf(outcome.notes);
 }
 
