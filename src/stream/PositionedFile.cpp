@@ -98,9 +98,8 @@ long PositionedFile::getOffset() {
 
 void PositionedFile::setOffset(long const& offset) {
   std::int64_t const target = wrappingSum(baseOffset, offset);
-  // Each read states its position: the seek only asks whether the file system accepts a high one.
-  bool const isValid = target <= kSurelyAccepted ? target >= 0 : file::seek(fd, target) == target;
-  if (isValid) {
+  // Reads state their position: the seek only asks whether the file system accepts a high one.
+  if (target >= 0 && (target <= kSurelyAccepted || file::seek(fd, target) == target)) {
     position_ = target;
   }
 }

@@ -16,7 +16,7 @@ namespace app {
 
 namespace {
 
-/// Writes all bytes, or ends the process if an interrupt comes while it waits to write the first.
+/// Writes all bytes, within a WriteScope. An interrupt before the first one ends the process.
 void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -83,7 +83,7 @@ void Output::enclose(std::string_view head, char const* tail) {
 void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
-  if (char const* const tail = std::exchange(tail_, nullptr)) {
+  if (char const* const tail = std::exchange(tail_, nullptr)) {  // once: see `giveUp`
     writeWhole(tail);
   }
   interrupt::setTail(nullptr);  // not earlier: an interrupt within `writeWhole` needs the tail

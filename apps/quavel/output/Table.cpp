@@ -163,7 +163,7 @@ void Table::layOutForTerminal() {
   width_ = width;
   folder_.clear();
   hasDaysOnly_ = false;
-  natural_ = naturalWidths();
+  natural_ = naturalWidths();  // with `folder_` and `hasDaysOnly_` as they are now
   if (lineWidth(natural_) > width && pathColumn_ < columns_.size()) {
     folder_ = commonFolder(page_, pathColumn_);
     natural_ = naturalWidths();  // without the folder
