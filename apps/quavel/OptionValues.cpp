@@ -34,7 +34,7 @@ void addFields(std::string const& list, Fields& fields) {
   }
 }
 
-std::string refuseEmpty(std::string const& argument) {
+std::string refuseEmptyFileName(std::string const& argument) {
   return argument.empty() ? "is empty: name a file" : "";
 }
 

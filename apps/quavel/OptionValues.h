@@ -20,7 +20,7 @@ void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);
 /// A check that the parser calls: returns why the argument is wrong, or an empty text.
-std::string refuseEmpty(std::string const& argument);
+std::string refuseEmptyFileName(std::string const& argument);
 
 }  // namespace app::values
 

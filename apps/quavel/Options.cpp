@@ -50,7 +50,7 @@ void addInputs(CLI::App& command, Options& options) {
   command.add_option("PATH", options.inputs.paths, "Photos and folders of photos")->type_name("");
   auto* const list = command.add_option("--files-from", options.inputs.list,
                                         "Read the photos' paths from a file; -: standard input");
-  list->type_name("FILE")->check(values::refuseEmpty);
+  list->type_name("FILE")->check(values::refuseEmptyFileName);
   command.add_flag("--hidden", options.inputs.filter.showsHidden,
                    "Walk hidden folders, and try files named ._*");
   addRepeatable(command, "--exclude", "GLOB",
@@ -143,7 +143,7 @@ void finish(Options& options) {
   }
 }
 
-/// The parser would read "--quiet=0" as a request for messages and "-q=0" as two options. After
+/// The parser would take "--quiet=0" for "not quiet", and "-q=0" for several short options. After
 /// "--exclude=", it would take the next word, such as a folder, as the value.
 void refuseOddValues(CLI::App const& command, int argc, char const* const* argv) {
   for (int i = 1; i < argc && argv[i] != std::string_view("--"); ++i) {

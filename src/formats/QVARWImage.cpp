@@ -17,12 +17,12 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // `readExifIFD` stores its values
+  DirectoryPointer exifIFD;  // only tells whether there is one: its values are in the record then
   if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                    exifIFD)) {
     return false;
   }
-  if (!exifIFD) {
+  if (!exifIFD) {  // a rule of ours: the size needs both directories
     noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
                "no {} in {}, without which the raw image is not looked for",
                TagName{tag::ExifIFDPointer}, placed(mainIFD));

@@ -16,9 +16,10 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
-    // Orientation is not stored: it is listed so that the file is refused if its entry is damaged.
+    PartName const name = {"SubIFD", kWholeFile, /*number=*/i + 1, count};
+    // Orientation is listed, though not stored, because a malformed entry shows a damaged file.
     auto subIFD =
-        readDirectoryAt(stream, {"SubIFD", kWholeFile, i + 1, count}, subIFDs[i]->longValue(),
+        readDirectoryAt(stream, name, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     ValuePointer type = nullptr;  // stays null if the entry is absent
     if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {

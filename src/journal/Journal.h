@@ -28,6 +28,7 @@ class Journal {
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
   /// Notes a part that was read without trouble; after the first few, only counts it.
   void passed(std::int64_t position, char const* pattern, Words words);
+  /// Notes what else may explain the outcome, in a journal of any detail.
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// Keeps the reason why a field may stay absent; replaces an earlier one for the same field.
   void absent(char const* field, QVReason reason, char const* pattern, Words words);
@@ -37,7 +38,7 @@ class Journal {
 
   /// The size of the data in bytes. -1: not known. 0: may be wrong, as for files in /proc.
   std::int64_t dataSize();
-  /// Why the bytes asked for last were not all delivered. `end`: the position after those bytes.
+  /// Why the bytes asked for last were not all delivered; in words, for those that end at `end`.
   QVReason cutReason() const;
   std::string cutText(std::int64_t end);
 

@@ -24,7 +24,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   entry.field = field.data();
   entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Up to 4 bytes are stored even if the data ends among them; the offset of more must be whole.
+    // The field holds up to 4 bytes, stored even if the read fails among them, or else an offset.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, undefinedBytesOrOffset(entry, needsReversal(*stream)), *this);
     }

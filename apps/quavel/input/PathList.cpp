@@ -21,14 +21,14 @@ int whyUnreadable(int fd) { return ::read(fd, nullptr, 0) == -1 ? errno : 0; }
 
 Input inputFor(std::string const& path) {
   Input input;
-  if (path.find('\0') <= kMaxPathLength) {  // further on, `refill` may have cut it off
+  input.path = path.substr(0, kMaxPathLength);
+  if (input.path.find('\0') != std::string::npos) {
     input.problem = {reason::kBadPath,
                      "the path holds a NUL; if the list is NUL-separated, add -0"};
   } else if (path.size() > kMaxPathLength) {
     input.problem = {reason::kBadPath,
                      "longer than a path can be; if the list is not NUL-separated, leave out -0"};
   }
-  input.path = path.substr(0, kMaxPathLength);
   return input;
 }
 
@@ -80,8 +80,8 @@ bool PathList::refill() {
   }
   buffer_.erase(0, start_);
   start_ = 0;
-  if (buffer_.size() > 2 * kMaxPathLength) {  // no separator in it: one path, far too long
-    buffer_.resize(kMaxPathLength + 1);       // enough for `inputFor` to see that
+  if (buffer_.size() > kMaxPathLength) {  // no separator in it: one path, too long
+    buffer_.resize(kMaxPathLength + 1);   // enough for `inputFor` to see that
   }
   std::size_t const size = buffer_.size();
   buffer_.resize(size + kReadSize);

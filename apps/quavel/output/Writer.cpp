@@ -31,7 +31,7 @@ class TextWriter : public Writer {
       beforeNext_ = separator_;
     }
   }
-  void end() override { output_.finish(); }  // with the "]" of a JSON array
+  void end() override { output_.finish(); }  // writes the tail, such as the "]" of a JSON array
 
  private:
   Output& output_;
@@ -72,7 +72,7 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path, ended by a NUL. Files without a record are left out unless conditions select them.
+/// Each path, ended by a NUL. With conditions, which all files here meet, even without a record.
 TextOf paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
@@ -119,7 +119,7 @@ void Writer::prepareOrSetProblem(Outcome& outcome) const {
 }
 
 std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
-  bool const isTable =
+  bool const isTable =  // a table of one photo becomes a card if the form is automatic
       form.kind == FormKind::Table || (form.kind == FormKind::Automatic && !form.hasNotes);
   auto writer = isTable ? makeTable(form, output) : makeText(form, output);
   if (form.sort == nullptr) {
