@@ -50,7 +50,7 @@ std::string duration(double seconds) {
 Progress::Progress(Console& console, Options const& options)
     : console_(console),
       options_(options),
-      showsLine_(console.isTerminal() && !options.isQuiet && !options.fromStdin),
+      showsLine_(console.isTerminal() && !options.isQuiet),
       nextTick_(start_ + kQuietStart) {}
 
 Progress::~Progress() {
@@ -81,7 +81,7 @@ void Progress::startCountingTotal() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::BlockSignals const block;  // the new thread gets no signals
+  interrupt::BlockSignals const block;  // leaves signals to the thread that writes
   try {
     counter_ = std::thread([this] {
       try {
@@ -94,7 +94,7 @@ void Progress::startCountingTotal() {
 }
 
 void Progress::countTotal() {
-  Source source(options_.inputs, [](auto&&...) {});  // silent: the run itself makes the remarks
+  Source source(options_.inputs, [](auto&&...) {});  // drops remarks: the run itself prints them
   Input input;
   std::size_t count = 0;
   auto spellStart = Clock::now();
@@ -116,7 +116,7 @@ void Progress::countTotal() {
 std::string Progress::line(double seconds) const {
   std::size_t const files = records_ + failures_;
   std::size_t const total = total_;
-  bool const isTotalKnown = total > 0 && total >= files;  // too low if files were added since
+  bool const isTotalKnown = total > 0 && total >= files;  // files may be added after the count
   std::string text = std::to_string(files);
   if (isTotalKnown) {
     text += " of " + std::to_string(total);
@@ -131,8 +131,8 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  bool const hasUnexplainedFailure = failures_ > 0 && !options_.form.isExplanation();
-  if (options_.isQuiet || (files == 1 && !hasUnexplainedFailure)) {  // one file's output is enough
+  bool const isOutputEnough = files == 1 && (failures_ == 0 || options_.form.isExplanation());
+  if (options_.isQuiet || isOutputEnough) {  // one file's record, or why there is none
     return;
   }
   double const seconds = secondsSince(start_);

@@ -34,7 +34,7 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  // The second SubIFD, if there is one, describes the raw image.
+  // The second SubIFD describes the raw image. Without it, the record has no size.
   DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, /*index=*/1,
                   {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType}, rawIFD)) {

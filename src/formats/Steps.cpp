@@ -101,7 +101,7 @@ bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
     return true;
   }
   // An override of `storeInfoFromExifIFD` in a host's class needs the directory's public `entries`.
-  if (!readingOf(*stream).isOwnRecord) {
+  if (!readingOf(*stream).isLibraryRecord) {
     exifIFD = static_cast<ReaderDirectory&>(*exifIFD).forHost();
   }
   return record.storeInfoFromExifIFD(exifIFD);

@@ -12,8 +12,8 @@ namespace quavel::detail {
 namespace {
 
 // So few that the notes of any file fit on a screen.
-constexpr std::size_t kMaxSteps = 8;
-constexpr std::size_t kMaxHints = 8;
+constexpr std::size_t kMaxNotedSteps = 8;
+constexpr std::size_t kMaxNotedHints = 8;
 
 bool isLimit(QVReason reason) {
   return reason == QVReason::TooManyValues || reason == QVReason::TooMuchWork;
@@ -38,7 +38,7 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
                         Words words) {
-  if (position == 0 && !hasReadFailed && dataSize() == 0) {
+  if (position == 0 && !hasReadFailed && dataSize() == 0) {  // a size of 0 alone may be wrong
     refuse(QVReason::Empty, -1, "the file is empty", {});
     return;
   }
@@ -66,12 +66,12 @@ std::string Journal::cutText(std::int64_t end) {
   if (dataSize() <= 0) {  // not known, or a 0 that may be wrong
     return "the data ends before that";
   }
-  bool const isInFile = end <= dataSize();  // as when the file has grown since
+  bool const isInFile = end <= dataSize();  // such as when the file has grown since the read
   return isInFile ? "reading there fails" : composed("the file ends at {}", {Offset{dataSize()}});
 }
 
 void Journal::passed(std::int64_t position, char const* pattern, Words words) {
-  if (notedSteps_ == kMaxSteps) {
+  if (notedSteps_ == kMaxNotedSteps) {
     ++furtherSteps;
     return;
   }
@@ -80,7 +80,7 @@ void Journal::passed(std::int64_t position, char const* pattern, Words words) {
 }
 
 void Journal::hint(QVReason reason, std::int64_t position, char const* pattern, Words words) {
-  if (notedHints_ < kMaxHints) {
+  if (notedHints_ < kMaxNotedHints) {
     ++notedHints_;
     add(QVNoteKind::Hint, reason, position, composed(pattern, words));
   }

@@ -36,7 +36,7 @@ class Reading {
   Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
   /// False: the record may be of a host's class, which needs each directory's public `entries`.
-  bool isOwnRecord = false;
+  bool isLibraryRecord = false;
 
  private:
   bool refuseWork(Work work) const;  // always false
@@ -53,10 +53,10 @@ class ReadScope {
       stream_.reading_.current = &begun_;
     }
   }
-  /// For `readStream`: begins a read even during another. The record is of the library's own class.
+  /// For `readStream`: always begins a read. The record's class is one of the library's own.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
     begun_.journal = journal;
-    begun_.isOwnRecord = true;
+    begun_.isLibraryRecord = true;
     stream_.reading_.current = &begun_;
   }
   ~ReadScope() { stream_.reading_.current = outer_; }
@@ -81,7 +81,7 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal whether a read failed: `delivered` is then < 0, `error` the `errno` if known.
+/// Tells the journal whether `readBuffer` failed: then `delivered` < 0, `error` is `errno` or 0.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.

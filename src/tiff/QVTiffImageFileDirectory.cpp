@@ -11,7 +11,7 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
                                     std::vector<unsigned short> const& tags) {
   detail::ReadScope const scope(*stream);
   detail::WantedTags wanted(tags.data(), tags.size());
-  detail::EntryTable table(/*name=*/{}, detail::positionOf(*stream));
+  detail::EntryTable table(/*name=*/{}, detail::positionOf(*stream));  // both are for its notes
   if (!table.read(*stream, wanted)) {
     return false;
   }

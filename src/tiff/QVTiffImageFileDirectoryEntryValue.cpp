@@ -130,7 +130,7 @@ Float toFloat(EntryValue const& value) {
   });
 }
 
-/// What all integer accessors but `longValue` start from: floats saturate at the limits of int32.
+/// All integer accessors but `longValue` start from this: floats saturate at the limits of int32.
 std::uint32_t int32Bits(EntryValue const& value) { return to32Bits<std::int32_t>(value); }
 
 }  // namespace
@@ -150,7 +150,7 @@ bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream)
       return readInto(*this, *stream, &QVStream::readLong) &&  // a fraction: two numbers
              readInto(*this, *stream, &QVStream::readLong, /*position=*/4);
     default:
-      return false;  // UNDEFINED, or an unknown type: `type` is public
+      return false;  // UNDEFINED, or an unknown type: callers can set `type` to any number
   }
 }
 
