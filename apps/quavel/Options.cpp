@@ -36,7 +36,7 @@ class ShortFormatter : public CLI::Formatter {
   std::string make_positionals(CLI::App const* /*app*/) const override { return {}; }
 };
 
-/// An option that takes one value each time it is given.
+/// An option that takes one value each time it is given, and any number in all.
 template <class Set>
 void addRepeatable(CLI::App& command, char const* name, char const* type, char const* text,
                    Set set) {
@@ -58,7 +58,7 @@ void addInputs(CLI::App& command, Options& options) {
                 [&options](std::vector<std::string> const& globs) {
                   values::addExcluded(globs, options.inputs.filter.excluded);
                 });
-  command.add_flag("-0,--null", options.inputs.isNulSeparated, "Paths in that file end with a NUL")
+  command.add_flag("-0,--null", options.inputs.isNulSeparated, "NUL ends the --files-from paths")
       ->needs(list);
   auto* const standardInput =
       command.add_flag("--stdin", options.fromStdin, "Read one image from standard input");

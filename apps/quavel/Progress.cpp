@@ -60,8 +60,8 @@ Progress::~Progress() {
     isEnding_ = true;
   }
   endSignal_.notify_all();
-  if (counter_.joinable()) {
-    counter_.join();
+  if (totalCounter_.joinable()) {
+    totalCounter_.join();
   }
 }
 
@@ -83,7 +83,7 @@ void Progress::startCountingTotal() {
   }
   interrupt::BlockSignals const block;  // leaves signals to the thread that writes
   try {
-    counter_ = std::thread([this] {
+    totalCounter_ = std::thread([this] {
       try {
         countTotal();
       } catch (std::exception const&) {  // the total stays unknown

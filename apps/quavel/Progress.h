@@ -45,9 +45,9 @@ class Progress {
   std::size_t records_ = 0;
   std::size_t failures_ = 0;
   std::size_t shown_ = 0;
-  std::thread counter_;  // runs `countTotal`
-  std::mutex mutex_;     // guards `isEnding_`
-  std::condition_variable endSignal_;
+  std::thread totalCounter_;           // runs `countTotal`
+  std::mutex mutex_;                   // guards `isEnding_`
+  std::condition_variable endSignal_;  // ends a rest of `countTotal`
   bool isEnding_ = false;
   std::atomic<std::size_t> total_{0};  // how many files there are; 0: unknown
 };

@@ -38,7 +38,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                       "SubIFDs where the full image could be"
                     : "{} declares a reduced image (NewSubfileType bit 0) and none of its {} "
                       "SubIFDs says that it is the full image",
-         placed(mainIFD), count);
+         placed(mainIFD), count);  // the first pattern has no place for the count
   return nullptr;
 }
 

@@ -17,7 +17,7 @@ class Journal {
  public:
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
 
-  /// Whether all notes are wanted, not only the refusal and the hint at another format.
+  /// Whether all notes are wanted. If not, the `note...` functions below do nothing.
   bool wantsAll() const { return wantsAll_; }
 
   using Words = std::initializer_list<Word>;
@@ -28,7 +28,7 @@ class Journal {
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
   /// Notes a part that was read without trouble; after the first few, only counts it.
   void passed(std::int64_t position, char const* pattern, Words words);
-  /// Notes what else may explain the outcome, in a journal of any detail.
+  /// Notes what else may explain the outcome; after the first few, drops it.
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// Keeps the reason why a field may stay absent; replaces an earlier one for the same field.
   void absent(char const* field, QVReason reason, char const* pattern, Words words);

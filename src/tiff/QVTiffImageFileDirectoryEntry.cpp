@@ -30,7 +30,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
     }
     return hasWholeField(entry);
   }
-  auto const block = std::make_shared<ValueBlock>();
+  auto const block = std::make_shared<ValueBlock>();  // which all pointers in `values` share
   if (!hasWholeField(entry) || !readValues(*stream, entry, *block)) {
     return false;
   }

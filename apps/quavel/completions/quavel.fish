@@ -17,7 +17,7 @@ function __quavel_lists
 end
 
 complete -c quavel -l files-from -r -F -d 'Read the paths from a file'
-complete -c quavel -s 0 -l null -d 'Paths in that file end with a NUL'
+complete -c quavel -s 0 -l null -d 'NUL ends the --files-from paths'
 complete -c quavel -l hidden -d 'Walk hidden folders, and try files named ._*'
 complete -c quavel -l exclude -r -F -d 'Leave these names out of folders'
 complete -c quavel -l stdin -d 'Read one image from standard input'

@@ -86,7 +86,7 @@ std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
   auto const writer = [&output](TextOf textOf, char const* start, char const* separator) {
     return std::make_unique<TextWriter>(output, std::move(textOf), start, separator);
   };
-  switch (form.kind) {
+  switch (form.kind) {  // each text ends its own line, except in a JSON array
     case FormKind::Json:
       output.enclose("[", "\n]\n");
       return writer(jsonObjects(form, isTerminal), "\n", ",\n");
