@@ -16,10 +16,10 @@ void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
 /// Drops slashes at a glob's end. A glob with a slash elsewhere matches whole paths or their ends.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
-/// Whether the choice is `yes`, such as "show", and not `no`, such as "skip".
+/// Whether the choice is the word `yes`, such as "show". The only other is `no`, such as "skip".
 bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
 unsigned jobsOf(std::string const& text);
-/// A check that the parser calls: returns why the argument is wrong, or an empty text.
+/// For the parser's `check`: returns what is wrong if the argument is empty, else an empty text.
 std::string refuseEmptyFileName(std::string const& argument);
 
 }  // namespace app::values

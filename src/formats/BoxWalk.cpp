@@ -25,9 +25,9 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   if (!readingOf(*stream).spend(Work::Steps, 1)) {
     return false;
   }
-  // If the previous box ends beyond all offsets, `leaveBox` has stopped at `kOutOfReach` instead.
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
+    // The stream stops short if the previous box ends beyond all offsets or beyond a buffer.
     std::int64_t const nextBox = std::max(std::int64_t{start}, context.previousEnd);
     return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
                      "the header of the next box{}", context);

@@ -24,16 +24,16 @@ struct PlacedBox {
 };
 void append(std::string& out, PlacedBox box);
 
-/// Where a box was met, as a note says it after the box: " in the moov box at 0x18 (24)".
+/// Where a walk over boxes is. A note says it after a box: " in the moov box at 0x18 (24)".
 struct BoxContext {
   char const* text = "";
-  PlacedBox parent = {};         ///< Appended to the text; type 0: there is none.
-  std::int64_t previousEnd = 0;  ///< The offset where the previous box ends; perhaps out of reach.
+  PlacedBox parent = {};         ///< Appended to the text, unless its type is 0.
+  std::int64_t previousEnd = 0;  ///< The offset where the previous box ends, reachable or not.
 };
 void append(std::string& out, BoxContext context);
 
-/// Reads the box header at the stream's position and moves past the box. False: the header cannot
-/// be read, the size in it is smaller than the header itself, or there are too many boxes.
+/// Reads the box header at the stream's position. Moves past the box and sets `previousEnd`.
+/// False: the header cannot be read, the size in it is below 8, or there are too many boxes.
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header);
 
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.

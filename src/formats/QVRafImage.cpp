@@ -18,10 +18,9 @@ constexpr std::array<std::uint8_t, 8> kMagic = {'F', 'U', 'J', 'I', 'F', 'I', 'L
 constexpr long kImageOffsetPosition = 84;
 constexpr long kRawSectionOffsetPosition = 100;
 
-// The TIFF header comes after SOI, the APP1 marker, a length (2 bytes each), "Exif" and two zeros.
-constexpr std::uint32_t kTiffHeaderInImage = 12;
+// In the JPEG: SOI, the APP1 marker, a length (2 bytes each), "Exif" and two zeros.
+constexpr std::uint32_t kBytesBeforeTiffHeader = 12;
 
-/// Reads the offset of a section from the file's header.
 bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, long position,
                        std::uint32_t& offset) {
   stream->byteOrder = ByteOrder::BigEndian;
@@ -35,7 +34,7 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
 }
 
 /// Whether a JPEG begins with SOI and an Exif segment, of any length (bytes 4 and 5).
-bool opensWithExif(std::array<std::uint8_t, kTiffHeaderInImage> const& bytes) {
+bool opensWithExif(std::array<std::uint8_t, kBytesBeforeTiffHeader> const& bytes) {
   return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
          std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
 }
@@ -46,7 +45,7 @@ void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   if (!wantsAll(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
     return;
   }
-  std::array<std::uint8_t, kTiffHeaderInImage> opening = {};
+  std::array<std::uint8_t, kBytesBeforeTiffHeader> opening = {};
   std::size_t const received = readUpTo(stream, opening.data(), opening.size());
   if (received != 0 && !opensWithExif(opening)) {
     noteHint(journal, QVReason::OtherOpening, imageOffset,
@@ -76,7 +75,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
-  stream->baseOffset = imageOffset + kTiffHeaderInImage;  // on purpose a 32-bit sum: it may wrap
+  stream->baseOffset = imageOffset + kBytesBeforeTiffHeader;  // a 32-bit offset too: it may wrap
   stream->setOffset(0);
   if (!readMainIFD(stream)) {
     noteOtherOpening(*stream, imageOffset);
@@ -101,7 +100,7 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;
+  DirectoryPointer exifIFD;  // not needed here: `readExifIFD` has its date stored
   return readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                      exifIFD);
 }

@@ -56,8 +56,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // A stream may ignore the seek to an entry's values: they are then read from where it stands.
-    // That must be right after the entry, however far the walk has read ahead.
+    // If the stream refuses the later seek to the entry's values, they are read where it stands.
+    // So it first goes to the entry's end, however far the walk has read ahead.
     if (!seek(stream, walk.nextOffset()) || !walk.parseRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",

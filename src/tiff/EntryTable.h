@@ -22,7 +22,7 @@ namespace detail {
 
 class Journal;
 
-/// The wanted entries of a directory, with all their values in one array.
+/// A directory's wanted entries, their values in one array; its name and position are for notes.
 class EntryTable {
  public:
   struct Row {
@@ -60,7 +60,7 @@ class EntryTable {
   }
 
   using Map = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
-  /// The entries, for a host to keep. Moves the values out: the table has none afterwards.
+  /// The entries for a host to keep. The values are moved out of the table.
   std::shared_ptr<Map> takeEntries();
 
   PartName const& name() const { return name_; }
@@ -81,24 +81,25 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
+// The next three functions and `takeEntries` serve hosts; they are defined in HostEntry.cpp.
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
-/// Pointers for a host to `count` values of a block from `first` on; each keeps the block alive.
+/// Pointers to `count` values of a block, from index `first` on; each keeps the block alive.
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// What is kept of an UNDEFINED entry: up to 4 bytes as in the file, with zeros for those that the
-/// data lacks. Of more than 4 bytes, only their offset.
+/// What is kept of an UNDEFINED entry. Up to 4 bytes are kept as in the file, with zeros for those
+/// after the data's end. Of more bytes, their offset is kept, in this machine's byte order.
 std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed);
 
-/// Stores in an entry for a host what `undefinedBytesOrOffset` gave, and the `count` of the bytes.
+/// Gives an entry for a host its `count` bytes or their offset, from `undefinedBytesOrOffset`.
 void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
                     QVTiffImageFileDirectoryEntry& entry);
 
 /// A directory in a note: "IFD0 at 8".
 struct PlacedDirectory {
-  EntryTable const* table;  ///< Null for a host's directory, which no note names.
+  EntryTable const* table;  ///< Null for a host's directory: `append` is not called then.
 };
 void append(std::string& out, PlacedDirectory directory);
 

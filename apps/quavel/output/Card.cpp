@@ -31,7 +31,7 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
     return {};
   }
   static Fields const usualFields = cardFields();
-  bool const fieldsAreChosen = !form.fields.empty();
+  bool const fieldsAreChosen = !form.fields.empty();  // then a path is shown only as one of them
   bool const showAbsent = form.showAbsent.value_or(fieldsAreChosen);
   std::string card = fieldsAreChosen ? "" : escapedPath(outcome.path) + "\n";
   for (auto const* field : fieldsAreChosen ? form.fields : usualFields) {

@@ -9,13 +9,13 @@ namespace {
 constexpr std::size_t kLeastWidth = 3;      // of a chosen field's column, in cells
 constexpr std::size_t kLeastPathWidth = 8;  // the same for the path's column
 constexpr std::size_t kDateColumn = 1;      // its index among the default columns
-constexpr std::size_t kDay = 10;            // the length of "2018-02-21"
-constexpr std::size_t kMinute = 16;         // the length of "2018-02-21 12:08"
+constexpr std::size_t kDayEnd = 10;         // where the day ends in a date: "2018-02-21"
+constexpr std::size_t kMinuteEnd = 16;      // where the minute ends: "2018-02-21 12:08"
 
 std::vector<Column> defaultColumns() {
   // Label, least width, rank (the highest is left out first, 0 never), keeps its end when cut.
-  return {{"File", 20, 0, true},     {"Captured", kMinute, 1, false}, {"Size", 9, 6, false},
-          {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},        {"Lens", 12, 4, false},
+  return {{"File", 20, 0, true},     {"Captured", kMinuteEnd, 1, false}, {"Size", 9, 6, false},
+          {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},           {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};
 }
 
@@ -25,7 +25,7 @@ std::string wordsOf(std::string_view name, Outcome const& outcome) {
 
 std::string toTheMinute(std::string const& date) {
   bool const isWellMade = date.size() == 19 && date[4] == '-' && date[13] == ':' && date[16] == ':';
-  return isWellMade ? date.substr(0, kMinute) : date;
+  return isWellMade ? date.substr(0, kMinuteEnd) : date;
 }
 
 std::string withoutVerb(std::string const& orientation) {
@@ -68,8 +68,8 @@ Row rowOf(Fields const& fields, Outcome const& outcome) {
 
 void dropTime(Row& row) {
   std::string& date = row[kDateColumn];
-  if (date.size() == kMinute && date[4] == '-' && date[13] == ':') {
-    date.resize(kDay);
+  if (date.size() == kMinuteEnd && date[4] == '-' && date[13] == ':') {
+    date.resize(kDayEnd);
   }
 }
 
