@@ -27,14 +27,14 @@ constexpr std::int64_t kMarkerSize = 2;
 constexpr std::int64_t kLengthSize = 2;
 constexpr std::int64_t kPayloadPosition = 4;  // from the segment's start
 
-// An image size in an Exif directory is taken for a thumbnail's if a side is not above this limit.
+// An image size in an Exif directory is taken for a thumbnail's unless both sides exceed this.
 constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// Bytes to skip after markers of which no length is read: DRI's length and interval, or the 2 bytes
-// after a marker without payload, whatever they are. The walk uses this array, not the public
-// map below, which may not be initialised yet when a host's static object reads a file.
+// Bytes to skip after the markers whose length is not read: after DRI its length and interval,
+// after a marker without payload the next 2 bytes, whatever they are. The walk uses this array, not
+// the public map below, which may not be initialised yet when a host's static object reads a file.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -122,7 +122,7 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   if (marker == kSOS && walk.firstScan < 0) {
     walk.firstScan = walk.start;
     bool const sawNeither = !walk.sawAPP1 && !walk.sawSOF0;
-    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // seeing both ends the walk
+    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // after both, the walk is over
     walk.missingAtScan = sawNeither ? "SOF0 or APP1" : missingOne;
   }
   // After an SOS segment, picture data may look like an SOF2 marker.

@@ -22,7 +22,7 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   source.setOffset(0);
   bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` now says 0; one that has moved, the target cut to a `long`.
+  // Now a source that ignores `baseOffset` still says 0; one that has moved says the cut target.
   return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -62,7 +62,7 @@ void QVReadAheadStream::setOffset(long const& offset) {
 
 bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
   sourcePosition_ = -1;  // the source is moved below
-  // A source that refuses the seek stays at 0; one that goes to its end instead is taken to accept.
+  // A source that stays at 0 refuses the seek. One that goes elsewhere, as to its end, accepts it.
   source_->setOffset(0);
   if (fitsLong(target)) {
     source_->setOffset(static_cast<long>(target));

@@ -29,7 +29,7 @@ bool QVTiffHeader::read(std::shared_ptr<QVStream>& stream, unsigned short expect
 bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
                             QVTiffHeader& header) {
   Journal* const journal = journalOf(stream);
-  // If a damaged file puts `baseOffset` beyond a buffer's end, the stream stands at that end.
+  // The stream stands before `start` if a damaged file puts `baseOffset` beyond a buffer's end.
   std::int64_t const start = std::max(notedPosition(journal, stream), stream.baseOffset);
   PartName const name = {"the TIFF header", structure};
 

@@ -87,7 +87,7 @@ class WantedTags {
 
   bool const wantsAll_;
   std::uint64_t mask_ = 0;  // the `bitOf` of all listed tags: rules out most others quickly
-  std::size_t left_ = 0;    // listed tags that are still to be met
+  std::size_t left_ = 0;    // listed tags that are still to be met; a short list begins with them
   std::array<unsigned short, kMaxShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null while the short list is enough
 };

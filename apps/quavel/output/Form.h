@@ -8,7 +8,7 @@
 
 namespace app {
 
-/// Automatic: the notes with `hasNotes`, else a card for a single file, else a table.
+/// Automatic shows the notes if `hasNotes` is set, else a card for a single file, else a table.
 enum class FormKind { Automatic, Table, Card, Json, Jsonl, Csv, Paths };
 
 /// How the files are shown.
@@ -23,7 +23,7 @@ struct Form {
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
-  /// Whether programs read its values. `Paths`, the kind for --print0, has no values.
+  /// Whether it gives programs values of fields. `Paths`, the kind for --print0, gives none.
   bool isForMachines() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }

@@ -13,12 +13,12 @@ bool mayNeedEscapes(std::string const& text) {
 }
 
 /// Appends a value that is not absent. An infinity is quoted: JSON has no number for it. The JSON
-/// library writes the few texts that may need escapes. If such a text could steer a terminal, the
-/// terminal gets \uNNNN for all that is not ASCII.
+/// library writes the few texts that may need escapes.
 void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && mayNeedEscapes(*text)) {
+    // A terminal gets \uNNNN for all that is not ASCII if the text could steer it.
     bool const asAscii = isForTerminal && escaped(*text) != *text;
     json += nlohmann::json(*text).dump(-1, ' ', asAscii, nlohmann::json::error_handler_t::replace);
   } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
@@ -54,7 +54,7 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
          (outcome.furtherSteps == 0 ? "" : further);
 }
 
-/// How a field is written in an object.
+/// How a field is written in an object, whose "{" then replaces the first comma.
 struct Member {
   Field const* field;
   std::string name;    // such as `,"iso":`
@@ -89,18 +89,18 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 TextOf jsonObjects(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // An object with a path also gets its pathBytes, which only a path that is not UTF-8 has.
+  // An object with a path that is not UTF-8 also gets pathBytes, even if `fields` lacks them.
   bool const recordNeedsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, recordNeedsPathBytes, ofRecord = membersOf(fields),
-          ofProblem = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
-                                 fieldNamed("position")}),
-          pathBytes = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
+  return [&form, isForTerminal, recordNeedsPathBytes, recordMembers = membersOf(fields),
+          problemMembers = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
+                                      fieldNamed("position")}),
+          pathBytesMember = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
     std::string object;
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
-    appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome,
+    appendMembers(object, outcome.record ? recordMembers : problemMembers, outcome,
                   form.showAbsent.value_or(true), isForTerminal);
     if (!outcome.record || recordNeedsPathBytes) {
-      appendMembers(object, pathBytes, outcome, /*showAbsent=*/false, isForTerminal);
+      appendMembers(object, pathBytesMember, outcome, /*showAbsent=*/false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
     object.replace(0, 1, "{");  // in place of the first comma; an empty object has none

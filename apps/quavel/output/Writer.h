@@ -13,7 +13,7 @@ class Writer {
  public:
   virtual ~Writer() = default;
 
-  /// Sets the outcome's text or cells, and may then drop the record. Called on any thread.
+  /// Sets the outcome's text or cells; may drop what `add` does not need. Called on any thread.
   virtual void prepare(Outcome& outcome) const = 0;
   /// The same, but an exception becomes the outcome's `problem`.
   void prepareOrSetProblem(Outcome& outcome) const;
