@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  BoxContext context = {" before a moov box was met"};  // what notes say after a box
+  BoxContext context = {" before a moov box was met"};  // notes put it after a box's name
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
@@ -23,9 +23,9 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
     PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};
     notePassed(scope.reading().journal, found.position, "{}: {} bytes", found, header.boxSize);
     if (found.type == box::Moov) {
-      stream->setOffset(boxStart);  // `moov.read` begins at the header
-      QVCR3MoovBox moov;
-      return moov.read(stream) && storeInfoFromMoov(*stream, moov, found.position);
+      stream->setOffset(boxStart);  // `moovBox.read` begins at the header
+      QVCR3MoovBox moovBox;
+      return moovBox.read(stream) && storeInfoFromMoov(*stream, moovBox, found.position);
     }
   }
 }
@@ -73,7 +73,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  // A CMT1 box gives neither of these two dates: what the record held before is cleared.
+  // These two dates of a CMT1 box are always empty: they clear what the record held before.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

@@ -28,7 +28,7 @@ bool Source::nextOfPaths(Input& input) {
       }
       walk_.reset();
       if (isWalkEmpty_) {
-        std::string const refusal = whyUnknown("");  // ends with ": " and the known extensions
+        std::string const refusal = whyUnknown("");  // "... these name a format: tiff tif ..."
         report_(inputs_.paths[nextPath_ - 1],
                 "no photos found in it; hidden and excluded names are "
                 "skipped, and others must end in" +
@@ -45,7 +45,7 @@ bool Source::nextOfPaths(Input& input) {
       continue;
     }
     bool const isRegular = exists && S_ISREG(status.st_mode) && isPhotoExtension(extensionOf(path));
-    input = {path, isRegular, /*problem=*/{}};
+    input = {path, isRegular, /*problem=*/{}};  // if it names no photo, reading says why
     return true;
   }
   return false;

@@ -10,7 +10,7 @@
 
 namespace app {
 
-/// Where the photos' paths come from.
+/// What the command line names: photos and folders, and a list of more photos.
 struct Inputs {
   std::vector<std::string> paths;
   std::string list;             ///< A file of paths; "-": standard input; empty: none.

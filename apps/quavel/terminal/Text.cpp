@@ -46,7 +46,7 @@ std::size_t cellsOf(Character const& character) {
   }
 }
 
-/// Whether a character has no glyph of its own but changes how others or the line appear.
+/// Whether a character has no glyph of its own but changes how the text around it appears.
 bool isHidden(Character const& character) {
   constexpr utf8proc_int32_t kNonJoiner = 0x200c;
   constexpr utf8proc_int32_t kJoiner = 0x200d;
@@ -87,7 +87,7 @@ bool isUtf8(std::string_view text) {
 
 bool isPlain(std::string_view text) {
   // Eight bytes at a time. Bytes from 0x80 on have the top bit; those below ' ' get it when ' ' is
-  // subtracted, and 0x7f when 1 is added. Printable bytes never get it, and never borrow or carry.
+  // subtracted, 0x7f when 1 is added. Printable bytes never do; only bytes that do borrow or carry.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = 0;

@@ -14,9 +14,9 @@ std::string textAsUtf8(std::string text);
 /// A file name as UTF-8: each byte that is not UTF-8, and each NUL, is replaced by U+FFFD.
 std::string pathAsUtf8(std::string const& path);
 
-/// The text with all that could steer a terminal or mislead its reader made visible: control
-/// characters, bytes that are not UTF-8 and characters that reorder their neighbours become \n, \t,
-/// \xNN or \u{NNNN}. Always one line of valid UTF-8.
+/// Makes visible all that could steer a terminal or mislead its reader: control characters, bytes
+/// that are not UTF-8 and characters that reorder their neighbours become \n, \t, \xNN or \u{NNNN}.
+/// The result is always one line of valid UTF-8.
 std::string escaped(std::string const& text);
 /// The same for a path; its own backslashes are doubled, to tell them from those of an escape.
 std::string escapedPath(std::string path);
