@@ -112,7 +112,7 @@ void Pipeline::workOn(Batch& batch) {
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file never waits; reading any other does, at least once. The majority decides.
+  // Reading a cached file causes no wait, any other at least one. The majority of files decides.
   if (isMeasured) {
     waitsForDisk_ = 2 * (countWaits() - waitsBefore) > static_cast<long>(batch.inputs.size());
   }

@@ -27,7 +27,7 @@ struct Batch {
   std::exception_ptr failure;  ///< What the work threw.
 };
 
-/// In seconds: a longer batch holds results back, a far shorter one is not worth handing over.
+/// In seconds: a longer batch delays results, a far shorter one is not worth giving to a thread.
 constexpr double kLongBatch = 0.002;
 /// How many files the next batch should have, `size` being the number so far: half as many if the
 /// batch `done` took too long or gave too much text, else twice as many, up to a maximum.
@@ -47,7 +47,7 @@ class Pipeline {
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
 
-  /// Hands a batch to the threads. Works on the first itself, and on all if there is only one job.
+  /// Hands a batch to the threads. The first is done in this call, as all are with only one job.
   void submit(std::unique_ptr<Batch> batch);
   /// Waits for the oldest batch, which must exist, and returns it or throws what its work threw.
   std::unique_ptr<Batch> take();

@@ -9,13 +9,13 @@ using namespace detail;
 
 namespace {
 
-/// Reads the child that begins at `start`, in place of the one kept before, if any.
+/// Reads the child that begins at `start` and keeps it instead of an earlier one.
 template <class MetadataBox>
-bool readKeptChild(std::shared_ptr<QVStream>& stream, long start,
-                   std::shared_ptr<MetadataBox>& kept) {
+bool readAndKeepChild(std::shared_ptr<QVStream>& stream, long start,
+                      std::shared_ptr<MetadataBox>& kept) {
   stream->setOffset(start);
   kept = std::make_shared<MetadataBox>();
-  return kept->read(stream);
+  return kept->read(stream);  // moves to the child's end
 }
 
 }  // namespace
@@ -24,7 +24,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   Journal* const journal = scope.reading().journal;
   long const start = stream->getOffset();
-  if (!QVCR3Box::read(stream)) {
+  if (!QVCR3Box::read(stream)) {  // reads the header, skips the payload
     return false;
   }
   PlacedBox const uuid = {boxHeader->type(), stream->baseOffset + start};
@@ -60,8 +60,8 @@ bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
     if (type != box::CMT1 && type != box::CMT2) {
       continue;
     }
-    bool const isRead = type == box::CMT1 ? readKeptChild(stream, childStart, cmt1Box)
-                                          : readKeptChild(stream, childStart, cmt2Box);
+    bool const isRead = type == box::CMT1 ? readAndKeepChild(stream, childStart, cmt1Box)
+                                          : readAndKeepChild(stream, childStart, cmt2Box);
     if (!isRead) {
       return false;
     }

@@ -10,7 +10,7 @@ namespace {
 
 using EntryValue = QVTiffImageFileDirectoryEntryValue;
 
-// How many bytes are read at a time: a multiple of every value's size.
+// How many bytes are read at a time, at most.
 constexpr std::size_t kMaxPartSize = 512;
 
 template <class Number>
@@ -51,13 +51,13 @@ bool readValues(QVStream& stream, RawEntry const& entry, std::vector<EntryValue>
   }
 
   std::array<std::uint8_t, kMaxPartSize> part;
-  for (std::size_t left = entry.count; left > 0;) {
+  for (std::size_t left = entry.count; left > 0;) {  // one pass is enough if `isInField`
     std::size_t const partCount = std::min(left, kMaxPartSize / size);
     std::size_t const partSize = partCount * size;
     if (!isInField && readUpTo(stream, part.data(), partSize) < partSize) {
       return false;
     }
-    std::uint8_t const* bytes = isInField ? entry.field : part.data();  // a field fits in one part
+    std::uint8_t const* bytes = isInField ? entry.field : part.data();
     std::size_t const oldSize = values.size();
     values.resize(oldSize + partCount);
     EntryValue* value = values.data() + oldSize;

@@ -19,7 +19,7 @@ inline constexpr std::size_t kValueCountPosition = 4;
 inline constexpr std::size_t kEntryFieldPosition = 8;
 inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
-inline constexpr std::int64_t kEntryCountSize = 2;  // of the entry count, before the first entry
+inline constexpr std::int64_t kEntryCountSize = 2;  // a directory begins with its entry count
 
 inline constexpr std::uint16_t kUndefinedCode = 7;  // of the type UNDEFINED
 
@@ -28,14 +28,14 @@ struct RawEntry {
   std::uint16_t typeCode;
   std::uint32_t count;
   std::uint8_t const* field;  ///< The values, or their offset.
-  std::size_t fieldSize;      ///< How many of the field's 4 bytes the data holds.
+  std::size_t fieldSize;      ///< How many of the field's bytes were read; the file may end early.
 };
 
-// In real files, the longest wanted entries are texts of a few hundred values. With this bound, an
+// In real files, the longest wanted entries are texts of a few hundred bytes. With this bound, an
 // entry with a damaged count takes less than 2 MB of memory.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
-/// Bytes of one value, by EntryValueType (not by the type's code in the file); 0 for UNDEFINED.
+/// Bytes of one value, by EntryValueType, not by its code in files. Hosts get 0 for UNDEFINED.
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
 inline bool isKnown(std::uint16_t typeCode) {
@@ -60,7 +60,7 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
   return static_cast<std::size_t>(std::min<std::uint64_t>(sizeOfValues(entry), kEntryFieldSize));
 }
 
-/// Whether the data holds all the bytes of the field that the entry uses.
+/// Whether all the bytes of the field that the entry uses were read.
 inline bool hasWholeField(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
 
 /// The offset that the field holds. `entry.fieldSize` must be 4.

@@ -9,7 +9,8 @@
 
 namespace app {
 
-/// Gives the text that a form shows for one file. Called on any thread.
+/// Gives the text that a form shows for one file. Called on any thread. If the form is given
+/// `isForTerminal`, characters that could steer the terminal are escaped.
 using TextOf = std::function<std::string(Outcome const&)>;
 
 /// A card: labelled lines for people. Empty when the file gave no record.
@@ -18,8 +19,7 @@ std::string cardOf(Form const& form, Outcome const& outcome);
 /// Why a file gives no record, or which fields its record lacks and why: a verdict, then details.
 std::string explanationOf(Outcome const& outcome);
 
-/// Comma-separated values by RFC 4180: a header row, then a row for each file. Absent values are
-/// empty. For a terminal, texts are made safe by `escaped`.
+/// CSV by RFC 4180: a header row, then a row for each file. Absent values are empty.
 std::string csvHeader(Form const& form);
 TextOf csvRows(Form const& form, bool isForTerminal);
 

@@ -38,7 +38,7 @@ constexpr Relation kRelations[] = {
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// Parses the whole text as the type that the visited function of Words takes; absence if it fails.
+/// Parses the whole text as the type that the field's Words function takes; no value if it fails.
 struct ParseFor {
   std::string_view text;
 
@@ -61,8 +61,8 @@ struct ParseFor {
 /// Dates compare alike in every notation: as files have them, as people see them and in ISO 8601.
 Value comparable(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
-  auto const* const textWords = std::get_if<std::string (*)(std::string const&)>(&field.words);
-  bool const isDateField = textWords != nullptr && *textWords == words::date;
+  auto const* const textToWords = std::get_if<std::string (*)(std::string const&)>(&field.words);
+  bool const isDateField = textToWords != nullptr && *textToWords == words::date;
   if (isDateField && text != nullptr) {
     std::replace(text->begin(), text->end(), ':', '-');
     std::replace(text->begin(), text->end(), 'T', ' ');

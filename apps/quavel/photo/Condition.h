@@ -18,7 +18,7 @@ class Condition {
   /// the field, throws std::invalid_argument with a message that quotes the wrong part.
   Condition(Field const& field, std::string_view comparison);
 
-  /// Compares exact values. False when the value is absent.
+  /// Compares the exact value, not the words for people. False when the value is absent.
   bool holds(Outcome const& outcome) const;
 
  private:
