@@ -25,7 +25,7 @@ double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-/// Whether the list of paths, if there is one, is a regular file, which can be read twice.
+/// Whether the inputs can be read twice: there is no list of paths, or it is a regular file.
 bool isRereadable(std::string const& list) {
   struct stat status = {};
   bool const isFile = ::stat(list.c_str(), &status) == 0 && S_ISREG(status.st_mode);
@@ -131,8 +131,9 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
+  // Of one file, the output shows the record or, with --why, the reason why there is none.
   bool const isOutputEnough = files == 1 && (failures_ == 0 || options_.form.isExplanation());
-  if (options_.isQuiet || isOutputEnough) {  // one file's record, or why there is none
+  if (options_.isQuiet || isOutputEnough) {
     return;
   }
   double const seconds = secondsSince(start_);

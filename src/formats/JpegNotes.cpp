@@ -15,7 +15,7 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
     noteHint(journal, QVReason::ReadError, end, "The walk ends at {}, where {}", Offset{end},
              journal->cutText(end));
   } else {
-    notePassed(journal, end, "end of the data at {}, where the walk ends", Offset{end});
+    noteStep(journal, end, "end of the data at {}, where the walk ends", Offset{end});
   }
 }
 

@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  BoxContext context = {" before a moov box was met"};  // notes put it after a box's name
+  BoxContext context = {" before a moov box was met"};  // in notes on other boxes
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
@@ -21,7 +21,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
       return false;
     }
     PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};
-    notePassed(scope.reading().journal, found.position, "{}: {} bytes", found, header.boxSize);
+    noteStep(scope.reading().journal, found.position, "{}: {} bytes", found, header.boxSize);
     if (found.type == box::Moov) {
       stream->setOffset(boxStart);  // `moovBox.read` begins at the header
       QVCR3MoovBox moovBox;
@@ -73,7 +73,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  // These two dates of a CMT1 box are always empty: they clear what the record held before.
+  // Always empty: these two clear the dates that a host's own record may have held before.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

@@ -42,8 +42,8 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
     }
   }
   bool const isMetadata = userType == metadataUUID;
-  notePassed(journal, uuid.position, "{}: {}", uuid,
-             isMetadata ? "the metadata" : "another identifier");
+  noteStep(journal, uuid.position, "{}: {}", uuid,
+           isMetadata ? "the metadata" : "another identifier");
   bool const isRead = !isMetadata || readChildren(stream, end);  // any other box is skipped
   leaveBox(*stream, end);
   return isRead;

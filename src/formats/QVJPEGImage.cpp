@@ -65,7 +65,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   Reading& reading = scope.reading();
   Journal* const journal = reading.journal;
   stream->byteOrder = ByteOrder::BigEndian;
-  std::int64_t const start = notedPosition(journal, *stream);
+  std::int64_t const start = positionForNotes(journal, *stream);
   unsigned short marker = 0;
   if (!stream->readShort(&marker)) {
     return refuseCut(journal, start, kMarkerSize, "the SOI marker");
@@ -80,7 +80,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   WalkState walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
-    walk.start = notedPosition(journal, *stream);
+    walk.start = positionForNotes(journal, *stream);
     if (!stream->readShort(&marker)) {
       noteEnd(journal, walk.start);
       break;
@@ -140,8 +140,8 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
                      "the identifier of the APP1 segment at {}", Offset{walk.start});
   }
   bool const isExif = identifier == kExifIdentifier;
-  notePassed(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
-             isExif ? "Exif" : "not Exif");
+  noteStep(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
+           isExif ? "Exif" : "not Exif");
   if (isExif) {
     unsigned short twoZeros = 0;  // not checked
     if (!stream->readShort(&twoZeros)) {
@@ -169,8 +169,8 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
                      sizeof(precision) + sizeof(height) + sizeof(width), "the SOF0 segment at {}",
                      Offset{walk.start});
   }
-  notePassed(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
-             Offset{walk.start}, width, height);
+  noteStep(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
+           Offset{walk.start}, width, height);
   // Until an APP1 is met, the walk goes on and may find more frames: the greatest sides count.
   if (walk.sof0 < 0 || width > walk.frameWidth || height > walk.frameHeight) {
     walk.sof0 = walk.start;

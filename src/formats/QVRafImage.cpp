@@ -28,8 +28,8 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
   if (!stream->readLong(&offset)) {
     return refuseCut(journalOf(*stream), position, sizeof(offset), "the offset of {}", section);
   }
-  notePassed(journalOf(*stream), position, "offset of {} at {}: {}", section, Offset{position},
-             Offset{offset});
+  noteStep(journalOf(*stream), position, "offset of {} at {}: {}", section, Offset{position},
+           Offset{offset});
   return true;
 }
 

@@ -17,7 +17,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
     PartName const name = {"SubIFD", kWholeFile, /*number=*/i + 1, count};
-    // Orientation is listed, though not stored, because a malformed entry shows a damaged file.
+    // Orientation is not stored: listing it makes a malformed entry refuse the file, as damaged.
     auto subIFD =
         readDirectoryAt(stream, name, subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});

@@ -95,7 +95,7 @@ std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) 
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
   auto stream = openReadAhead(path, journal == nullptr ? nullptr : &journal->fd);
   if (journal != nullptr && journal->fd == -1) {
-    // `readStream` will refuse the empty stream too, but only the first refusal counts.
+    // Noted before `readStream` refuses the stream, which is empty then: the first refusal counts.
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));
@@ -111,7 +111,7 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     return nullptr;
   }
   ReadScope const scope(*stream, journal);
-  std::int64_t const start = notedPosition(journal, *stream);
+  std::int64_t const start = positionForNotes(journal, *stream);
   auto record = format->makeRecord();
   if (!record->read(stream)) {
     record = nullptr;

@@ -70,7 +70,7 @@ std::string Journal::cutText(std::int64_t end) {
   return isInFile ? "reading there fails" : composed("the file ends at {}", {Offset{dataSize()}});
 }
 
-void Journal::passed(std::int64_t position, char const* pattern, Words words) {
+void Journal::step(std::int64_t position, char const* pattern, Words words) {
   if (notedSteps_ == kMaxNotedSteps) {
     ++furtherSteps;
     return;

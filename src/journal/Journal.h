@@ -27,7 +27,7 @@ class Journal {
   /// Refuses because the `count` bytes at `position` are missing; the pattern says what they are.
   void refuseCut(std::int64_t position, std::int64_t count, char const* pattern, Words words);
   /// Notes a part that was read without trouble; after the first few, only counts it.
-  void passed(std::int64_t position, char const* pattern, Words words);
+  void step(std::int64_t position, char const* pattern, Words words);
   /// Notes what else may explain the outcome; after the first few, drops it.
   void hint(QVReason reason, std::int64_t position, char const* pattern, Words words);
   /// Keeps the reason why a field may stay absent; replaces an earlier one for the same field.
@@ -43,7 +43,7 @@ class Journal {
   std::string cutText(std::int64_t end);
 
   std::vector<QVNote> notes;
-  std::uint64_t furtherSteps = 0;  ///< Parts that `passed` only counted.
+  std::uint64_t furtherSteps = 0;  ///< Parts that `step` only counted.
   char const* format = "";         ///< See `QVJournal::format`.
   int fd = -1;                     ///< Of the file being read; -1: the data is not a file.
   std::int64_t knownSize = -1;     ///< What `dataSize` gives, once it is known.
@@ -85,9 +85,9 @@ template <class... Values>
 }
 
 template <class... Values>
-void notePassed(Journal* journal, std::int64_t position, char const* pattern, Values... words) {
+void noteStep(Journal* journal, std::int64_t position, char const* pattern, Values... words) {
   if (wantsAll(journal)) {
-    journal->passed(position, pattern, {words...});
+    journal->step(position, pattern, {words...});
   }
 }
 

@@ -88,7 +88,7 @@ void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 inline std::int64_t positionOf(QVStream& stream) { return stream.baseOffset + stream.getOffset(); }
 
 /// `positionOf` for a note; without a journal 0, as asking the stream may cost a system call.
-inline std::int64_t notedPosition(Journal const* journal, QVStream& stream) {
+inline std::int64_t positionForNotes(Journal const* journal, QVStream& stream) {
   return journal == nullptr ? 0 : positionOf(stream);
 }
 

@@ -73,7 +73,7 @@ void append(std::string& out, QuotedBytes bytes) {
 
 std::string composed(char const* pattern, std::initializer_list<Word> words) {
   std::string text;
-  text.reserve(kMaxTextLength / 4);  // most texts are shorter
+  text.reserve(kMaxTextLength / 4);  // enough for most texts
   std::string_view rest = pattern;
   for (Word const& word : words) {
     auto const brace = rest.find('{');  // of a "{}": patterns have no other braces

@@ -105,8 +105,8 @@ bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList ta
   if (!stream.readLong(nextIFDOffset)) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }
-  notePassed(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
-             static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
+  noteStep(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
+           static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
   return true;
 }
 

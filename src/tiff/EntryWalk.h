@@ -12,8 +12,8 @@ namespace quavel::detail {
 /// A walk over a directory's entries, of which it reads up to 64 at a time.
 class EntryWalk {
  public:
-  /// The stream stands at the first of `count` entries. Notes need the entry's `position` in the
-  /// file; the stream's own offsets count from its `baseOffset`.
+  /// The stream stands at the first of `count` entries, which is at `position` in the file, as
+  /// notes need it; the stream's own offsets count from its `baseOffset`.
   EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
         isReversed_(needsReversal(stream)),
@@ -36,8 +36,8 @@ class EntryWalk {
   /// Where the current entry begins in the file.
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
-  /// Buffers the current entry, which may move the stream. False: its tag is not all there. The
-  /// buffer holds whole entries unless the data ends.
+  /// Buffers the current entry, which may move the stream. False: its tag is not all there. If the
+  /// tag is buffered, so is the rest, or the data ends: whole entries are read.
   bool bufferEntry() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }

@@ -30,7 +30,7 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
                             QVTiffHeader& header) {
   Journal* const journal = journalOf(stream);
   // The stream stands before `start` if a damaged file puts `baseOffset` beyond a buffer's end.
-  std::int64_t const start = std::max(notedPosition(journal, stream), stream.baseOffset);
+  std::int64_t const start = std::max(positionForNotes(journal, stream), stream.baseOffset);
   PartName const name = {"the TIFF header", structure};
 
   unsigned short mark = 0;
@@ -60,8 +60,7 @@ bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char
     return refuseCut(journal, start + kFirstIFDOffsetPosition, sizeof(header.firstIFDOffset),
                      "{} at {}", name, Offset{start});
   }
-  notePassed(journal, start, "{} at {}: {}-endian", name, Offset{start},
-             isLittle ? "little" : "big");
+  noteStep(journal, start, "{} at {}: {}-endian", name, Offset{start}, isLittle ? "little" : "big");
   return true;
 }
 

@@ -27,9 +27,9 @@ bool FolderWalk::next(Input& input) {
 }
 
 bool FolderWalk::step(Input& input) {
-  if (unreadable_) {
-    input = std::move(*unreadable_);
-    unreadable_.reset();
+  if (pendingProblem_) {
+    input = std::move(*pendingProblem_);
+    pendingProblem_.reset();
     return true;
   }
   Level& level = levels_.back();
@@ -153,7 +153,7 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
 void FolderWalk::setUnreadable(std::string const& path, int error) {
   std::string const why =
       "the folder cannot be read: " + reason::systemText(error) + "; its photos are missing";
-  unreadable_ = {
+  pendingProblem_ = {
       path, /*isRegular=*/false, {reason::kUnreadableFolder, why, /*position=*/-1, error}};
 }
 

@@ -38,7 +38,7 @@ class FolderWalk {
 
   /// The next photo, or a folder that cannot be read, with the problem; false at the end.
   bool next(Input& input);
-  bool isAtEnd() const { return !unreadable_ && levels_.empty(); }
+  bool isAtEnd() const { return !pendingProblem_ && levels_.empty(); }
   /// Does a short part of `next`, for a caller that must not wait long. False: nothing was found
   /// yet. Not to be called at the end.
   bool step(Input& input);
@@ -67,9 +67,9 @@ class FolderWalk {
 
   Filter const& filter_;
   Report report_;
-  std::vector<Level> levels_;        // from the walked folder down to the current one
-  std::set<Identity> linked_;        // folders that a symbolic link led to
-  std::optional<Input> unreadable_;  // a folder, with its problem; the next step returns it
+  std::vector<Level> levels_;            // from the walked folder down to the current one
+  std::set<Identity> linked_;            // folders that a symbolic link led to
+  std::optional<Input> pendingProblem_;  // a folder, with its problem; the next step returns it
 };
 
 }  // namespace app
