@@ -27,7 +27,7 @@ void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
   char const* const pattern =
       hasWidth && hasHeight
           ? "{} declares {} x {}; each side must be more than 500 and less than 2^31"
-          : "{} does not give both sides";  // leaves out the numbers
+          : "{} does not give both sides";  // the numbers are not shown then
   // The casts give the sides as they are in the file: from 2^31 on, they are negative as an `int`.
   noteAbsent(journalOf(exifIFD), {"width", "height"}, QVReason::NotInFile, pattern, placed(exifIFD),
              static_cast<std::uint32_t>(width), static_cast<std::uint32_t>(height));

@@ -16,7 +16,7 @@ struct QVJPEGImage::WalkState {
   std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
   // For notes only. The numbers are positions in the file; -1: no such segment was met.
   std::int64_t start = 0;          ///< The segment being read.
-  std::int64_t sof0 = -1;          ///< The last SOF0 that raised a frame side, else the first.
+  std::int64_t sof0 = -1;          ///< The last SOF0 to raise a frame side; the first if none did.
   std::int64_t sof2 = -1;          ///< The last SOF2 segment before `firstScan`.
   std::int64_t firstScan = -1;     ///< The first SOS segment.
   char const* missingAtScan = "";  ///< Which segments were not met before `firstScan`.

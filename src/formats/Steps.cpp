@@ -147,7 +147,7 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  bool const isUndefined = row->typeCode == kUndefinedCode;  // refused only as a number
+  bool const isUndefined = row->typeCode == kUndefinedCode;  // as a text, it is empty: not refused
   return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
                 PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},

@@ -44,7 +44,7 @@ TextOf csvRows(Form const& form, bool isForTerminal) {
     for (auto const* field : fields) {
       std::string text;
       appendExact(text, field->value(outcome));
-      if (isForTerminal) {  // a path is taken whole: `text` lacks its bytes that are not UTF-8
+      if (isForTerminal) {  // in `text`, U+FFFD has replaced a path's bytes that are not UTF-8
         text = field->name == "path" ? escapedPath(outcome.path) : escaped(text);
       }
       row += quoted(text) + ',';
