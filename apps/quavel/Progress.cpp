@@ -81,7 +81,7 @@ void Progress::startCountingTotal() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::BlockSignals const block;  // leaves signals to the thread that writes
+  interrupt::BlockSignals const block;  // the new thread gets no signals; this one does
   try {
     totalCounter_ = std::thread([this] {
       try {

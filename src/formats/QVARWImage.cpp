@@ -18,8 +18,8 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   }
 
   DirectoryPointer exifIFD;  // only tells whether there is one: its values are in the record then
-  if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                   exifIFD)) {
+  if (!readAndStoreExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                           exifIFD)) {
     return false;
   }
   if (!exifIFD) {  // a rule of ours: the size needs both directories

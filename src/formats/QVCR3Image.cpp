@@ -38,7 +38,7 @@ bool QVCR3Image::storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& m
     return refuse(journal, QVReason::MissingPart, position,
                   "the {} has no uuid box, in which the metadata would be", moov);
   }
-  QVCR3UUIDBox const& uuidBox = *moovBox.uuidBox;
+  QVCR3UUIDBox const& uuidBox = *moovBox.uuidBox;  // the last one: no other counts
   PlacedBox const uuid = {box::Uuid, uuidBox.position_};
   if (uuidBox.userType != metadataUUID) {
     return refuse(journal, QVReason::MissingPart, uuid.position,

@@ -208,11 +208,11 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not used: `readExifIFD` stores its values
-  return readExifIFD(*this, stream, mainIFD,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
-                      tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
-                     exifIFD);
+  DirectoryPointer exifIFD;  // not used further
+  return readAndStoreExifIFD(*this, stream, mainIFD,
+                             {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::PixelXDimension,
+                              tag::PixelYDimension, tag::ImageWidth, tag::ImageLength},
+                             exifIFD);
 }
 
 bool QVJPEGImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

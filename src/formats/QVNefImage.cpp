@@ -28,9 +28,9 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not used here: `readExifIFD` stores its values in the record
-  if (!readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                   exifIFD)) {
+  DirectoryPointer exifIFD;  // not used further
+  if (!readAndStoreExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
+                           exifIFD)) {
     return false;
   }
 

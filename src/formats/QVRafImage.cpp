@@ -100,9 +100,9 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not needed here: `readExifIFD` has its date stored
-  return readExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
-                     exifIFD);
+  DirectoryPointer exifIFD;  // not used further
+  return readAndStoreExifIFD(*this, stream, mainIFD,
+                             {tag::DateTimeOriginal, tag::OffsetTimeOriginal}, exifIFD);
 }
 
 bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {

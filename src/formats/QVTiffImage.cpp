@@ -16,7 +16,7 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
-    PartName const name = {"SubIFD", kWholeFile, /*number=*/i + 1, count};
+    PartName const name = {"SubIFD", /*structure=*/kWholeFile, /*number=*/i + 1, count};
     // Orientation is not stored: listing it makes a malformed entry refuse the file, as damaged.
     auto subIFD =
         readDirectoryAt(stream, name, subIFDs[i]->longValue(),
@@ -70,10 +70,10 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not needed here
-  return readExifIFD(*this, stream, mainIFD,
-                     {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized},
-                     exifIFD);
+  DirectoryPointer exifIFD;  // not used further
+  return readAndStoreExifIFD(
+      *this, stream, mainIFD,
+      {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized}, exifIFD);
 }
 
 bool QVTiffImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

@@ -90,8 +90,8 @@ bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& di
   return isAbsent || result != nullptr;
 }
 
-bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
-                 DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD) {
+bool readAndStoreExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
+                         DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD) {
   if (!followPointer(stream, mainIFD, tag::ExifIFDPointer, "the Exif IFD", tags, exifIFD)) {
     return false;
   }

@@ -45,8 +45,8 @@ bool followPointer(std::shared_ptr<QVStream>& stream, DirectoryPointer const& di
 
 /// Follows ExifIFDPointer and gives the Exif directory to the record's `storeInfoFromExifIFD`.
 /// No entry: true, `exifIFD` is null. The directory cannot be read or stored: false.
-bool readExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
-                 DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD);
+bool readAndStoreExifIFD(QVMetadata& record, std::shared_ptr<QVStream>& stream,
+                         DirectoryPointer const& mainIFD, TagList tags, DirectoryPointer& exifIFD);
 
 /// Reads the raw image's directory, the SubIFD with this index. Too few SubIFDs: true, `rawIFD` is
 /// unchanged. The directory cannot be read: false.
