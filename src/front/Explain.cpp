@@ -15,7 +15,7 @@ constexpr unsigned kAllFamilies = kTiff | kNef | kArw | kJpeg | kRaf | kCr3;
 
 /// A field of the record that can be absent.
 struct FieldRow {
-  char name[22];
+  char name[22];              ///< An array: pointers would be relocated at each loading.
   std::uint8_t rowsToOrigin;  ///< Rows down to the field that it is computed from; 0: not computed.
   std::uint8_t families;      ///< Whose readers fill it.
   std::variant<std::int32_t QVMetadata::*, float QVMetadata::*, std::string QVMetadata::*> member;
@@ -108,7 +108,7 @@ constexpr Signature kSignatures[] = {
 
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start,
                       Journal& journal) {
-  if (!seek(stream, start - stream.baseOffset)) {
+  if (!seek(stream, start - stream.baseOffset)) {  // offsets count from `baseOffset`
     return;
   }
   std::array<std::uint8_t, kOpeningSize> opening;
@@ -119,14 +119,14 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       continue;
     }
     if ((row.families & format.family) == 0) {
-      // Only the signatures of ISO base media files are not at 0. A brand follows their "ftyp".
-      bool const hasBrand = row.position != 0 && received >= kBrandPosition + kBrandSize;
+      bool const isIsoMedia = row.position != 0;  // all other signatures are at 0
+      bool const hasBrand = isIsoMedia && received >= kBrandPosition + kBrandSize;
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
       for (QVNote& note : journal.notes) {
         if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
-          note.reason = QVReason::OtherKind;  // says more than how the wrong reader failed
+          note.reason = QVReason::OtherKind;  // says more than any reason but a failing read
         }
       }
       journal.hint(QVReason::OtherContent, start,

@@ -30,7 +30,7 @@ inline std::uint32_t reversed(std::uint32_t bits) { return __builtin_bswap32(bit
 inline std::uint64_t reversed(std::uint64_t bits) { return __builtin_bswap64(bits); }
 #endif
 
-/// Reverses the bytes of a number of any type through an unsigned integer of the same size.
+/// Reverses the 2, 4 or 8 bytes of a number, through an unsigned integer of the same size.
 template <class Number>
 void reverseBytes(Number* number) {
   constexpr std::size_t kSize = sizeof(Number);
@@ -83,9 +83,9 @@ inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
-/// Where `leaveBox` goes when a box ends beyond all offsets; no read succeeds there. Where `long`
-/// has 32 bits, it is 1 less than the largest end that `endOfBox` gives. If an outer box has that
-/// end, the walk through it is not over: it looks for another box here, and fails.
+/// Where `leaveBox` stops when a box ends beyond all offsets; no read succeeds there. Where `long`
+/// has 32 bits, it is 1 less than the largest end that `endOfBox` gives: the walk through an outer
+/// box with that end looks for another box here, and fails instead of passing for complete.
 inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
@@ -103,7 +103,7 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered == static_cast<std::int64_t>(count)) {
     return true;
   }
-  if (delivered < 0) {  // otherwise the data ends, or `QVReadAheadStream` has noted a failure
+  if (delivered < 0) {  // fewer bytes: the data ends, or `QVReadAheadStream` noted a failure
     noteReadResult(stream, delivered, /*error=*/0);
   }
   return false;
@@ -119,7 +119,7 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
       break;
     }
     if (delivered < 0 || static_cast<std::uint64_t>(delivered) > wanted) {
-      noteReadResult(stream, -1, /*error=*/0);
+      noteReadResult(stream, -1, /*error=*/0);  // too many bytes are a failure too
       break;
     }
     received += static_cast<std::size_t>(delivered);

@@ -24,7 +24,7 @@ struct Problem {
 /// One file to read.
 struct Input {
   std::string path;
-  bool isRegular = false;  ///< A regular file with a photo's extension; false: not known yet.
+  bool isRegular = false;  ///< Known to be a regular file; false: still to be checked.
   Problem problem;         ///< Set: why the file must not be read.
 };
 
@@ -35,7 +35,7 @@ struct Outcome {
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< Such as "JPEG"; empty: the extension names none.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
-  std::uint64_t furtherSteps = 0;              ///< How many steps the notes leave out.
+  std::uint64_t furtherSteps = 0;              ///< How many notes of kind `Step` were left out.
   bool isShown = true;                         ///< It meets the conditions of --where.
   std::string text;                            ///< Its output in the chosen form, once prepared.
   std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.

@@ -22,7 +22,7 @@ using quavel::QVJournal;
 constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
-Problem irregular(mode_t mode) {
+Problem whyNotRegular(mode_t mode) {
   if (S_ISDIR(mode)) {  // only from a list of paths: a folder given as an argument is walked
     return {reason::kFolder, "a folder; give it as an argument to have its photos read"};
   }
@@ -38,7 +38,7 @@ Problem whyUnfit(std::string const& path) {
   if (::stat(path.c_str(), &status) == -1) {
     return reason::cannotOpen(errno);
   }
-  return S_ISREG(status.st_mode) ? Problem() : irregular(status.st_mode);
+  return S_ISREG(status.st_mode) ? Problem() : whyNotRegular(status.st_mode);
 }
 
 /// All bytes of standard input; sets `problem` if they cannot all be read.
@@ -77,7 +77,7 @@ bool isDate(std::string const& text) {
   return isWhole && hasOneBlank && isReal;
 }
 
-/// Fills the outcome by calling `read`, unless there is a problem already. `read` may set one.
+/// Unless the outcome has a problem already, fills it by calling `read`, which may set one.
 template <class Read>
 void fill(Outcome& outcome, Detail detail, Read read) {
   if (outcome.problem) {
@@ -112,7 +112,7 @@ std::string extensionOf(std::string_view path) {
 
 bool isPhotoExtension(std::string const& extension) {
   static quavel::QVReader const library("");  // reads no file; is only asked for formats
-  // `createMetadata` makes a whole record: too expensive for each name in a folder.
+  // Known ones are kept: for them, `createMetadata` makes a whole record at every call.
   thread_local std::unordered_set<std::string> known;
   if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
     known.insert(extension);

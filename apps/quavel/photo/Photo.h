@@ -23,8 +23,8 @@ std::string whyUnknown(std::string const& extension);
 /// The outcome has notes only with `Detail::All`.
 Outcome readPhoto(Input input, Detail detail);
 
-/// Clears blank dates. With `asIso`, well-formed Exif dates become "2018-02-21T12:08:56"; any other
-/// text stays as it is.
+/// Clears dates that are only blanks and colons. With `asIso`, well-formed Exif dates become
+/// "2018-02-21T12:08:56"; any other text stays as it is.
 void tidyDates(quavel::QVMetadata& record, bool asIso);
 
 /// Reads one image from standard input, under the path "-".
