@@ -27,7 +27,7 @@ bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryV
   ValuePointer value = nullptr;
   bool const isValid = findNumber(directory, tag, value);
   if (value == nullptr) {
-    return isValid;
+    return isValid;  // true if there is no entry
   }
   if (value->type != type) {
     return refuseContent(
@@ -49,7 +49,7 @@ bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  auto const mainIFD = readFirstDirectory(
+  auto const mainIFD = readFirstDirectory(  // in this box, the Exif directory
       stream, "the CMT2 box",
       {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
        tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,

@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// An offset in the file, in a note: "0x1f2 (498)", or just "8" if it has one digit.
+/// An offset in the file, in a note: "0x1f2 (498)", or just "8" below 10.
 struct Offset {
   std::int64_t value;
 };

@@ -26,19 +26,19 @@ std::wstring widened(std::string const& path) {
   return wide.data();
 }
 
-/// The path; from MAX_PATH characters on, in the form that Windows then requires: absolute and with
-/// the prefix `\\?\`, in which `\\server\share` becomes `\\?\UNC\server\share`.
+/// The path as Windows takes it. If it has MAX_PATH characters or more once it is absolute, it is
+/// made so and gets the prefix `\\?\`, with which `\\server\share` becomes `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
   if (size < MAX_PATH) {
     return path;
   }
-  std::vector<wchar_t> whole(size);
-  DWORD const length = ::GetFullPathNameW(path.c_str(), size, whole.data(), nullptr);  // no NUL
-  if (length >= size) {  // `whole` is too small: the current folder has changed meanwhile
+  std::vector<wchar_t> buffer(size);
+  DWORD const length = ::GetFullPathNameW(path.c_str(), size, buffer.data(), nullptr);  // no NUL
+  if (length >= size) {  // `buffer` is too small: the current folder has changed meanwhile
     return path;
   }
-  std::wstring const full = whole.data();
+  std::wstring const full = buffer.data();
   if (full.compare(0, 4, LR"(\\?\)") == 0) {
     return full;
   }

@@ -15,8 +15,8 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// A view of the values of an entry in a reader's own directory or in a host's. The values must
-/// outlive the view. As a bool: false when no entry was found.
+/// A view of one entry's values, which must outlive it: a reader's own directory has an array of
+/// them, a public entry has shared pointers. As a bool: false when there is no entry.
 class Entry {
  public:
   Entry() = default;
@@ -29,13 +29,13 @@ class Entry {
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 
-  /// Like `QVTiffImageFileDirectoryEntry::convertToString`.
+  /// Stores the ASCII values up to a NUL. False: a value of another type ends them earlier.
   bool convertToString(std::string& out) const;
 
  private:
   bool exists_ = false;
-  ValuePointer values_ = nullptr;  // the values in a reader's own directory
-  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // in a host's
+  ValuePointer values_ = nullptr;  // an array of values
+  std::shared_ptr<QVTiffImageFileDirectoryEntryValue> const* shared_ = nullptr;  // or pointers
   std::size_t size_ = 0;
 };
 

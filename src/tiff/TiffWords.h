@@ -14,13 +14,13 @@ struct TagName {
   unsigned short number;
 };
 
-/// A number of values: "2 SHORT values". The code must stand for a field type.
+/// A number of values: "2 SHORT values". `typeCode` must be a known one, 1 to 13.
 struct TypedCount {
   std::uint32_t count;
   std::uint16_t typeCode;
 };
 
-/// In place of a TIFF structure's name: the structure is the whole file, which notes do not name.
+/// Stands for the name of a TIFF structure that is the whole file: notes then name no structure.
 inline constexpr char const* kWholeFile = nullptr;
 
 /// The name of a directory or a header in a TIFF structure: "IFD0 of the Exif segment".

@@ -33,7 +33,7 @@ class Output {
  private:
   Console& console_;
   bool isTerminal_;
-  bool isFile_;
+  bool isFile_;  // a regular file, which gets all pieces in one write
   std::string pending_;
   std::vector<std::size_t> ends_;  // where each piece ends in `pending_`
   char const* tail_ = nullptr;

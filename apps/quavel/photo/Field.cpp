@@ -37,11 +37,11 @@ Value valueOf(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent((*outcome.record).*member) : Value();
 }
 
-Value captureDate(Outcome const& outcome) {
+Value captureDateOf(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The first date for which `isAbsent` is false; QVMetadata::captureDate skips only empty ones.
+/// The first date that is not blank. For programs, `captureDateOf` may be blank, as in the file.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -51,7 +51,7 @@ Value usableCaptureDate(QVMetadata const& record) {
   return {};
 }
 
-Value path(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
+Value pathOf(Outcome const& outcome) { return pathAsUtf8(outcome.path); }
 
 template <auto member>
 Value valueOfProblem(Outcome const& outcome) {
@@ -59,7 +59,7 @@ Value valueOfProblem(Outcome const& outcome) {
 }
 
 /// The bytes in hexadecimal of a path that is not valid UTF-8; absent for other paths.
-Value pathBytes(Outcome const& outcome) {
+Value pathBytesOf(Outcome const& outcome) {
   if (isPlain(outcome.path) || pathAsUtf8(outcome.path) == outcome.path) {
     return {};
   }
@@ -73,8 +73,8 @@ Value pathBytes(Outcome const& outcome) {
   return hex;
 }
 
-std::string plain(std::string const& text) { return text; }
-std::string bytes(std::int64_t value) { return std::to_string(value); }
+std::string unchanged(std::string const& text) { return text; }
+std::string byteNumber(std::int64_t value) { return std::to_string(value); }
 std::string isoSpeed(std::int32_t value) { return std::to_string(value); }
 std::string pixels(std::int32_t value) { return std::to_string(value) + " px"; }
 std::string millimetres(std::int32_t value) { return std::to_string(value) + " mm"; }
@@ -111,8 +111,8 @@ struct AppendExact {
 std::vector<Field> const& allFields() {
   using M = QVMetadata;
   static std::vector<Field> const fields = {
-      {"path", "File", path, plain},
-      {"captureDate", "Captured", captureDate, words::date},
+      {"path", "File", pathOf, unchanged},
+      {"captureDate", "Captured", captureDateOf, words::date},
       {"width", "Width", valueOf<&M::width>, pixels},
       {"height", "Height", valueOf<&M::height>, pixels},
       {"orientation", "Orientation", valueOf<&M::orientation>, words::orientation},
@@ -121,8 +121,8 @@ std::vector<Field> const& allFields() {
       {"dateTimeDigitized", "Digitized date", valueOf<&M::dateTimeDigitized>, words::date},
       {"dateTime", "File date", valueOf<&M::dateTime>, words::date},
       {"hasShootingInfo", "Shooting info", valueOf<&M::hasShootingInfo>, words::yesNo},
-      {"model", "Camera", valueOf<&M::model>, plain},
-      {"lensModel", "Lens", valueOf<&M::lensModel>, plain},
+      {"model", "Camera", valueOf<&M::model>, unchanged},
+      {"lensModel", "Lens", valueOf<&M::lensModel>, unchanged},
       {"iso", "ISO", valueOf<&M::iso>, isoSpeed},
       {"apexFNumber", "F-number (APEX)", valueOf<&M::apexFNumber>, words::fNumber},
       {"apexExposureTime", "Exposure (APEX)", valueOf<&M::apexExposureTime>, words::exposureTime},
@@ -135,10 +135,10 @@ std::vector<Field> const& allFields() {
       {"focalLengthIn35mmFilm", "In 35 mm film", valueOf<&M::focalLengthIn35mmFilm>, millimetres},
       {"exposureTime", "Exposure time", valueOf<&M::exposureTime>, words::exposureTime},
       {"fNumber", "F-number", valueOf<&M::fNumber>, words::fNumber},
-      {"error", "Error", valueOfProblem<&Problem::text>, plain},
-      {"reason", "Reason", valueOfProblem<&Problem::reason>, plain},
-      {"position", "At byte", valueOfProblem<&Problem::position>, bytes},
-      {"pathBytes", "File (hex)", pathBytes, plain},
+      {"error", "Error", valueOfProblem<&Problem::text>, unchanged},
+      {"reason", "Reason", valueOfProblem<&Problem::reason>, unchanged},
+      {"position", "At byte", valueOfProblem<&Problem::position>, byteNumber},
+      {"pathBytes", "File (hex)", pathBytesOf, unchanged},
   };
   return fields;
 }
@@ -163,7 +163,7 @@ Fields recordFields() {
 }
 
 std::string inWords(Field const& field, Outcome const& outcome) {
-  if (field.value == path) {
+  if (field.value == pathOf) {
     return escapedPath(outcome.path);  // the value has lost the bytes that are not UTF-8
   }
   Value const value = field.value(outcome);
@@ -183,7 +183,7 @@ bool isAbsent(Value const& value) {
 }
 
 Value comparedValue(Field const& field, Outcome const& outcome) {
-  bool const isCaptureDate = field.value == captureDate && outcome.record;
+  bool const isCaptureDate = field.value == captureDateOf && outcome.record;
   return isCaptureDate ? usableCaptureDate(*outcome.record) : field.value(outcome);
 }
 

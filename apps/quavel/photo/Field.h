@@ -24,7 +24,7 @@ struct Field {
   std::string_view name;           ///< As --fields and the machine forms call it.
   char const* label;               ///< As the card and the table call it.
   Value (*value)(Outcome const&);  ///< Gets the exact value.
-  Words words;
+  Words words;                     ///< The function that puts that value into words.
 };
 
 using Fields = std::vector<Field const*>;
@@ -41,7 +41,7 @@ Fields recordFields();
 /// cells long (a path is never cut). Empty if its value `isAbsent`.
 std::string inWords(Field const& field, Outcome const& outcome);
 
-/// Whether there is no value, or only blanks and colons, which cameras without a clock write.
+/// Whether there is no value, or only blanks and colons: cameras without a clock write such dates.
 bool isAbsent(Value const& value);
 
 /// The value to sort and select by: for captureDate, the first date for which `isAbsent` is false.
