@@ -248,16 +248,25 @@ class Endings(CommandTest):
     def test_progress_shows_on_a_terminal_and_goes(self):
         main, side = open_terminal(60)
         _, other = open_terminal(60)
+        shrunk, shrunk_side = open_terminal(60)
+        self.put("shrunk", b"a.tif\n" * 20000)
+        self.put("long", (b"./" * 2040 + b"a.tif\n") * 100)  # each record is written in pieces
         with self.start("--jsonl", "--files-from", "list", stdout=subprocess.PIPE, stderr=side) as process, \
                 self.start("--print0", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
-                           stderr=other) as piped:
+                           stderr=other) as piped, \
+                self.start("--jsonl", "--files-from", "shrunk", stdout=subprocess.PIPE, stderr=shrunk_side) as fewer, \
+                self.start("-q", "--jsonl", "--files-from", "long", stdout=subprocess.PIPE) as stuck:
             os.close(side)
-            time.sleep(0.6)  # a slow reader makes a slow run
+            time.sleep(0.3)  # a slow reader makes a slow run
+            stuck.send_signal(signal.SIGINT)  # which a write that has begun delays, but not for long
+            os.replace(self.put("one", b"a.tif\n"), self.folder / "shrunk")  # before it is counted
+            time.sleep(0.3)
             names = piped.communicate(b"a.tif\n" * 30000, 60)[0]
             self.assertEqual(names.count(b"\0"), 30000)  # its files are not counted ahead: a pipe is read once
             shown = b""
             for size in (20_000, 20_000, 20_000, 2_000_000, 2_000_000):
                 process.stdout.read(size)
+                fewer.stdout.read(20_000)
                 time.sleep(0.15)
                 shown += written(main)
             fcntl.ioctl(main, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 24, 0, 0))
@@ -265,7 +274,11 @@ class Endings(CommandTest):
             process.wait(60)  # the summary comes last
             shown += written(main)
             os.close(main)
+            self.assertRegex(written(shrunk).decode(), r"^(\r\x1b\[K\d+ files, \d+ files/s){3,}$")
+            self.assertEqual(stuck.wait(10), -signal.SIGINT)
+            fewer.kill()
         shown = shown.decode()
+        self.assertLess(shown.count("\r\x1b[K"), 20)  # in some two seconds
         self.assertRegex(shown, r"^\r\x1b\[K\d+ files, \d+ files/s\r")
         estimates = re.findall(r"\[K(\d+) of 20000 files, (\d+) files/s, (\d+) (s|min) left\r", shown)
         self.assertEqual({unit for *_, unit in estimates}, {"s", "min"})
