@@ -261,8 +261,8 @@ class Endings(CommandTest):
             stuck.send_signal(signal.SIGINT)  # which a write that has begun delays, but not for long
             os.replace(self.put("one", b"a.tif\n"), self.folder / "shrunk")  # before it is counted
             time.sleep(0.3)
-            names = piped.communicate(b"a.tif\n" * 30000, 60)[0]
-            self.assertEqual(names.count(b"\0"), 30000)  # its files are not counted ahead: a pipe is read once
+            names = piped.communicate(b"a.tif\n" * 12000, 60)[0]
+            self.assertEqual(names.count(b"\0"), 12000)  # its files are not counted ahead: a pipe is read once
             shown = b""
             for size in (20_000, 20_000, 20_000, 2_000_000, 2_000_000):
                 process.stdout.read(size)
