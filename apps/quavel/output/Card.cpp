@@ -8,7 +8,7 @@ namespace app {
 
 namespace {
 
-constexpr std::size_t kLabelWidth = 17;  // with the blanks behind the label
+constexpr std::size_t kLabelWidth = 17;  // with the blanks after the label
 
 /// The fields of a card when none are chosen, in the order in which people look for them.
 Fields cardFields() {
