@@ -9,7 +9,7 @@ using namespace detail;
 
 namespace {
 
-/// The first SubIFD that has NewSubfileType and is no reduced image; null: none, or a failure.
+/// The first SubIFD that has NewSubfileType and is not a reduced image; null: none, or a failure.
 DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
                                      DirectoryPointer const& mainIFD) {
   Journal* const journal = journalOf(*stream);

@@ -56,7 +56,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the record's field for this tag stays absent: the tag has no entry.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same when the entry's value is no use. `pattern` names the entry by its first "{}", and the
+/// The same when the entry's value is useless. `pattern` names the entry by its first "{}", and the
 /// entry's count and type by a second.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
