@@ -16,7 +16,8 @@ class PathList {
   PathList(PathList const&) = delete;
   PathList& operator=(PathList const&) = delete;
 
-  /// False: `next` would wait for the process that writes the list.
+  /// Whether `next` can begin without waiting for the process that writes the list. It may still
+  /// wait for the rest of a path.
   bool isReady();
   /// The next path that is not empty, with a problem if it is too long or has a NUL in it. False:
   /// the list has ended, or a read failed.
