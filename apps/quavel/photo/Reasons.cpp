@@ -76,14 +76,15 @@ Problem failure(std::exception const& error) {
 
 Problem refusal(QVJournal const& journal) {
   quavel::QVNote const& note = *journal.refusal();
-  for (auto const& hint : journal.notes()) {
-    if (hint.reason == QVReason::OtherContent) {
-      return {QVJournal::reasonName(note.reason), hint.text + ": " + note.text, note.position};
+  std::string lead = leadOf(note.reason);
+  for (auto const& other : journal.notes()) {
+    if (other.reason == QVReason::OtherContent) {
+      lead = other.text + ": ";
     }
   }
   char const* const tip =
       note.reason == QVReason::Empty ? "; copy it again from its source" : advice(note.systemError);
-  return {QVJournal::reasonName(note.reason), leadOf(note.reason) + note.text + tip, note.position,
+  return {QVJournal::reasonName(note.reason), lead + note.text + tip, note.position,
           note.systemError};
 }
 
