@@ -72,7 +72,7 @@ TEST(Notes, StateWhatIsRefusedAndWhere) {
       {"tif", claim(kWidth, kUndefined, 1, 0),
        "malformed-entry ... is of type UNDEFINED; one number"},
       {"tif", claim(kWidth, 99, 1, 0),
-       "malformed-entry at 10: 0x0100 ... field type 99 is neither"},
+       "malformed-entry at 10: 0x0100 ... field type 99 is not one of"},
       {"tif", claim(kDateTime, kAscii, 20, 912345),
        "cut-short at 912345: 0x0132 DateTime at 0xa (10) in IFD0: its 20 ASCII values would begin "
        "at 0xdebd9 (912345) and end at 0xdebed (912365), but the file ends at 0x1a (26)\n"},
@@ -138,7 +138,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
   image[24] = '\x7f';  // an entry's type: the opening is as it should be
   Bytes const afterScan = kSOI + segment(0xffda, "ab") + segment(0xffc2, "cd");
   check({
-      {"jpg", Bytes("\0\0\0\14ftyp", 8), "hint ... like an ISO base media file; its"},
+      {"jpg", Bytes("\0\0\0\14ftyp", 8), "hint ... like an ISO base media file, but"},
       {"jpg", afterScan, "hint picture-data at 2: No SOF0 or APP1 was met before the scan at 2;"},
       {"jpg", afterScan + segment(0xffe1, "http") + sof0(), "- hint not-baseline"},
       {"jpg", kSOI + segment(0xffc2, "ab") + segment(0xffda, "cd") + "\xff\xe2\1",
@@ -152,7 +152,7 @@ TEST(Notes, HintAtWhatExplainsTheOutcome) {
        "cut-short at 18: 0x0112 Orientation at 0xa (10) in IFD0: 4 bytes wanted at 0x12 (18)"},
       {"raf", Bytes("FUJIFILM") + Bytes(76, 'x') + Bytes("\0\0\x10\0", 4),
        "cut-short at 4108: the TIFF header of the embedded JPEG's Exif segment: 2 bytes wanted"},
-      {"cr3", box("ftyp", "heic"), "hint ... like an ISO base media file of brand \"heic\"; its"},
+      {"cr3", box("ftyp", "heic"), "hint ... like an ISO base media file of brand \"heic\", but"},
       {"jpg", kSOI + sof0(), "step none at 2: the SOF0 segment at 2 declares 4000 x 3000\n"},
       {"raf", rafFile(Bytes(40, 'x'), ""), "hint other-opening at 148: The embedded JPEG at "},
       {"raf", rafFile("\xff\xd8\xff\xe2" + image.substr(4), ""), "hint other-opening at 148: "},

@@ -26,7 +26,7 @@ struct Options {
 struct ParsedOptions {
   Options options;
   std::optional<int> status;  ///< If set, the command only prints `text` and exits with this.
-  std::string text;           ///< For standard output; for standard error if the usage is wrong.
+  std::string text;           ///< For standard output; if the usage is wrong, for `printMessage`.
 };
 
 ParsedOptions parseOptions(int argc, char const* const* argv);

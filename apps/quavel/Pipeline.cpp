@@ -20,7 +20,7 @@ long countWaits() {
   return usage.ru_nvcsw;
 }
 #else
-constexpr bool kCanCountWaits = false;  // all reading is then taken to wait for the disk
+constexpr bool kCanCountWaits = false;  // every read is then assumed to wait for the disk
 long countWaits() { return 0; }
 #endif
 
@@ -29,9 +29,10 @@ constexpr std::size_t kLargeBatch = std::size_t{1} << 20;  // bytes of output
 
 }  // namespace
 
-std::size_t nextBatchSize(Batch const& done, std::size_t size) {
+std::size_t nextBatchSize(Batch const& done, std::size_t currentSize) {
   bool const isTooLarge = done.seconds > kLongBatch || done.bytes > kLargeBatch;
-  return isTooLarge ? std::max<std::size_t>(size / 2, 1) : std::min(size * 2, kMaxBatch);
+  return isTooLarge ? std::max<std::size_t>(currentSize / 2, 1)
+                    : std::min(currentSize * 2, kMaxBatch);
 }
 
 Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
@@ -59,7 +60,7 @@ void Pipeline::submit(std::unique_ptr<Batch> batch) {
   hasSubmitted_ = true;
   if (threads_.empty()) {
     workOn(*submitted);
-    submitted->isDone = true;
+    submitted->isDone = true;  // needs no lock: there is no other thread
     return;
   }
   {
@@ -86,6 +87,7 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
   }
   std::unique_lock<std::mutex> lock(mutex_);
   auto const isDone = [this] { return order_.front()->isDone; };
+  // A wait of 0 would cost a system call.
   return patience.count() > 0 ? batchDone_.wait_for(lock, patience, isDone) : isDone();
 }
 
@@ -112,7 +114,8 @@ void Pipeline::workOn(Batch& batch) {
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file causes no wait, any other at least one. The majority of files decides.
+  // Reading a cached file causes no wait, any other at least one: more waits than half the files
+  // are taken to mean that most are not cached.
   if (isMeasured) {
     waitsForDisk_ = 2 * (countWaits() - waitsBefore) > static_cast<long>(batch.inputs.size());
   }

@@ -29,9 +29,9 @@ struct Batch {
 
 /// In seconds: a longer batch delays results, a far shorter one is not worth giving to a thread.
 constexpr double kLongBatch = 0.002;
-/// How many files the next batch should have, `size` being the number so far: half as many if the
-/// batch `done` took too long or gave too much text, else twice as many, up to a maximum.
-std::size_t nextBatchSize(Batch const& done, std::size_t size);
+/// The next batch's size in files, which has been `currentSize`: half of it if the batch `done`
+/// took too long or gave too much text, else twice, up to a maximum.
+std::size_t nextBatchSize(Batch const& done, std::size_t currentSize);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
 constexpr unsigned kUncachedJobs = 32;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <memory>
 #include <optional>
 #include <system_error>
 #include <utility>
@@ -40,7 +41,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;  // destroyed before the members above, which its threads use
   std::size_t batchSize_ = 1;
-  bool isErrorHintDue_;  // the fields chosen for CSV lack `error`, and no message has said so yet
+  bool isErrorHintDue_;  // the CSV lacks `error`, which JSON always has; to be said once
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -121,7 +122,7 @@ void Runner::work(Batch& batch) const {
 void Runner::prepare(Outcome& outcome) const {
   Form const& form = options_.form;
   // Programs get the dates as they are in the file, unless they ask for ISO 8601.
-  if (outcome.record && (form.hasIsoDates || !form.isForMachines())) {
+  if (outcome.record && (form.hasIsoDates || !form.isData())) {
     tidyDates(*outcome.record, form.hasIsoDates);
   }
   outcome.isShown = std::all_of(form.conditions.begin(), form.conditions.end(),
@@ -149,10 +150,12 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);  // `record` may be dropped
-  // JSON and CSV state the problem too: --quiet drops the message. So does --why, to people.
-  bool const outputStatesProblem = form.isForMachines() ? options_.isQuiet : form.isExplanation();
-  if (outcome.problem && !(outcome.isShown && outputStatesProblem)) {
+  progress_.count(/*hasRecord=*/!outcome.problem,
+                  outcome.isShown);  // `prepare` may have dropped `record`
+  // The message is dropped where the output says the same: always in the text of --why, and with
+  // --quiet in JSON and CSV.
+  bool const isMessageDropped = form.isData() ? options_.isQuiet : form.isExplanation();
+  if (outcome.problem && !(outcome.isShown && isMessageDropped)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);
   }
   if (outcome.problem && outcome.isShown && isErrorHintDue_) {

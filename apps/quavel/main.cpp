@@ -62,8 +62,8 @@ int main(int argc, char** argv) {
   try {
     return runOptions(app::parseOptions(argc, argv), output, console);
   } catch (app::OutputClosed const&) {
-    return app::kSuccess;  // whoever read the output has seen enough
-  } catch (std::system_error const& error) {
+    return app::kSuccess;                     // whoever read the output has seen enough
+  } catch (std::system_error const& error) {  // only from the output: see `run`
     console.printMessage("the output cannot be written: " + error.code().message() +
                          "; it ends early. Check the disk or where the output goes");
   } catch (std::bad_alloc const&) {

@@ -44,7 +44,7 @@ class QUAVEL_EXPORT QVReadAheadStream : public QVStream {
   QUAVEL_NO_EXPORT void fetch(Block& block, std::size_t wanted, std::size_t needed);
   QUAVEL_NO_EXPORT void fetchNext(std::size_t needed);
   QUAVEL_NO_EXPORT std::int64_t readSource(Block const& block, std::size_t count);
-  QUAVEL_NO_EXPORT bool sourceAccepts(std::int64_t target);
+  QUAVEL_NO_EXPORT bool seekSource(std::int64_t target);
 
   std::shared_ptr<QVStream> source_;
   std::size_t firstSize_;

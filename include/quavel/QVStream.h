@@ -62,7 +62,7 @@ class QUAVEL_EXPORT QVStream {
   void swapLL(unsigned long long* value) const;
   void swapSLittleToHost(unsigned short* value) const;
   void swapLLittleToHost(unsigned int* value) const;
-  void swapLLLitleToHost(unsigned long long* value) const;
+  void swapLLLitleToHost(unsigned long long* value) const;  // spelt so since its publication
   void swapSBigToHost(unsigned short* value) const;
   void swapLBigToHost(unsigned int* value) const;
   void swapLLBigToHost(unsigned long long* value) const;

@@ -38,7 +38,7 @@ class QUAVEL_EXPORT QVTiffImageFileDirectory {
  private:
   friend class detail::ReaderDirectory;
 
-  detail::ReaderDirectory const* ofReader = nullptr;  // this, if it is a ReaderDirectory
+  detail::ReaderDirectory const* asReaderDirectory_ = nullptr;  // `this`, if it is one
 };
 
 }  // namespace quavel

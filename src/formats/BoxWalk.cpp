@@ -21,13 +21,14 @@ char const* meaningOf(std::uint32_t size) {
 bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header) {
   Journal* const journal = journalOf(*stream);
   long const start = stream->getOffset();
-  std::int64_t const position = stream->baseOffset + start;
-  if (!readingOf(*stream).spend(Work::Steps, 1)) {
+  std::int64_t const position = wrappingSum(stream->baseOffset, start);
+  if (!readingOf(*stream).spend(Work::SegmentsAndBoxes, 1)) {
     return false;
   }
   bool const isInReach = start <= kLastOffset;
   if (!isInReach || !header.read(stream)) {
-    // The stream stops short if the previous box ends beyond all offsets or beyond a buffer.
+    // The header should be where the previous box ends. The stream may stand before that:
+    // `leaveBox` stops at `kOutOfReach`, a memory stream at its end.
     std::int64_t const nextBox = std::max(std::int64_t{start}, context.previousEnd);
     return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
                      "the header of the next box{}", context);
@@ -46,8 +47,10 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 }
 
 long endOfBox(long start, QVCR3BoxHeader const& header) {
-  constexpr std::int64_t kLargestLong = std::numeric_limits<long>::max();
-  return static_cast<long>(std::min(std::int64_t{start} + header.boxSize, kLargestLong));
+  constexpr long kMax = std::numeric_limits<long>::max();
+  std::int64_t const end = wrappingSum(start, header.boxSize);
+  bool const isBeyond = end < start || end > std::int64_t{kMax};  // below `start`: wrapped around
+  return isBeyond ? kMax : static_cast<long>(end);
 }
 
 void append(std::string& out, PlacedBox box) {

@@ -24,11 +24,11 @@ struct PlacedBox {
 };
 void append(std::string& out, PlacedBox box);
 
-/// Where a walk over boxes is. A note says it after a box: " in the moov box at 0x18 (24)".
+/// A walk over boxes. Notes add to a box's name where it is: " in the moov box at 0x18 (24)".
 struct BoxContext {
-  char const* text = "";
-  PlacedBox parent = {};         ///< Appended to the text, unless its type is 0.
-  std::int64_t previousEnd = 0;  ///< The offset where the previous box ends, reachable or not.
+  char const* text = "";         ///< Such as " in the ", with a parent.
+  PlacedBox parent = {};         ///< Type 0: none, and the text says it all.
+  std::int64_t previousEnd = 0;  ///< Where the previous box ends by the size that it declares.
 };
 void append(std::string& out, BoxContext context);
 
@@ -39,7 +39,7 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box, but no further than `kOutOfReach`, where no read succeeds.
+/// Moves to the end of a box, but no further than `kOutOfReach` (which says why).
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

@@ -19,7 +19,7 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
   }
 }
 
-void detail::noteSize(DirectoryPointer const& exifIFD, int width, int height) {
+void detail::noteExifSize(DirectoryPointer const& exifIFD, int width, int height) {
   bool const hasWidth =
       findEntry(exifIFD, tag::ImageWidth) || findEntry(exifIFD, tag::PixelXDimension);
   bool const hasHeight =
@@ -38,7 +38,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAll(journal)) {
     return;
   }
-  // The note from `noteSize`, if any. The note below replaces it, and so repeats its text.
+  // The note from `noteExifSize`, if any. The note below replaces it, and so repeats its text.
   QVNote const* const exifNote = journal->absenceOf("width");
   std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =

@@ -11,12 +11,12 @@ struct QVJPEGImage::WalkState {
   bool sawAPP1 = false;  ///< An APP1 segment, Exif or not.
   bool sawSOF0 = false;
   bool sawExif = false;
-  unsigned short frameWidth = 0;   ///< The greatest that an SOF0 segment has declared.
+  unsigned short frameWidth = 0;   ///< The greatest of all SOF0 segments met.
   unsigned short frameHeight = 0;  ///< Likewise.
   std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
   // For notes only. The numbers are positions in the file; -1: no such segment was met.
   std::int64_t start = 0;          ///< The segment being read.
-  std::int64_t sof0 = -1;          ///< The last SOF0 to raise a frame side; the first if none did.
+  std::int64_t sof0 = -1;          ///< That last made a frame side greater; first if all are 0 x 0.
   std::int64_t sof2 = -1;          ///< The last SOF2 segment before `firstScan`.
   std::int64_t firstScan = -1;     ///< The first SOS segment.
   char const* missingAtScan = "";  ///< Which segments were not met before `firstScan`.
@@ -24,11 +24,12 @@ struct QVJPEGImage::WalkState {
 
 namespace detail {
 
-/// Notes that the walk ends at a position, maybe beyond the data, where no marker can be read.
+/// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes what size an Exif directory gives. The note is shown only if the record gets no size.
-void noteSize(DirectoryPointer const& exifIFD, int width, int height);
+/// Notes the size that an Exif directory gives, if any: should the record have no size in the end,
+/// this is why. Else the note is not shown.
+void noteExifSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail
 }  // namespace quavel

@@ -12,17 +12,17 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
   isRaw = true;
 
   auto const mainIFD =
-      readFirstDirectory(stream, kWholeFile, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
+      readFirstDirectory(stream, {tag::ExifIFDPointer, tag::Orientation, tag::SubIFDs});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // only tells whether there is one: its values are in the record then
+  DirectoryPointer exifIFD;  // only tested for null: the call stores the directory's values
   if (!readAndStoreExifIFD(*this, stream, mainIFD, {tag::DateTimeOriginal, tag::OffsetTimeOriginal},
                            exifIFD)) {
     return false;
   }
-  if (!exifIFD) {  // a rule of ours: the size needs both directories
+  if (!exifIFD) {  // cameras always write one; without it, no size is looked for either
     noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
                "no {} in {}, without which the raw image is not looked for",
                TagName{tag::ExifIFDPointer}, placed(mainIFD));

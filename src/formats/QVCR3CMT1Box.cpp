@@ -14,11 +14,13 @@ bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  // ExifIFDPointer, SubIFDs and NewSubfileType are listed only so that a damaged one is refused.
+  // Nothing uses ExifIFDPointer, SubIFDs and NewSubfileType. They are listed to be checked: if one
+  // of these entries is malformed, so may the rest be, and the box is refused.
   auto const mainIFD =
-      readFirstDirectory(stream, "the CMT1 box",
+      readFirstDirectory(stream,
                          {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
-                          tag::SubIFDs, tag::NewSubfileType, tag::DateTime, tag::Model});
+                          tag::SubIFDs, tag::NewSubfileType, tag::DateTime, tag::Model},
+                         "the CMT1 box");
   return mainIFD && storeInfoFromMainIFD(mainIFD);
 }
 

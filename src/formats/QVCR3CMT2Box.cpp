@@ -14,20 +14,24 @@ namespace {
 /// untouched. Not exactly one value: false.
 bool storeShort(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
-  bool const isValid = findNumber(directory, tag, value);
+  if (!findNumber(directory, tag, value)) {
+    return false;
+  }
   if (value != nullptr) {
     field = value->shortValue();
   }
-  return isValid;
+  return true;
 }
 
 /// Stores the entry's fraction. No entry: true, field untouched. Not one value of `type`: false.
 bool storeFraction(DirectoryPointer const& directory, unsigned short tag, EntryValueType type,
                    float& field) {
   ValuePointer value = nullptr;
-  bool const isValid = findNumber(directory, tag, value);
+  if (!findNumber(directory, tag, value)) {
+    return false;
+  }
   if (value == nullptr) {
-    return isValid;  // true if there is no entry
+    return true;  // there is no entry
   }
   if (value->type != type) {
     return refuseContent(
@@ -50,10 +54,11 @@ bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   auto const mainIFD = readFirstDirectory(  // in this box, the Exif directory
-      stream, "the CMT2 box",
+      stream,
       {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,
        tag::FocalLength, tag::WhiteBalance, tag::MeteringMode, tag::ExposureBiasValue,
-       tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber});
+       tag::FocalLengthIn35mmFilm, tag::ExposureTime, tag::FNumber},
+      "the CMT2 box");
   return mainIFD && storeInfoFromMainIFD(mainIFD);
 }
 

@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  BoxContext context = {" before a moov box was met"};  // in notes on other boxes
+  BoxContext context = {/*text=*/" before a moov box was met"};
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
@@ -60,6 +60,7 @@ bool QVCR3Image::storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& m
   if (uuidBox.cmt2Box) {
     storeInfoFromCMT2(*uuidBox.cmt2Box);
   } else {
+    // The two APEX fields take the reasons of the values from which they are computed.
     noteAbsent(
         journal,
         {"lensModel", "iso", "apertureValue", "shutterSpeedValue", "focalLength", "whiteBalance",
@@ -73,7 +74,7 @@ void QVCR3Image::storeInfoFromCMT1(QVCR3CMT1Box& cmt1) {
   width = cmt1.width;
   height = cmt1.height;
   orientation = cmt1.orientation;
-  // Always empty: these two clear the dates that a host's own record may have held before.
+  // CMT1 never has these two dates: this clears what the record may have held before `read`.
   dateTimeOriginal = std::move(cmt1.dateTimeOriginal);
   dateTimeDigitized = std::move(cmt1.dateTimeDigitized);
   dateTime = std::move(cmt1.dateTime);

@@ -28,7 +28,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
-  BoxContext context = {" in the ", {box::Moov, stream->baseOffset + start}};
+  BoxContext context = {/*text=*/" in the ", /*parent=*/{box::Moov, stream->baseOffset + start}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (!stepOverBox(stream, context, child)) {
@@ -37,8 +37,9 @@ bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, l
     if (child.boxType != box::Uuid) {
       continue;
     }
+    // Cameras write one uuid box. Of several, the last counts, whatever its identifier.
     stream->setOffset(childStart);
-    uuidBox = std::make_shared<QVCR3UUIDBox>();  // the last box counts, whatever its identifier
+    uuidBox = std::make_shared<QVCR3UUIDBox>();
     if (!uuidBox->read(stream)) {
       return false;
     }

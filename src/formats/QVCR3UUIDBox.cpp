@@ -50,7 +50,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  BoxContext context = {" in the metadata ", {box::Uuid, position_}};
+  BoxContext context = {/*text=*/" in the metadata ", /*parent=*/{box::Uuid, position_}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (!stepOverBox(stream, context, child)) {
@@ -66,7 +66,7 @@ bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
       return false;
     }
     if (cmt1Box && cmt2Box) {
-      return true;  // the other children hold none of the record's fields
+      return true;  // both are there: a later duplicate is not looked for
     }
   }
   return true;

@@ -85,7 +85,7 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
       noteEnd(journal, walk.start);
       break;
     }
-    if (!reading.spend(Work::Steps, 1) || !readSegment(stream, marker, walk) ||
+    if (!reading.spend(Work::SegmentsAndBoxes, 1) || !readSegment(stream, marker, walk) ||
         !seekNext(*stream, walk.nextOffset)) {
       noteHints(journal, walk);
       return false;
@@ -203,7 +203,7 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
   stream->baseOffset += stream->getOffset();
 
   auto const mainIFD =
-      readFirstDirectory(stream, "the Exif segment", {tag::Orientation, tag::ExifIFDPointer});
+      readFirstDirectory(stream, {tag::Orientation, tag::ExifIFDPointer}, "the Exif segment");
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
@@ -229,7 +229,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
     return false;
   }
   if (wantsAll(journalOf(ifd))) {
-    noteSize(ifd, exifWidth, exifHeight);
+    noteExifSize(ifd, exifWidth, exifHeight);
   }
   if (exifWidth > kMaxThumbnailSide && exifHeight > kMaxThumbnailSide) {
     width = exifWidth;

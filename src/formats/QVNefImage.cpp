@@ -21,9 +21,8 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  auto const mainIFD = readFirstDirectory(
-      stream, kWholeFile,
-      {tag::SubIFDs, tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer});
+  auto const mainIFD = readFirstDirectory(stream, {tag::SubIFDs, tag::ImageWidth, tag::ImageLength,
+                                                   tag::Orientation, tag::ExifIFDPointer});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
@@ -34,7 +33,8 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  // The second SubIFD describes the raw image. Without it, the record has no size.
+  // The second SubIFD describes the raw image, as its NewSubfileType must confirm. Without this
+  // SubIFD, the record has no size.
   DirectoryPointer rawIFD;
   if (!readSubIFD(stream, mainIFD, /*index=*/1,
                   {tag::ImageWidth, tag::ImageLength, tag::NewSubfileType}, rawIFD)) {

@@ -94,8 +94,8 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  auto const mainIFD = readFirstDirectory(stream, "the embedded JPEG's Exif segment",
-                                          {tag::Orientation, tag::ExifIFDPointer});
+  auto const mainIFD = readFirstDirectory(stream, {tag::Orientation, tag::ExifIFDPointer},
+                                          "the embedded JPEG's Exif segment");
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }
@@ -108,7 +108,7 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
 bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   auto const rawSectionIFD =
-      readFirstDirectory(stream, "the raw section", {tag::RafDirectoryPointer});
+      readFirstDirectory(stream, {tag::RafDirectoryPointer}, "the raw section");
   if (!rawSectionIFD) {
     return false;
   }

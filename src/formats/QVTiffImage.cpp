@@ -16,10 +16,9 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
-    PartName const name = {"SubIFD", /*structure=*/kWholeFile, /*number=*/i + 1, count};
-    // Orientation is not stored: listing it makes a malformed entry refuse the file, as damaged.
+    // The SubIFD's Orientation is not used (the main IFD's is), only checked: see `TagList`.
     auto subIFD =
-        readDirectoryAt(stream, name, subIFDs[i]->longValue(),
+        readDirectoryAt(stream, subIFDName(i, count), subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
     ValuePointer type = nullptr;  // stays null if the entry is absent
     if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {
@@ -57,10 +56,9 @@ DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
 
 bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
-  auto const mainIFD =
-      readFirstDirectory(stream, kWholeFile,
-                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
-                          tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
+  auto const mainIFD = readFirstDirectory(
+      stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
+               tag::SubIFDs, tag::NewSubfileType, tag::DateTime});
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
     return false;
   }

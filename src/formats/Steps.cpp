@@ -12,6 +12,14 @@ constexpr std::int32_t kAbsentNumber = -1;  // in the record; a -1 in the file c
 
 }  // namespace
 
+EntryView findEntry(DirectoryPointer const& directory, unsigned short tag) {
+  if (auto const* const ours = ReaderDirectory::of(*directory)) {
+    return ours->table.entry(tag);
+  }
+  auto const entry = directory->entryForTag(tag);
+  return entry ? EntryView(*entry) : EntryView();
+}
+
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value) {
   auto const entry = findEntry(directory, tag);
   value = entry.size() == 1 ? entry[0] : nullptr;
@@ -69,10 +77,10 @@ DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName con
   return directory;
 }
 
-DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
-                                    TagList tags) {
+DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, TagList tags,
+                                    char const* structure) {
   QVTiffHeader header;
-  if (!readTiffHeader(*stream, kTiffMagic, structure, header)) {
+  if (!readTiffHeader(*stream, kTiffMagic, header, structure)) {
     return nullptr;
   }
   return readDirectoryAt(stream, {"IFD0", structure}, header.firstIFDOffset, tags);
@@ -117,8 +125,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
                count == 1 ? "SubIFD" : "SubIFDs", index + 1);
     return true;
   }
-  rawIFD = readDirectoryAt(stream, {"SubIFD", kWholeFile, index + 1, count},
-                           subIFDs[index]->longValue(), tags);
+  rawIFD = readDirectoryAt(stream, subIFDName(index, count), subIFDs[index]->longValue(), tags);
   return rawIFD != nullptr;
 }
 
@@ -133,24 +140,24 @@ void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
 // In the next two functions, `row` is null only for a host's directory, of which notes say nothing.
 
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
+  auto const* const ours = ReaderDirectory::of(*directory);
+  auto const* const row = ours == nullptr ? nullptr : ours->table.find(tag);
   if (row != nullptr && fieldOf(tag) != nullptr) {
-    noteAbsent(own->table.journal(), {fieldOf(tag)}, QVReason::NoValue, pattern,
-               PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode});
+    noteAbsent(ours->table.journal(), {fieldOf(tag)}, QVReason::NoValue, pattern,
+               PlacedEntry{ours->table, tag, row->position}, TypedCount{row->count, row->typeCode});
   }
 }
 
 bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char const* wanted) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  auto const* const row = own == nullptr ? nullptr : own->table.find(tag);
+  auto const* const ours = ReaderDirectory::of(*directory);
+  auto const* const row = ours == nullptr ? nullptr : ours->table.find(tag);
   if (row == nullptr) {
     return false;
   }
   bool const isUndefined = row->typeCode == kUndefinedCode;  // as a text, it is empty: not refused
-  return refuse(own->table.journal(), QVReason::MalformedEntry, row->position,
+  return refuse(ours->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
-                PlacedEntry{own->table, tag, row->position}, TypedCount{row->count, row->typeCode},
+                PlacedEntry{ours->table, tag, row->position}, TypedCount{row->count, row->typeCode},
                 wanted);
 }
 

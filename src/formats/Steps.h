@@ -15,6 +15,9 @@
 // stream is passed as to the public `read`; no step replaces it.
 namespace quavel::detail {
 
+/// The first entry with the tag; false as a bool when there is none.
+EntryView findEntry(DirectoryPointer const& directory, unsigned short tag);
+
 /// Finds the only value of a tag's entry. No entry: true, null `value`. Not exactly one: false.
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value);
 
@@ -33,9 +36,9 @@ DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName con
                                  std::uint32_t offset, TagList tags);
 
 /// Reads the TIFF header at the stream's position and the directory it refers to; null on failure.
-/// `structure` is what notes call the TIFF structure; with `kWholeFile` they do not name it.
-DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, char const* structure,
-                                    TagList tags);
+/// `structure` is what notes call the TIFF structure; null if it is the whole file.
+DirectoryPointer readFirstDirectory(std::shared_ptr<QVStream>& stream, TagList tags,
+                                    char const* structure = nullptr);
 
 /// Reads the directory whose offset is in the entry with the tag `pointer`. No entry: true,
 /// `result` is null. Not exactly one value, or the directory cannot be read: false.
@@ -73,14 +76,14 @@ bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
 
 /// A directory to be named in notes. A host's has no journal, so its table, null, is never asked.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  return {own == nullptr ? nullptr : &own->table};
+  auto const* const ours = ReaderDirectory::of(*directory);
+  return {ours == nullptr ? nullptr : &ours->table};
 }
 
 /// Where a directory begins in the file; -1 for one made by a host.
 inline std::int64_t positionOf(DirectoryPointer const& directory) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  return own == nullptr ? -1 : own->table.position();
+  auto const* const ours = ReaderDirectory::of(*directory);
+  return ours == nullptr ? -1 : ours->table.position();
 }
 
 }  // namespace quavel::detail

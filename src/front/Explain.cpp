@@ -63,8 +63,11 @@ QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
     return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, /*systemError=*/0};
   }
   FieldRow const& origin = *(&row + row.rowsToOrigin);  // the row itself, unless it is computed
-  auto const* const noted = journal.absenceOf(origin.name);
-  QVNote note = noted == nullptr ? QVNote() : *noted;  // null: a reader forgot to say why
+  auto const* const noted = journal.absenceOf(origin.name);  // null: no reader has said why
+  QVNote note = {QVNoteKind::Absence, QVReason::None, -1, "", "", /*systemError=*/0};
+  if (noted != nullptr) {
+    note = *noted;
+  }
   note.field = row.name;
   return note;
 }
@@ -124,13 +127,14 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
+      // The wrong kind of file explains any refusal, except one because reading failed.
       for (QVNote& note : journal.notes) {
         if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
-          note.reason = QVReason::OtherKind;  // says more than any reason but a failing read
+          note.reason = QVReason::OtherKind;
         }
       }
       journal.hint(QVReason::OtherContent, start,
-                   "The file looks like {}; its extension has it read as {}", {text, format.name});
+                   "The file looks like {}, but its extension says {}", {text, format.name});
     }
     return;  // the first signature that is there decides
   }

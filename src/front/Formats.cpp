@@ -38,8 +38,8 @@ template <class Image>
 std::shared_ptr<QVMetadata> make() {
   static_assert(sizeof(Image) == sizeof(QVMetadata));
   auto const storage = std::make_shared<RecordStorage>();
-  storage->record = new (storage->bytes) Image;
-  return {storage, storage->record};  // points to the record and shares the storage
+  storage->record = new (storage->bytes) Image;  // throws nothing, so `record` is always set
+  return {storage, storage->record};             // points to the record and shares the storage
 }
 
 constexpr Format kFormats[] = {
@@ -95,7 +95,8 @@ std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) 
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
   auto stream = openReadAhead(path, journal == nullptr ? nullptr : &journal->fd);
   if (journal != nullptr && journal->fd == -1) {
-    // Noted before `readStream` refuses the stream, which is empty then: the first refusal counts.
+    // Opening has failed: the stream has no bytes, so `readStream` refuses it too. The first
+    // refusal counts.
     journal->systemError = errno;
     refuse(journal, QVReason::CannotOpen, -1, "the file cannot be opened: {}",
            std::generic_category().message(journal->systemError));

@@ -11,8 +11,8 @@ namespace quavel::detail {
 
 class Journal;
 
-/// Work that a file can make a read do many times over. A step goes over a segment or a box.
-enum class Work : std::uint8_t { Directories, Entries, Values, Steps };
+/// Work that a file can make a read do many times over.
+enum class Work : std::uint8_t { Directories, Entries, Values, SegmentsAndBoxes };
 
 /// The most work of each kind in one read, far above what cameras' files need. The formats
 /// themselves set no limit: a file can refer to the same large directory again and again.
@@ -20,7 +20,7 @@ inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
     std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB of memory
-    std::uint64_t{1} << 24U,  // steps: a JPEG's reader takes one for every 2 bytes of padding
+    std::uint64_t{1} << 24U,  // segments, boxes: every 2 bytes of a JPEG's padding count as one
 };
 
 /// One read of a file: the work done so far, and the journal.

@@ -41,7 +41,7 @@ struct ReadAheadFile {
 
 PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 
-std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t count) {
+std::int64_t PositionedFile::readTimed(std::uint8_t* destination, std::size_t count) {
   int const filesLeft = filesToAdvise.load(std::memory_order_relaxed);
   if (filesLeft > 0) {
     file::expectFewReads(fd);
@@ -55,7 +55,7 @@ std::int64_t PositionedFile::readFirst(std::uint8_t* destination, std::size_t co
   return delivered;
 }
 
-std::int64_t PositionedFile::readFurther(std::uint8_t* destination, std::size_t count) {
+std::int64_t PositionedFile::readUntimed(std::uint8_t* destination, std::size_t count) {
   if (reads_ >= kReadsOfAWalk && position_ >= fetchEnd_) {
     file::expectReads(fd, position_, kFetchSize);
     fetchEnd_ = position_ + kFetchSize;
@@ -68,8 +68,8 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   ++reads_;
-  bool const isTimed = reads_ == 1 && file::kTakesAdvice;
-  auto delivered = isTimed ? readFirst(destination, count) : readFurther(destination, count);
+  bool const isTimed = reads_ == 1 && file::kTakesAdvice;  // only for advice
+  auto delivered = isTimed ? readTimed(destination, count) : readUntimed(destination, count);
   if (delivered == -1 && errno == ESPIPE) {
     delivered = readPipe(destination, count);
   }
@@ -81,15 +81,19 @@ std::int64_t PositionedFile::readPipe(std::uint8_t* destination, std::size_t cou
   if (position_ != pipePosition_) {
     return -1;  // a pipe cannot seek
   }
-  // Each read of a pipe delivers only what its writer has written so far.
   std::size_t received = 0;
-  std::int64_t delivered = 1;  // anything above 0: the pipe has not ended yet
-  while (received < count && delivered > 0) {
-    delivered = file::read(fd, destination + received, count - received);
-    received += delivered > 0 ? static_cast<std::size_t>(delivered) : 0;
+  while (received < count) {  // each read delivers only what the pipe's writer has written so far
+    std::int64_t const delivered = file::read(fd, destination + received, count - received);
+    if (delivered <= 0 && received == 0) {
+      return delivered;
+    }
+    if (delivered <= 0) {
+      break;
+    }
+    received += static_cast<std::size_t>(delivered);
   }
   pipePosition_ += static_cast<std::int64_t>(received);
-  return received == 0 ? delivered : static_cast<std::int64_t>(received);
+  return static_cast<std::int64_t>(received);
 }
 
 long PositionedFile::getOffset() {
@@ -97,9 +101,10 @@ long PositionedFile::getOffset() {
 }
 
 void PositionedFile::setOffset(long const& offset) {
-  std::int64_t const target = wrappingSum(baseOffset, offset);
-  // Reads state their position: the seek only asks whether the file system accepts a high one.
-  if (target >= 0 && (target <= kSurelyAccepted || file::seek(fd, target) == target)) {
+  std::int64_t const target = wrappingSum(baseOffset, offset);  // hosts may set any `baseOffset`
+  // Reads state their position, so there is no need to seek. But the file system may refuse a high
+  // position: then this must stay where it is, as QVFStream does.
+  if (target >= 0 && (target <= kMaxUncheckedSeek || file::seek(fd, target) == target)) {
     position_ = target;
   }
 }

@@ -15,14 +15,16 @@ namespace {
 
 bool fitsLong(std::int64_t number) { return number == static_cast<long>(number); }
 
-/// Seeks, by way of `baseOffset`, to a position that does not fit a `long`. False: the seek failed.
+/// Seeks, by way of `baseOffset`, to a position that does not fit a `long`. False: the source does
+/// not stand there.
 bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = detail::wrappingSum(base, target);
   source.setOffset(0);
   bool const seemsThere = source.getOffset() == 0;
   source.baseOffset = base;
-  // Now a source that ignores `baseOffset` still says 0; one that has moved says the cut target.
+  // A source that ignores `baseOffset` has just gone to 0 and still gives 0 now. One that has moved
+  // gives the target, truncated to a `long`.
   return seemsThere && source.getOffset() == static_cast<long>(target);
 }
 
@@ -55,20 +57,22 @@ long QVReadAheadStream::getOffset() {
 
 void QVReadAheadStream::setOffset(long const& offset) {
   std::int64_t const target = detail::wrappingSum(baseOffset, offset);
-  if (target >= 0 && (target <= detail::kSurelyAccepted || sourceAccepts(target))) {
+  if (target >= 0 && (target <= detail::kMaxUncheckedSeek || seekSource(target))) {
     position_ = target;
   }
 }
 
-bool QVReadAheadStream::sourceAccepts(std::int64_t target) {
-  sourcePosition_ = -1;  // the source is moved below
-  // A source that stays at 0 refuses the seek. One that goes elsewhere, as to its end, accepts it.
+bool QVReadAheadStream::seekSource(std::int64_t target) {
+  sourcePosition_ = -1;  // not known until a read succeeds
   source_->setOffset(0);
   if (fitsLong(target)) {
     source_->setOffset(static_cast<long>(target));
-    return source_->getOffset() != 0;
+  } else if (seekByBase(*source_, target)) {
+    return true;
   }
-  return seekByBase(*source_, target) || source_->getOffset() != 0;
+  // A source that stays at 0 has refused the seek. One that stops at its end has accepted it: a
+  // read delivers nothing there, as it would past the end.
+  return source_->getOffset() != 0;
 }
 
 std::size_t QVReadAheadStream::copyFetched(std::uint8_t* destination, std::size_t count) {
@@ -98,7 +102,8 @@ void QVReadAheadStream::fetchNext(std::size_t needed) {
   if (!last_.bytes) {
     last_.bytes.reset(new std::uint8_t[largerSize]);
   }
-  bool const isSequential = position_ == sourcePosition_;  // such reads are likely to go on
+  // Sequential reads are likely to go on: they fetch as much as the larger size.
+  bool const isSequential = position_ == sourcePosition_;
   fetch(last_, isSequential ? largerSize : nextSize_, needed);
 }
 
@@ -120,7 +125,7 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   if (mustSeek) {
     if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
-    } else if (!sourceAccepts(position_)) {  // moves the source there
+    } else if (!seekSource(position_)) {
       return -1;
     }
   }

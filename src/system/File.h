@@ -47,7 +47,8 @@ inline std::int64_t position(int fd) { return ::lseek(fd, 0, SEEK_CUR); }
 
 inline std::int64_t seek(int fd, std::int64_t position) { return ::lseek(fd, position, SEEK_SET); }
 
-/// The size of a regular file; -1 for any other kind of file, with `errno` left as it is.
+/// The size of a regular file; -1 for any other kind of file, or if it cannot be told. `errno` does
+/// not say which.
 inline std::int64_t size(int fd) {
   struct stat status = {};
   bool const isRegular = ::fstat(fd, &status) == 0 && S_ISREG(status.st_mode);

@@ -26,8 +26,9 @@ std::wstring widened(std::string const& path) {
   return wide.data();
 }
 
-/// The path as Windows takes it. If it has MAX_PATH characters or more once it is absolute, it is
-/// made so and gets the prefix `\\?\`, with which `\\server\share` becomes `\\?\UNC\server\share`.
+/// The path as Windows takes it. An absolute path has room for MAX_PATH characters, its NUL among
+/// them. A longer one is made absolute and gets the prefix `\\?\`; in it, `\\server\share` is
+/// written `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
   if (size < MAX_PATH) {

@@ -7,13 +7,13 @@
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "stream/Bytes.h"
 #include "tiff/EntryWalk.h"
-#include "tiff/ReaderDirectory.h"
 
 namespace quavel::detail {
 
 namespace {
 
-// Enough for most directories, and at 9 bytes each just below 1 KB: more is slower to allocate.
+// Enough for most directories. At 9 bytes each, they take just below 1 KB: glibc's `malloc` is
+// slower for larger blocks.
 constexpr std::size_t kReservedValues = 112;
 
 // A damaged directory may declare 65535 entries: what is reserved for them has a bound.
@@ -47,7 +47,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   values_.reserve(kReservedValues);
   EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
   for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
-    if (!walk.bufferEntry()) {
+    if (!walk.bufferTag()) {
       return refuseCut(journal_, walk.position(), kEntryTagSize, "entry {} of {} of {}",
                        walk.number(), entryCount_, PlacedDirectory{this});
     }
@@ -56,8 +56,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
       continue;
     }
     RawEntry entry;
-    // If the stream refuses the later seek to the entry's values, they are read where it stands.
-    // So it first goes to the entry's end, however far the walk has read ahead.
+    // `setOffset` reports no failure: if a stream does not seek to the values, they are read where
+    // it stands. That must be the entry's end, as if the walk did not read ahead.
     if (!seek(stream, walk.nextOffset()) || !walk.parseRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
@@ -68,7 +68,8 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
     }
   }
 
-  // The walk may stop early, and values lie elsewhere. The seek fails only beyond all offsets.
+  // The walk may have stopped early, and reading values has moved the stream. This fails only if
+  // the directory ends beyond the last offset that a stream can have.
   if (!seek(stream, walk.endOffset())) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }
@@ -79,7 +80,7 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
                            RawEntry const& entry) {
   auto const firstValue = static_cast<std::uint32_t>(values_.size());
   Row row = {tag, entry.typeCode, entry.count, position, /*bytesOrOffset=*/0, firstValue};
-  if (!isAllowed(entry) || !hasWholeField(entry)) {
+  if (!isKnown(entry.typeCode) || hasTooManyValues(entry) || !hasWholeField(entry)) {
     return refuseEntry(row, entry);
   }
   if (entry.typeCode == kUndefinedCode) {
@@ -114,10 +115,10 @@ bool EntryTable::refuseEntry(Row const& row, RawEntry const& entry) const {
   PlacedEntry const place = {*this, row.tag, row.position};
   if (!isKnown(row.typeCode)) {
     return refuse(journal_, QVReason::MalformedEntry, row.position,
-                  "{}: field type {} is neither one of TIFF's 12 nor 13 (IFD)", place,
+                  "{}: field type {} is not one of TIFF's, 1 to 13", place,
                   std::uint32_t{row.typeCode});
   }
-  if (!isAllowed(entry)) {
+  if (hasTooManyValues(entry)) {
     return refuse(journal_, QVReason::TooManyValues, row.position,
                   "{}: it declares {}; more than {} are refused", place,
                   TypedCount{row.count, row.typeCode}, kMaxValuesOfEntry);
@@ -136,14 +137,6 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
                 "{}: its {} would begin at {} and end at {}, but {}",
                 PlacedEntry{*this, row.tag, row.position}, TypedCount{row.count, row.typeCode},
                 Offset{begin}, Offset{end}, journal_->cutText(end));
-}
-
-Entry findEntry(DirectoryPointer const& directory, unsigned short tag) {
-  if (auto const* const own = ReaderDirectory::of(*directory)) {
-    return own->table.entry(tag);
-  }
-  auto const entry = directory->entryForTag(tag);
-  return entry ? Entry(*entry) : Entry();
 }
 
 void append(std::string& out, PlacedDirectory directory) {

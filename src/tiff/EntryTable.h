@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "quavel/QVTiffImageFileDirectoryEntryValue.h"
-#include "tiff/Entry.h"
+#include "tiff/EntryView.h"
 #include "tiff/RawEntry.h"
 #include "tiff/TiffWords.h"
 #include "tiff/WantedTags.h"
@@ -22,7 +22,8 @@ namespace detail {
 
 class Journal;
 
-/// A directory's wanted entries, their values in one array; its name and position are for notes.
+/// A directory's wanted entries, with all their values in one array. The directory's name and its
+/// position in the file are for notes; seeks take offsets, which count from `baseOffset`.
 class EntryTable {
  public:
   struct Row {
@@ -54,9 +55,10 @@ class EntryTable {
     return found == rows_.end() ? nullptr : &*found;
   }
   /// The first entry with the tag; false as a bool when there is none.
-  Entry entry(unsigned short tag) const {
+  EntryView entry(unsigned short tag) const {
     Row const* const row = find(tag);
-    return row == nullptr ? Entry() : Entry(values_.data() + row->firstValue, row->valueCount());
+    return row == nullptr ? EntryView()
+                          : EntryView(values_.data() + row->firstValue, row->valueCount());
   }
 
   using Map = std::map<std::uint16_t, std::shared_ptr<QVTiffImageFileDirectoryEntry>>;
@@ -81,7 +83,8 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
-// The next three functions and `takeEntries` serve hosts; they are defined in HostEntry.cpp.
+// Only hosts are given values and UNDEFINED bytes as objects. The next three functions and
+// `takeEntries` prepare them, in HostEntry.cpp.
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
@@ -89,8 +92,8 @@ using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue
 std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std::size_t first,
                                   std::size_t count);
 
-/// What is kept of an UNDEFINED entry. Up to 4 bytes are kept as in the file, with zeros for those
-/// after the data's end. Of more bytes, their offset is kept, in this machine's byte order.
+/// What is kept of an UNDEFINED entry. Up to 4 bytes are kept as in the file; those that the file's
+/// end cuts off are zeros. Of more bytes, their offset is kept, in this machine's byte order.
 std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed);
 
 /// Gives an entry for a host its `count` bytes or their offset, from `undefinedBytesOrOffset`.
@@ -99,7 +102,9 @@ void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
 
 /// A directory in a note: "IFD0 at 8".
 struct PlacedDirectory {
-  EntryTable const* table;  ///< Null for a host's directory: `append` is not called then.
+  /// Null for a host's directory. That has no journal, so no note is composed and `append`, which
+  /// needs a table, is never called.
+  EntryTable const* table;
 };
 void append(std::string& out, PlacedDirectory directory);
 

@@ -12,8 +12,8 @@ namespace quavel::detail {
 /// A walk over a directory's entries, of which it reads up to 64 at a time.
 class EntryWalk {
  public:
-  /// The stream stands at the first of `count` entries, which is at `position` in the file, as
-  /// notes need it; the stream's own offsets count from its `baseOffset`.
+  /// The stream stands at the first of `count` entries. `position` is that place in the file, for
+  /// notes; it differs from the stream's offset by the stream's `baseOffset`.
   EntryWalk(QVStream& stream, unsigned short count, std::int64_t position)
       : stream_(stream),
         isReversed_(needsReversal(stream)),
@@ -36,9 +36,9 @@ class EntryWalk {
   /// Where the current entry begins in the file.
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
-  /// Buffers the current entry, which may move the stream. False: its tag is not all there. If the
-  /// tag is buffered, so is the rest, or the data ends: whole entries are read.
-  bool bufferEntry() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
+  /// Buffers the current entry's tag, which may move the stream. False: the data ends within it.
+  /// The buffer is filled with whole entries: the rest is missing only where the data ends.
+  bool bufferTag() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
@@ -51,7 +51,7 @@ class EntryWalk {
     entry->count = numberIn<std::uint32_t>(kValueCountPosition);
     entry->field = entry_ + kEntryFieldPosition;
     auto const available = static_cast<std::size_t>(bufferEnd_ - entry->field);
-    entry->fieldSize = std::min(available, kEntryFieldSize);
+    entry->fieldBytesRead = std::min(available, kEntryFieldSize);
     return true;
   }
 

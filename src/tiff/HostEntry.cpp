@@ -23,7 +23,7 @@ std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed) {
     return valueOffset(entry, isReversed);
   }
   std::uint32_t bytes = 0;
-  std::memcpy(&bytes, entry.field, entry.fieldSize);
+  std::memcpy(&bytes, entry.field, entry.fieldBytesRead);
   return bytes;
 }
 

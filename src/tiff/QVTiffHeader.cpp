@@ -1,5 +1,7 @@
 #include "quavel/QVTiffHeader.h"
 
+#include <algorithm>
+
 #include "journal/Journal.h"
 #include "journal/Reading.h"
 #include "stream/Bytes.h"
@@ -23,13 +25,14 @@ constexpr unsigned short kBigTiffMagic = 43;
 QVTiffHeader::QVTiffHeader() = default;
 
 bool QVTiffHeader::read(std::shared_ptr<QVStream>& stream, unsigned short expectedMagic) {
-  return detail::readTiffHeader(*stream, expectedMagic, detail::kWholeFile, *this);
+  return detail::readTiffHeader(*stream, expectedMagic, *this);
 }
 
-bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
-                            QVTiffHeader& header) {
+bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, QVTiffHeader& header,
+                            char const* structure) {
   Journal* const journal = journalOf(stream);
-  // The stream stands before `start` if a damaged file puts `baseOffset` beyond a buffer's end.
+  // For notes. In a damaged file, `baseOffset` may be beyond a buffer's end, where the stream
+  // stops: its position then comes before `baseOffset`, at which the header should begin.
   std::int64_t const start = std::max(positionForNotes(journal, stream), stream.baseOffset);
   PartName const name = {"the TIFF header", structure};
 

@@ -17,14 +17,16 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   if (!stream->readShort(&entry.typeCode) || !isKnown(entry.typeCode)) {
     return false;
   }
-  if (!stream->readLong(&entry.count) || !isAllowed(entry)) {
+  if (!stream->readLong(&entry.count) || hasTooManyValues(entry)) {
     return false;
   }
   std::array<std::uint8_t, kEntryFieldSize> field;
   entry.field = field.data();
-  entry.fieldSize = readUpTo(*stream, field.data(), usedFieldSize(entry));
+  // No more is read than is used: the stream must stand where a value in the field ends.
+  entry.fieldBytesRead = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // The field holds up to 4 bytes, stored even if the read fails among them, or else an offset.
+    // Up to 4 bytes are in the field: hosts get those that could be read, even if this then fails.
+    // Of more bytes, the field has the offset.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, undefinedBytesOrOffset(entry, needsReversal(*stream)), *this);
     }
@@ -39,7 +41,7 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVTiffImageFileDirectoryEntry::convertToString(std::string& out) const {
-  return Entry(*this).convertToString(out);
+  return EntryView(*this).convertToString(out);
 }
 
 }  // namespace quavel

@@ -21,35 +21,36 @@ inline constexpr std::size_t kEntryFieldSize = 4;
 inline constexpr std::size_t kEntrySize = 12;
 inline constexpr std::int64_t kEntryCountSize = 2;  // a directory begins with its entry count
 
-inline constexpr std::uint16_t kUndefinedCode = 7;  // of the type UNDEFINED
+// The type UNDEFINED: such an entry has no values but bytes. The field holds up to 4 of them; of
+// more, only the offset in the field is used.
+inline constexpr std::uint16_t kUndefinedCode = 7;
 
 /// What follows the tag in a directory entry, not yet interpreted.
 struct RawEntry {
   std::uint16_t typeCode;
   std::uint32_t count;
-  std::uint8_t const* field;  ///< The values, or their offset.
-  std::size_t fieldSize;      ///< How many of the field's bytes were read; the file may end early.
+  std::uint8_t const* field;   ///< The values, or their offset.
+  std::size_t fieldBytesRead;  ///< 0 to 4; the file may end early.
 };
 
 // In real files, the longest wanted entries are texts of a few hundred bytes. With this bound, an
 // entry with a damaged count takes less than 2 MB of memory.
 inline constexpr std::uint32_t kMaxValuesOfEntry = 65536;
 
-/// Bytes of one value, by EntryValueType, not by its code in files. Hosts get 0 for UNDEFINED.
+/// Bytes of one value, by EntryValueType (not by the code in files). UNDEFINED has the 0 that the
+/// public `sizeOfValueOfType` gives.
 inline constexpr std::array<std::uint8_t, 12> kValueSizes = {1, 1, 2, 4, 8, 1, 0, 2, 4, 8, 4, 8};
 
 inline bool isKnown(std::uint16_t typeCode) {
   return typeCode != 0 && typeCode < fieldTypeToValueType.size();
 }
 
-/// Whether the type is known and there are not too many values. Any number of UNDEFINED bytes is
-/// allowed: those outside the entry's field are never read.
-inline bool isAllowed(RawEntry const& entry) {
-  return isKnown(entry.typeCode) &&
-         (entry.typeCode == kUndefinedCode || entry.count <= kMaxValuesOfEntry);
+/// Whether the entry is refused for its count. UNDEFINED bytes may be any number.
+inline bool hasTooManyValues(RawEntry const& entry) {
+  return entry.typeCode != kUndefinedCode && entry.count > kMaxValuesOfEntry;
 }
 
-/// Bytes that an entry's values, or UNDEFINED bytes, take in the file. The type must be known.
+/// How many bytes an entry's values take in the file. The type must be known.
 inline std::uint64_t sizeOfValues(RawEntry const& entry) {
   auto const type = static_cast<std::size_t>(fieldTypeToValueType[entry.typeCode]);
   return std::uint64_t{entry.count} * (entry.typeCode == kUndefinedCode ? 1 : kValueSizes[type]);
@@ -61,15 +62,17 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
 }
 
 /// Whether all the bytes of the field that the entry uses were read.
-inline bool hasWholeField(RawEntry const& entry) { return entry.fieldSize >= usedFieldSize(entry); }
+inline bool hasWholeField(RawEntry const& entry) {
+  return entry.fieldBytesRead >= usedFieldSize(entry);
+}
 
-/// The offset that the field holds. `entry.fieldSize` must be 4.
+/// The offset that the field holds. All its 4 bytes must have been read.
 inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
   return numberAt<std::uint32_t>(entry.field, isReversed);
 }
 
-/// Appends the values of an entry that is allowed, has its whole field and is not UNDEFINED.
-/// False: the data does not hold them all.
+/// Appends the entry's values. They must be of a known type but UNDEFINED and not too many, and the
+/// entry must have its whole field. False: the data does not hold all values.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 

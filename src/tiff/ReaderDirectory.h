@@ -5,8 +5,8 @@
 
 #include "quavel/QVTiffHeader.h"
 #include "quavel/QVTiffImageFileDirectory.h"
-#include "tiff/Entry.h"
 #include "tiff/EntryTable.h"
+#include "tiff/EntryView.h"
 
 namespace quavel::detail {
 
@@ -17,14 +17,14 @@ using DirectoryPointer = std::shared_ptr<QVTiffImageFileDirectory>;
 class ReaderDirectory final : public QVTiffImageFileDirectory {
  public:
   ReaderDirectory(PartName const& name, std::int64_t position) : table(name, position) {
-    ofReader = this;  // for `of`
+    asReaderDirectory_ = this;  // a member of the base, null in any other directory
   }
   ReaderDirectory(ReaderDirectory const&) = delete;
   ReaderDirectory& operator=(ReaderDirectory const&) = delete;
 
   /// The directory itself if it is a ReaderDirectory, else null.
   static ReaderDirectory const* of(QVTiffImageFileDirectory const& directory) {
-    return directory.ofReader;
+    return directory.asReaderDirectory_;
   }
 
   /// Moves the values into a new directory, whose `entries` a host can use.
@@ -34,17 +34,14 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
 };
 
 /// The body of `QVTiffHeader::read`. `structure` is what notes call the TIFF structure, such as
-/// "the Exif segment"; with `kWholeFile` they do not name it.
-bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, char const* structure,
-                    QVTiffHeader& header);
-
-/// The first entry with the tag; false as a bool when there is none.
-Entry findEntry(DirectoryPointer const& directory, unsigned short tag);
+/// "the Exif segment"; null if it is the whole file.
+bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, QVTiffHeader& header,
+                    char const* structure = nullptr);
 
 /// The journal of the read that filled the directory; null for a directory made by a host.
 inline Journal* journalOf(DirectoryPointer const& directory) {
-  auto const* const own = ReaderDirectory::of(*directory);
-  return own == nullptr ? nullptr : own->table.journal();
+  auto const* const ours = ReaderDirectory::of(*directory);
+  return ours == nullptr ? nullptr : ours->table.journal();
 }
 
 }  // namespace quavel::detail

@@ -46,18 +46,34 @@ inline constexpr Tag RafDirectoryPointer = {0xf000, "(the vendor directory)"};
 inline constexpr Tag RafImageWidth = {0xf001, "(the raw image's width)", "width"};
 inline constexpr Tag RafImageLength = {0xf002, "(the raw image's height)", "height"};
 
-template <class... Tags>
-constexpr std::array<Tag, sizeof...(Tags)> arrayOf(Tags const&... tags) {
-  return {tags...};
-}
-
 /// For notes, which find a tag's name and field by its number.
-inline constexpr auto kAll = arrayOf(
-    NewSubfileType, ImageWidth, ImageLength, Model, Orientation, DateTime, SubIFDs, ExposureTime,
-    FNumber, ExifIFDPointer, ISOSpeedRatings, DateTimeOriginal, DateTimeDigitized,
-    OffsetTimeOriginal, ShutterSpeedValue, ApertureValue, ExposureBiasValue, MeteringMode,
-    FocalLength, PixelXDimension, PixelYDimension, WhiteBalance, FocalLengthIn35mmFilm, LensModel,
-    RafDirectoryPointer, RafImageWidth, RafImageLength);
+inline constexpr std::array kAll = {NewSubfileType,
+                                    ImageWidth,
+                                    ImageLength,
+                                    Model,
+                                    Orientation,
+                                    DateTime,
+                                    SubIFDs,
+                                    ExposureTime,
+                                    FNumber,
+                                    ExifIFDPointer,
+                                    ISOSpeedRatings,
+                                    DateTimeOriginal,
+                                    DateTimeDigitized,
+                                    OffsetTimeOriginal,
+                                    ShutterSpeedValue,
+                                    ApertureValue,
+                                    ExposureBiasValue,
+                                    MeteringMode,
+                                    FocalLength,
+                                    PixelXDimension,
+                                    PixelYDimension,
+                                    WhiteBalance,
+                                    FocalLengthIn35mmFilm,
+                                    LensModel,
+                                    RafDirectoryPointer,
+                                    RafImageWidth,
+                                    RafImageLength};
 
 }  // namespace quavel::tag
 

@@ -41,7 +41,7 @@ void append(std::string& out, PartName const& part) {
     out.append(" ").append(std::to_string(part.number));
     out.append(" of ").append(std::to_string(part.count));
   }
-  if (part.structure != kWholeFile) {
+  if (part.structure != nullptr) {
     out.append(" of ").append(part.structure);
   }
 }

@@ -20,16 +20,18 @@ struct TypedCount {
   std::uint16_t typeCode;
 };
 
-/// Stands for the name of a TIFF structure that is the whole file: notes then name no structure.
-inline constexpr char const* kWholeFile = nullptr;
-
 /// The name of a directory or a header in a TIFF structure: "IFD0 of the Exif segment".
 struct PartName {
   char const* name = "the directory";
-  char const* structure = kWholeFile;  ///< The name of the TIFF structure.
-  std::uint32_t number = 0;  ///< From 1 to `count`: "SubIFD 2 of 3". 0: there is only one.
+  char const* structure = nullptr;  ///< What holds the TIFF structure; null: it is the whole file.
+  std::uint32_t number = 0;         ///< From 1 to `count`: "SubIFD 2 of 3". 0: there is only one.
   std::uint32_t count = 0;
 };
+
+/// "SubIFD 2 of 3" for `index` 1.
+inline PartName subIFDName(std::uint32_t index, std::uint32_t count) {
+  return {"SubIFD", /*structure=*/nullptr, /*number=*/index + 1, count};
+}
 
 void append(std::string& out, TagName tag);
 void append(std::string& out, TypedCount values);

@@ -10,8 +10,8 @@
 
 namespace quavel::detail {
 
-/// The tags that a reader wants. Some, such as OffsetTimeOriginal, are listed only so that a file
-/// is refused if their entry is damaged.
+/// The tags that a reader wants. Some, such as OffsetTimeOriginal, are not used but only checked:
+/// if their entry is malformed, so may the rest be, and the file is refused.
 using TagList = std::initializer_list<unsigned short>;
 
 /// The tags that are still wanted while a directory is read. A listed tag is wanted until it is
@@ -87,7 +87,8 @@ class WantedTags {
 
   bool const wantsAll_;
   std::uint64_t mask_ = 0;  // the `bitOf` of all listed tags: rules out most others quickly
-  std::size_t left_ = 0;    // listed tags that are still to be met; a short list begins with them
+  std::size_t left_ =
+      0;  // how many listed tags are still to be met: in a short list, its first ones
   std::array<unsigned short, kMaxShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null while the short list is enough
 };

@@ -38,13 +38,14 @@ std::string csvHeader(Form const& form) {
   return header + lineEnd(form);
 }
 
-TextOf csvRows(Form const& form, bool isForTerminal) {
+TextMaker csvRowMaker(Form const& form, bool isForTerminal) {
   return [fields = fieldsOf(form), isForTerminal, end = lineEnd(form)](Outcome const& outcome) {
     std::string row;
     for (auto const* field : fields) {
       std::string text;
       appendExact(text, field->value(outcome));
-      if (isForTerminal) {  // in `text`, U+FFFD has replaced a path's bytes that are not UTF-8
+      if (isForTerminal) {
+        // In `text`, a path has lost its bytes that are not UTF-8.
         text = field->name == "path" ? escapedPath(outcome.path) : escaped(text);
       }
       row += quoted(text) + ',';

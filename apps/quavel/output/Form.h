@@ -23,12 +23,12 @@ struct Form {
   bool hasIsoDates = false;           ///< Dates are written in ISO 8601.
   bool endsWithLf = false;            ///< Lines of CSV end with LF, not CRLF.
 
-  /// Whether it gives programs values of fields. `Paths`, the kind for --print0, gives none.
-  bool isForMachines() const {
+  /// Whether the output is data for other programs: the fields' values, in JSON or CSV.
+  bool isData() const {
     return kind == FormKind::Json || kind == FormKind::Jsonl || kind == FormKind::Csv;
   }
-  /// Whether it explains in words why files give no record.
-  bool isExplanation() const { return hasNotes && !isForMachines(); }
+  /// Whether the notes are shown as text, not within JSON: this is what `--why` alone gives.
+  bool isExplanation() const { return hasNotes && !isData(); }
 };
 
 }  // namespace app

@@ -9,9 +9,8 @@
 
 namespace app {
 
-/// Gives the text that a form shows for one file. Called on any thread. If the form is given
-/// `isForTerminal`, characters that could steer the terminal are escaped.
-using TextOf = std::function<std::string(Outcome const&)>;
+/// Makes the text that is shown for one file. Called on any thread.
+using TextMaker = std::function<std::string(Outcome const&)>;
 
 /// A card: labelled lines for people. Empty when the file gave no record.
 std::string cardOf(Form const& form, Outcome const& outcome);
@@ -19,17 +18,19 @@ std::string cardOf(Form const& form, Outcome const& outcome);
 /// Why a file gives no record, or which fields its record lacks and why: a verdict, then details.
 std::string explanationOf(Outcome const& outcome);
 
-/// CSV by RFC 4180: a header row, then a row for each file. Absent values are empty.
+/// CSV by RFC 4180: a header row, then a row for each file. Absent values are empty. The maker
+/// escapes characters that could steer the terminal if the rows are for one.
 std::string csvHeader(Form const& form);
-TextOf csvRows(Form const& form, bool isForTerminal);
+TextMaker csvRowMaker(Form const& form, bool isForTerminal);
 
 /// JSON objects, each on one line. For JSON Lines, each includes its line end; in an array, the
 /// writer adds commas and line ends. An infinity, which JSON lacks, is "Infinity" or "-Infinity".
-TextOf jsonObjects(Form const& form, bool isForTerminal);
+/// The maker escapes as that of CSV does, and it refers to `form`, which must outlive it.
+TextMaker jsonObjectMaker(Form const& form, bool isForTerminal);
 
-/// A table for people, laid out page by page so that no more than a page is ever held. On a
-/// terminal it fits the width, and a page ends early if rows come slowly; elsewhere nothing is cut
-/// and each page is filled. A single file becomes a card, unless a table is asked for.
+/// A table for people. It is laid out a page of 500 rows at a time, so that no more are held in
+/// memory. On a terminal it fits the width, and a page ends early if rows come slowly; elsewhere
+/// nothing is cut and each page is filled. With FormKind::Automatic, a single file becomes a card.
 std::unique_ptr<Writer> makeTable(Form const& form, Output& output);
 
 }  // namespace app

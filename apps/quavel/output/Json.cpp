@@ -9,7 +9,7 @@ namespace app {
 namespace {
 
 bool mayNeedEscapes(std::string const& text) {
-  return !isPlain(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
+  return !isPrintableAscii(text) || text.find('"') != text.npos || text.find('\\') != text.npos;
 }
 
 /// Appends a value that is not absent. An infinity is quoted: JSON has no number for it. The JSON
@@ -18,9 +18,10 @@ void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && mayNeedEscapes(*text)) {
-    // A terminal gets \uNNNN for all that is not ASCII if the text could steer it.
-    bool const asAscii = isForTerminal && escaped(*text) != *text;
-    json += nlohmann::json(*text).dump(-1, ' ', asAscii, nlohmann::json::error_handler_t::replace);
+    // If it could steer the terminal, all that is not ASCII becomes \uNNNN.
+    bool const couldSteer = isForTerminal && escaped(*text) != *text;
+    json +=
+        nlohmann::json(*text).dump(-1, ' ', couldSteer, nlohmann::json::error_handler_t::replace);
   } else if (text != nullptr || (number != nullptr && std::isinf(*number))) {
     json += '"';
     appendExact(json, value);
@@ -54,7 +55,8 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
          (outcome.furtherSteps == 0 ? "" : further);
 }
 
-/// How a field is written in an object, whose "{" then replaces the first comma.
+/// How a field is written in an object. Each begins with a comma; `jsonObjectMaker` replaces the
+/// first one with the "{".
 struct Member {
   Field const* field;
   std::string name;    // such as `,"iso":`
@@ -87,11 +89,12 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 
 }  // namespace
 
-TextOf jsonObjects(Form const& form, bool isForTerminal) {
+TextMaker jsonObjectMaker(Form const& form, bool isForTerminal) {
   Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // An object with a path that is not UTF-8 also gets pathBytes, even if `fields` lacks them.
-  bool const recordNeedsPathBytes = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, recordNeedsPathBytes, recordMembers = membersOf(fields),
+  // The field pathBytes is absent if the path is UTF-8. If not, it goes with the path, wanted or
+  // not.
+  bool const recordMayLackIt = contains(fields, "path") && !contains(fields, "pathBytes");
+  return [&form, isForTerminal, recordMayLackIt, recordMembers = membersOf(fields),
           problemMembers = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
                                       fieldNamed("position")}),
           pathBytesMember = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
@@ -99,7 +102,7 @@ TextOf jsonObjects(Form const& form, bool isForTerminal) {
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
     appendMembers(object, outcome.record ? recordMembers : problemMembers, outcome,
                   form.showAbsent.value_or(true), isForTerminal);
-    if (!outcome.record || recordNeedsPathBytes) {
+    if (!outcome.record || recordMayLackIt) {
       appendMembers(object, pathBytesMember, outcome, /*showAbsent=*/false, isForTerminal);
     }
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";

@@ -61,8 +61,8 @@ std::string explanationOf(Outcome const& outcome) {
   if (outcome.furtherSteps != 0) {
     text += "  read: " + std::to_string(outcome.furtherSteps) + " more\n";
   }
-  return text + linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n") +  // sentences
-         absencesOf(outcome.notes);
+  text += linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n");  // hints are sentences
+  return text + absencesOf(outcome.notes);
 }
 
 }  // namespace app

@@ -16,7 +16,8 @@ namespace app {
 
 namespace {
 
-/// Writes all bytes, within a WriteScope. An interrupt before the first one ends the process.
+/// Writes all bytes. The caller holds a WriteScope. An interrupt before the first byte is written
+/// ends the process.
 void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -57,8 +58,9 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // An interrupt waits a second at most for a write. So that it cuts no piece, a pipe gets up to
-  // PIPE_BUF bytes at once: it takes them whole or, while it is full, not at all. A file gets all.
+  // A second after an interrupt, the process ends even within a write, which must not cut a piece.
+  // So a pipe gets at most PIPE_BUF bytes at once: it takes them all or, while it is full, none. A
+  // file gets everything at once.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
@@ -83,7 +85,8 @@ void Output::enclose(std::string_view head, char const* tail) {
 void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
-  if (char const* const tail = std::exchange(tail_, nullptr)) {  // once: see `giveUp`
+  if (char const* const tail =
+          std::exchange(tail_, nullptr)) {  // once, even if `giveUp` calls this again
     writeWhole(tail);
   }
   interrupt::setTail(nullptr);  // not earlier: an interrupt within `writeWhole` needs the tail

@@ -14,7 +14,7 @@ namespace {
 /// Writes a text for each file, with `start` before the first and `separator` before the others.
 class TextWriter : public Writer {
  public:
-  TextWriter(Output& output, TextOf textOf, std::string start, std::string separator)
+  TextWriter(Output& output, TextMaker textOf, std::string start, std::string separator)
       : output_(output),
         textOf_(std::move(textOf)),
         beforeNext_(std::move(start)),
@@ -35,7 +35,7 @@ class TextWriter : public Writer {
 
  private:
   Output& output_;
-  TextOf textOf_;
+  TextMaker textOf_;
   std::string beforeNext_;
   std::string separator_;
 };
@@ -72,8 +72,9 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// Each path, ended by a NUL. With conditions, which all files here meet, even without a record.
-TextOf paths(Form const& form, bool isForTerminal) {
+/// The path of each file that gave a record, ended by a NUL. If there are conditions, all files
+/// that come here meet them and are listed, with or without a record.
+TextMaker paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;
     bool const isListed = outcome.record || hasConditions;
@@ -83,23 +84,23 @@ TextOf paths(Form const& form, bool isForTerminal) {
 
 std::unique_ptr<Writer> makeText(Form const& form, Output& output) {
   bool const isTerminal = output.isTerminal();
-  auto const writer = [&output](TextOf textOf, char const* start, char const* separator) {
+  auto const writer = [&output](TextMaker textOf, char const* start, char const* separator) {
     return std::make_unique<TextWriter>(output, std::move(textOf), start, separator);
   };
   switch (form.kind) {  // each text ends its own line, except in a JSON array
     case FormKind::Json:
       output.enclose("[", "\n]\n");
-      return writer(jsonObjects(form, isTerminal), "\n", ",\n");
+      return writer(jsonObjectMaker(form, isTerminal), "\n", ",\n");
     case FormKind::Jsonl:
-      return writer(jsonObjects(form, isTerminal), "", "");
+      return writer(jsonObjectMaker(form, isTerminal), "", "");
     case FormKind::Csv:
       output.add(csvHeader(form));
-      return writer(csvRows(form, isTerminal), "", "");
+      return writer(csvRowMaker(form, isTerminal), "", "");
     case FormKind::Paths:
       return writer(paths(form, isTerminal), "", "");
     case FormKind::Card:
       return writer([&form](Outcome const& outcome) { return cardOf(form, outcome); }, "", "\n");
-    default:  // only Automatic with notes: tables do not come here
+    default:  // Automatic with notes; `makeWriter` gives the others to `makeTable`
       return writer(explanationOf, "", "\n");
   }
 }
@@ -114,12 +115,13 @@ void Writer::prepareOrSetProblem(Outcome& outcome) const {
     failed.path = std::move(outcome.path);
     failed.problem = reason::failure(error);
     outcome = std::move(failed);
-    prepare(outcome);
+    prepare(outcome);  // the text of a file without a record
   }
 }
 
 std::unique_ptr<Writer> makeWriter(Form const& form, Output& output) {
-  bool const isTable =  // a table of one photo becomes a card if the form is automatic
+  // Automatic is a table too, which `makeTable` turns into a card if there is only one photo.
+  bool const isTable =
       form.kind == FormKind::Table || (form.kind == FormKind::Automatic && !form.hasNotes);
   auto writer = isTable ? makeTable(form, output) : makeText(form, output);
   if (form.sort == nullptr) {

@@ -41,7 +41,8 @@ Value captureDateOf(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The first date that is not blank. For programs, `captureDateOf` may be blank, as in the file.
+/// The first date that is not blank. `captureDateOf` may give a blank one: what programs get is as
+/// in the file.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -60,7 +61,8 @@ Value valueOfProblem(Outcome const& outcome) {
 
 /// The bytes in hexadecimal of a path that is not valid UTF-8; absent for other paths.
 Value pathBytesOf(Outcome const& outcome) {
-  if (isPlain(outcome.path) || pathAsUtf8(outcome.path) == outcome.path) {
+  bool const isUtf8 = isPrintableAscii(outcome.path) || pathAsUtf8(outcome.path) == outcome.path;
+  if (isUtf8) {
     return {};
   }
   static constexpr char kDigits[] = "0123456789abcdef";

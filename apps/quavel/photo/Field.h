@@ -44,7 +44,8 @@ std::string inWords(Field const& field, Outcome const& outcome);
 /// Whether there is no value, or only blanks and colons: cameras without a clock write such dates.
 bool isAbsent(Value const& value);
 
-/// The value to sort and select by: for captureDate, the first date for which `isAbsent` is false.
+/// The value to sort and select by. For captureDate, it is the first of the original, digitized and
+/// file dates for which `isAbsent` is false.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, "true" or "false", "Infinity" or "-Infinity",

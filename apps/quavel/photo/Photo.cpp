@@ -77,7 +77,8 @@ bool isDate(std::string const& text) {
   return isWhole && hasOneBlank && isReal;
 }
 
-/// Unless the outcome has a problem already, fills it by calling `read`, which may set one.
+/// Fills the outcome from what `read` returns, unless it has a problem already. `read` may also set
+/// `outcome.problem` and return null.
 template <class Read>
 void fill(Outcome& outcome, Detail detail, Read read) {
   if (outcome.problem) {

@@ -12,12 +12,12 @@
 namespace app::reason {
 
 // The codes of problems other than the library's refusals.
-inline constexpr char kFolder[] = "folder";
+inline constexpr char kFolder[] = "folder";  // where only a file may be, as in a list
 inline constexpr char kSpecialFile[] = "special-file";
 inline constexpr char kBadPath[] = "bad-path";
 inline constexpr char kUnreadableFolder[] = "unreadable-folder";
 inline constexpr char kUnreadableList[] = "unreadable-list";
-inline constexpr char kTooLong[] = "too-long";  // what standard input holds
+inline constexpr char kTooLong[] = "too-long";  // the photo on standard input
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 

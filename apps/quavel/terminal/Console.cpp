@@ -19,7 +19,7 @@ Console::Console() : isTerminal_(::isatty(STDERR_FILENO) == 1) {}
 void Console::printMessage(std::string const& message) {
   hideProgress();
   // A failure is ignored: there is no other place to report it.
-  interrupt::write(STDERR_FILENO, "quavel: " + message + "\n");
+  writeAll(STDERR_FILENO, "quavel: " + message + "\n");
 }
 
 void Console::printFileMessage(std::string const& path, std::string const& problem) {
@@ -30,13 +30,12 @@ void Console::showProgress(std::string const& line) {
   isProgressShown_ = true;
   interrupt::setProgressShown(true);  // first, so that an interrupt erases a half-written line too
   // Some terminals go to the next line once the last cell is written, so that cell stays free.
-  interrupt::write(STDERR_FILENO,
-                   interrupt::kEraseLine + keepStart(line, terminalWidth(STDERR_FILENO) - 1));
+  writeAll(STDERR_FILENO, kEraseLine + keepStart(line, terminalWidth(STDERR_FILENO) - 1));
 }
 
 void Console::hideProgress() {
   if (isProgressShown_) {
-    interrupt::write(STDERR_FILENO, interrupt::kEraseLine);
+    writeAll(STDERR_FILENO, kEraseLine);
     isProgressShown_ = false;
     interrupt::setProgressShown(false);
   }

@@ -5,7 +5,20 @@
 #include <atomic>
 #include <cerrno>
 
-namespace app::interrupt {
+namespace app {
+
+void writeAll(int fd, std::string_view bytes) {
+  while (!bytes.empty()) {
+    ssize_t const count = ::write(fd, bytes.data(), bytes.size());
+    if (count > 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(count));
+    } else if (count == 0 || errno != EINTR) {
+      return;
+    }
+  }
+}
+
+namespace interrupt {
 
 namespace {
 
@@ -31,17 +44,17 @@ std::atomic<int> pendingSignal{0};
 [[noreturn]] void leave() {
   ::alarm(1);  // if a write below takes longer, SIGALRM makes `handle` end the process
   if (isProgressShown) {
-    write(STDERR_FILENO, kEraseLine);
+    writeAll(STDERR_FILENO, kEraseLine);
   }
   if (char const* const tail = tailToWrite) {
-    write(STDOUT_FILENO, tail);
+    writeAll(STDOUT_FILENO, tail);
   }
   die();
 }
 
 void handle(int signal) {
   if (pendingSignal != 0) {
-    if (signal == SIGALRM) {  // the second that `alarm(1)` gives is over
+    if (signal == SIGALRM) {  // the time that `alarm(1)` gives is over
       die();
     }
     return;  // the process is ending already
@@ -55,20 +68,10 @@ void handle(int signal) {
 
 }  // namespace
 
-void write(int fd, std::string_view bytes) {
-  while (!bytes.empty()) {
-    ssize_t const count = ::write(fd, bytes.data(), bytes.size());
-    if (count > 0) {
-      bytes.remove_prefix(static_cast<std::size_t>(count));
-    } else if (count == 0 || errno != EINTR) {
-      return;
-    }
-  }
-}
-
 void install() {
   struct sigaction action = {};
-  action.sa_handler = handle;  // without SA_RESTART, so that a blocked write of Output returns
+  // Without SA_RESTART: a blocked write in Output.cpp returns, then calls `leaveIfSignalled`.
+  action.sa_handler = handle;
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);
   ::sigdelset(&action.sa_mask, SIGALRM);
@@ -107,4 +110,5 @@ void leaveIfSignalled() {
   }
 }
 
-}  // namespace app::interrupt
+}  // namespace interrupt
+}  // namespace app

@@ -5,8 +5,18 @@
 
 #include <string_view>
 
+namespace app {
+
+inline constexpr char kEraseLine[] = "\r\x1b[K";
+
+/// Writes all the bytes, or up to the first failure. Safe to call in a signal handler.
+void writeAll(int fd, std::string_view bytes);
+
+}  // namespace app
+
 /// On SIGINT, SIGTERM and SIGHUP, a signal handler completes the output (see `setTail`) and ends
-/// the process. No thread waits for signals: system calls are faster in a process of one thread.
+/// the process. A thread that waits for signals would slow down a run that needs no other thread:
+/// system calls are faster in a process of one thread.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
@@ -26,11 +36,6 @@ class BlockSignals {
   sigset_t previousMask_;
 };
 
-inline constexpr char kEraseLine[] = "\r\x1b[K";
-
-/// Writes the bytes, up to the first failure. Safe to call in a signal handler.
-void write(int fd, std::string_view bytes);
-
 /// Sets the text that ends the output on an interrupt, such as "]"; null: none. It is not copied.
 void setTail(char const* tail);
 
@@ -46,8 +51,8 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// Ends the process now if a signal has arrived during the current WriteScope. Only to be called
-/// before the first byte of a write or after its last, so that no line is cut.
+/// Ends the process now, not when the WriteScope does, if a signal has arrived. Only to be called
+/// while none of the scope's bytes are written, or all of them, so that no line is cut.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt

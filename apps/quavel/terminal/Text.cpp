@@ -85,9 +85,11 @@ bool isUtf8(std::string_view text) {
 
 }  // namespace
 
-bool isPlain(std::string_view text) {
+bool isPrintableAscii(std::string_view text) {
   // Eight bytes at a time. Bytes from 0x80 on have the top bit; those below ' ' get it when ' ' is
-  // subtracted, 0x7f when 1 is added. Printable bytes never do; only bytes that do borrow or carry.
+  // subtracted, 0x7f when 1 is added. A printable byte never gets it. A borrow or a carry can
+  // change the next byte, but it comes only from a byte that is not printable: the answer is the
+  // same.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = 0;
@@ -105,7 +107,7 @@ bool isPlain(std::string_view text) {
 }
 
 std::string textAsUtf8(std::string text) {
-  if (isPlain(text) || isUtf8(text)) {
+  if (isPrintableAscii(text) || isUtf8(text)) {
     return text;
   }
   std::string utf8;
@@ -118,7 +120,7 @@ std::string textAsUtf8(std::string text) {
 }
 
 std::string pathAsUtf8(std::string const& path) {
-  if (isPlain(path)) {
+  if (isPrintableAscii(path)) {
     return path;
   }
   std::string utf8;
@@ -130,7 +132,7 @@ std::string pathAsUtf8(std::string const& path) {
 }
 
 std::string escaped(std::string const& text) {
-  if (isPlain(text)) {
+  if (isPrintableAscii(text)) {
     return text;
   }
   std::string result;
@@ -149,7 +151,7 @@ std::string escapedPath(std::string path) {
 }
 
 std::size_t widthOf(std::string_view text) {
-  if (isPlain(text)) {
+  if (isPrintableAscii(text)) {
     return text.size();
   }
   std::size_t sum = 0;

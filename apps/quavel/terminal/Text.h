@@ -8,7 +8,7 @@
 namespace app {
 
 /// Whether all bytes are printable ASCII. Nearly all texts are, and need no conversion.
-bool isPlain(std::string_view text);
+bool isPrintableAscii(std::string_view text);
 /// A text from a file as UTF-8. If any of it is not valid UTF-8, all of it is taken for Latin-1.
 std::string textAsUtf8(std::string text);
 /// A file name as UTF-8: each byte that is not UTF-8, and each NUL, is replaced by U+FFFD.

@@ -1,17 +1,17 @@
-#include "tiff/Entry.h"
+#include "tiff/EntryView.h"
 
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 
 namespace quavel::detail {
 
-Entry::Entry(QVTiffImageFileDirectoryEntry const& entry) : exists_(true) {
+EntryView::EntryView(QVTiffImageFileDirectoryEntry const& entry) : exists_(true) {
   if (entry.values) {
     shared_ = entry.values->data();
     size_ = entry.values->size();
   }
 }
 
-bool Entry::convertToString(std::string& out) const {
+bool EntryView::convertToString(std::string& out) const {
   // Sized for the longest possible text and cut afterwards: appending would check the capacity for
   // every character.
   out.resize(size_);

@@ -1,5 +1,5 @@
-#ifndef QUAVEL_SRC_TIFF_ENTRY_H
-#define QUAVEL_SRC_TIFF_ENTRY_H
+#ifndef QUAVEL_SRC_TIFF_ENTRYVIEW_H
+#define QUAVEL_SRC_TIFF_ENTRYVIEW_H
 
 #include <cstddef>
 #include <memory>
@@ -15,13 +15,14 @@ namespace detail {
 
 using ValuePointer = QVTiffImageFileDirectoryEntryValue const*;
 
-/// A view of one entry's values, which must outlive it: a reader's own directory has an array of
-/// them, a public entry has shared pointers. As a bool: false when there is no entry.
-class Entry {
+/// A view of one entry's values, which must outlive it. They are an array (in an EntryTable) or
+/// shared pointers (in an entry that a host sees). As a bool: false when there is no entry.
+class EntryView {
  public:
-  Entry() = default;
-  explicit Entry(QVTiffImageFileDirectoryEntry const& entry);
-  Entry(ValuePointer values, std::size_t count) : exists_(true), values_(values), size_(count) {}
+  EntryView() = default;
+  explicit EntryView(QVTiffImageFileDirectoryEntry const& entry);
+  EntryView(ValuePointer values, std::size_t count)
+      : exists_(true), values_(values), size_(count) {}
 
   explicit operator bool() const { return exists_; }
 
@@ -29,7 +30,8 @@ class Entry {
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 
-  /// Stores the ASCII values up to a NUL. False: a value of another type ends them earlier.
+  /// Stores the text before the first NUL. False: a value before it is not of type ASCII (a host's
+  /// entry may mix types); the text ends there.
   bool convertToString(std::string& out) const;
 
  private:
@@ -42,4 +44,4 @@ class Entry {
 }  // namespace detail
 }  // namespace quavel
 
-#endif  // QUAVEL_SRC_TIFF_ENTRY_H
+#endif  // QUAVEL_SRC_TIFF_ENTRYVIEW_H
