@@ -231,6 +231,10 @@ TEST(Journal, ReadsAStreamOfTheHostsAndLeavesItToOthers) {
     return photo->deliver(destination, size) + (size > 8 ? 1000 : 0);
   };
   expectRefusal(photo, "read-error at 10: entry 1 of 6 of IFD0");
+  photo->onRead = [&](auto* destination, std::size_t size) {
+    return photo->deliver(destination, size) + 1;
+  };
+  expectRefusal(photo, "read-error at 0: the TIFF header");
 
   // Of a read that throws, nothing is left.
   photo->onRead = [](auto...) -> std::int64_t { throw std::runtime_error("gone"); };

@@ -45,7 +45,7 @@ void setSort(Form& form, std::string const& name) {
 
 void addConditions(std::vector<std::string> const& texts, Form& form) {
   for (auto const& text : texts) {
-    std::string name = text.substr(0, text.find_first_of(Condition::kSigns));
+    std::string name = text.substr(0, text.find_first_of(Condition::kSignCharacters));
     auto const comparison = std::string_view(text).substr(name.size());
     name.erase(name.find_last_not_of(' ') + 1);  // drops the blanks before the sign
     auto const* const field = requireField("--where", name);
@@ -69,11 +69,13 @@ void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>
   }
 }
 
-bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes) {
-  if (choice != no && choice != yes) {
-    throw CLI::ValidationError(option + ": '" + choice + "': give " + no + " or " + yes);
+bool choose(std::string const& option, std::string const& choice, char const* falseWord,
+            char const* trueWord) {
+  if (choice != falseWord && choice != trueWord) {
+    throw CLI::ValidationError(option + ": '" + choice + "': give " + falseWord + " or " +
+                               trueWord);
   }
-  return choice == yes;
+  return choice == trueWord;
 }
 
 /// The parser's own conversion would also accept other notations, such as 0x10.

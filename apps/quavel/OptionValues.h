@@ -16,8 +16,9 @@ void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
 /// Drops slashes at a glob's end. A glob with a slash elsewhere matches whole paths or their ends.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
-/// Whether the choice is the word `yes`, such as "show". The only other is `no`, such as "skip".
-bool choose(std::string const& option, std::string const& choice, char const* no, char const* yes);
+/// Whether the choice is `trueWord`, such as "show". The only other is `falseWord`, such as "skip".
+bool choose(std::string const& option, std::string const& choice, char const* falseWord,
+            char const* trueWord);
 unsigned jobsOf(std::string const& text);
 /// For the parser's `check`: returns what is wrong if the argument is empty, else an empty text.
 std::string refuseEmptyFileName(std::string const& argument);

@@ -110,11 +110,13 @@ void addChoices(CLI::App& command, Options& options) {
       [&form](std::string const& name) { values::setSort(form, name); });
   add("--absent", "skip|show", "Absent values: skip or show (CSV always shows)",
       [&form](std::string const& choice) {
-        form.showAbsent = values::choose("--absent", choice, /*no=*/"skip", /*yes=*/"show");
+        form.showAbsent =
+            values::choose("--absent", choice, /*falseWord=*/"skip", /*trueWord=*/"show");
       });
   add("--dates", "exif|iso", "Dates in machine forms: as stored, or ISO 8601",
       [&form](std::string const& choice) {
-        form.hasIsoDates = values::choose("--dates", choice, /*no=*/"exif", /*yes=*/"iso");
+        form.hasIsoDates =
+            values::choose("--dates", choice, /*falseWord=*/"exif", /*trueWord=*/"iso");
       });
   add("-j,--jobs", "N", "Files read at a time [one a processor; 32 if uncached]",
       [&options](std::string const& jobs) {

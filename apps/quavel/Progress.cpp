@@ -18,8 +18,8 @@ namespace {
 
 constexpr auto kQuietStart = std::chrono::milliseconds(500);   // without a progress line
 constexpr auto kInterval = std::chrono::milliseconds(100);     // between updates of the line
-constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // after which `countTotal` rests
-constexpr int kRestFactor = 4;  // a rest is this many times as long as the spell before it
+constexpr auto kCountingSpell = std::chrono::milliseconds(1);  // then `countTotal` pauses
+constexpr int kPauseFactor = 4;  // a pause is this many times as long as the spell before it
 
 double secondsSince(std::chrono::steady_clock::time_point start) {
   return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
@@ -81,7 +81,7 @@ void Progress::startCountingTotal() {
   if (!isRereadable(options_.inputs.list)) {
     return;
   }
-  interrupt::BlockSignals const block;  // the new thread gets no signals; this one does
+  interrupt::BlockSignals const block;  // inherited by the new thread, which so gets no signals
   try {
     totalCounter_ = std::thread([this] {
       try {
@@ -104,7 +104,7 @@ void Progress::countTotal() {
     auto const spell = Clock::now() - spellStart;
     if (spell >= kCountingSpell) {
       std::unique_lock<std::mutex> lock(mutex_);
-      if (endSignal_.wait_for(lock, kRestFactor * spell, [this] { return isEnding_; })) {
+      if (endSignal_.wait_for(lock, kPauseFactor * spell, [this] { return isEnding_; })) {
         return;
       }
       spellStart = Clock::now();

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <string>
 
@@ -39,7 +40,12 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Moves to the end of a box, but no further than `kOutOfReach` (which says why).
+/// Where `leaveBox` stops if a box ends beyond all offsets. It is 1 less than the end that
+/// `endOfBox` then gives. If the outer box has that end too, the walk through it goes on from here
+/// and fails, as there is no data; at its end, it would pass for complete.
+inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - 1;
+
+/// Moves to the end of a box, but no further than `kOutOfReach`.
 inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
 
 }  // namespace detail

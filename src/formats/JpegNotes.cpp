@@ -6,9 +6,10 @@ namespace quavel {
 using namespace detail;
 
 void detail::noteEnd(Journal* journal, std::int64_t position) {
-  if (!wantsAll(journal)) {
+  if (!wantsAllNotes(journal)) {
     return;
   }
+  // A segment's length may have led beyond the data. A size of 0 may be wrong.
   bool const isSizeKnown = journal->dataSize() > 0;
   std::int64_t const end = isSizeKnown ? std::min(position, journal->dataSize()) : position;
   if (journal->hasReadFailed) {
@@ -19,7 +20,10 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
   }
 }
 
-void detail::noteExifSize(DirectoryPointer const& exifIFD, int width, int height) {
+void detail::noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height) {
+  if (!wantsAllNotes(journalOf(exifIFD))) {
+    return;
+  }
   bool const hasWidth =
       findEntry(exifIFD, tag::ImageWidth) || findEntry(exifIFD, tag::PixelXDimension);
   bool const hasHeight =
@@ -35,10 +39,10 @@ void detail::noteExifSize(DirectoryPointer const& exifIFD, int width, int height
 
 /// Notes why fields may be absent. A note about a field that has a value is not shown.
 void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
-  if (!wantsAll(journal)) {
+  if (!wantsAllNotes(journal)) {
     return;
   }
-  // The note from `noteExifSize`, if any. The note below replaces it, and so repeats its text.
+  // The note from `noteWhyNoSize`, if any. The note below replaces it, and so repeats its text.
   QVNote const* const exifNote = journal->absenceOf("width");
   std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =

@@ -29,7 +29,7 @@ void noteEnd(Journal* journal, std::int64_t position);
 
 /// Notes the size that an Exif directory gives, if any: should the record have no size in the end,
 /// this is why. Else the note is not shown.
-void noteExifSize(DirectoryPointer const& exifIFD, int width, int height);
+void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail
 }  // namespace quavel

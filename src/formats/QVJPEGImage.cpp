@@ -33,8 +33,9 @@ constexpr int kMaxThumbnailSide = 500;
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
 // Bytes to skip after the markers whose length is not read: after DRI its length and interval,
-// after a marker without payload the next 2 bytes, whatever they are. The walk uses this array, not
-// the public map below, which may not be initialised yet when a host's static object reads a file.
+// after a marker without payload 2 bytes, though the next marker may be there. Hosts know these
+// numbers by the public map below; the walk does not use it, as it may not be initialised yet when
+// a host's static object reads a file.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -119,13 +120,14 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
   if (marker == kSOF0 && !readSOF0(stream, walk)) {
     return false;
   }
+  // The rest is for notes.
   if (marker == kSOS && walk.firstScan < 0) {
     walk.firstScan = walk.start;
-    bool const sawNeither = !walk.sawAPP1 && !walk.sawSOF0;
-    char const* const missingOne = walk.sawAPP1 ? "SOF0" : "APP1";  // after both, the walk is over
-    walk.missingAtScan = sawNeither ? "SOF0 or APP1" : missingOne;
+    bool const sawOne = walk.sawAPP1 || walk.sawSOF0;  // not both: the walk would have ended
+    char const* const other = walk.sawAPP1 ? "SOF0" : "APP1";
+    walk.missingAtScan = sawOne ? other : "SOF0 or APP1";
   }
-  // After an SOS segment, picture data may look like an SOF2 marker.
+  // After an SOS segment, picture data may look like an SOF2 marker, and a hint at it be wrong.
   if (marker == kSOF2 && walk.firstScan < 0) {
     walk.sof2 = walk.start;
   }
@@ -156,7 +158,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
     stream->baseOffset = outerBase;
     walk.sawExif = true;
   }
-  walk.sawAPP1 = true;
+  walk.sawAPP1 = true;  // Exif or not: after SOF0, the walk looks for no other
   return true;
 }
 
@@ -228,9 +230,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
-  if (wantsAll(journalOf(ifd))) {
-    noteExifSize(ifd, exifWidth, exifHeight);
-  }
+  noteWhyNoSize(ifd, exifWidth, exifHeight);
   if (exifWidth > kMaxThumbnailSide && exifHeight > kMaxThumbnailSide) {
     width = exifWidth;
     height = exifHeight;

@@ -42,7 +42,8 @@ bool opensWithExif(std::array<std::uint8_t, kBytesBeforeTiffHeader> const& bytes
 /// Notes what the embedded image begins with, if that may be why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
-  if (!wantsAll(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
+  // `baseOffset` is still that of the TIFF header in the image.
+  if (!wantsAllNotes(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
     return;
   }
   std::array<std::uint8_t, kBytesBeforeTiffHeader> opening = {};
@@ -75,7 +76,8 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
-  stream->baseOffset = imageOffset + kBytesBeforeTiffHeader;  // a 32-bit offset too: it may wrap
+  // The sum has 32 bits, as all offsets in the file: beyond 4 GB, it wraps around.
+  stream->baseOffset = imageOffset + kBytesBeforeTiffHeader;
   stream->setOffset(0);
   if (!readMainIFD(stream)) {
     noteOtherOpening(*stream, imageOffset);

@@ -131,7 +131,7 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag) {
   Journal* const journal = journalOf(directory);
-  if (wantsAll(journal) && fieldOf(tag) != nullptr) {
+  if (wantsAllNotes(journal) && fieldOf(tag) != nullptr) {
     noteAbsent(journal, {fieldOf(tag)}, QVReason::NotInFile, "no {} in {}", TagName{tag},
                placed(directory));
   }
@@ -154,7 +154,8 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  bool const isUndefined = row->typeCode == kUndefinedCode;  // as a text, it is empty: not refused
+  // Only a number is refused for this type: `storeText` takes such an entry as an empty text.
+  bool const isUndefined = row->typeCode == kUndefinedCode;
   return refuse(ours->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",
                 PlacedEntry{ours->table, tag, row->position}, TypedCount{row->count, row->typeCode},

@@ -11,8 +11,8 @@
 #include "tiff/ReaderDirectory.h"
 #include "tiff/WantedTags.h"
 
-// Steps that the readers of several formats share. A step that fails has told the journal why. The
-// stream is passed as to the public `read`; no step replaces it.
+// Steps that the readers of several formats share. A step that fails has told the journal why.
+// Steps take the stream by the same reference to a pointer as the public `read`; none replaces it.
 namespace quavel::detail {
 
 /// The first entry with the tag; false as a bool when there is none.
@@ -59,8 +59,8 @@ bool readSubIFD(std::shared_ptr<QVStream>& stream, DirectoryPointer const& mainI
 /// Notes that the record's field for this tag stays absent: the tag has no entry.
 void noteNoEntry(DirectoryPointer const& directory, unsigned short tag);
 
-/// The same when the entry's value is useless. `pattern` names the entry by its first "{}", and the
-/// entry's count and type by a second.
+/// The same when the entry's value is useless. In `pattern`, the first "{}" becomes the entry's
+/// name; a second, if any, its count and type.
 void noteNoValue(DirectoryPointer const& directory, unsigned short tag, char const* pattern);
 
 /// Refuses the tag's entry, which must exist: it does not hold what is `wanted`. Returns false.
@@ -74,7 +74,8 @@ inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileTyp
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory to be named in notes. A host's has no journal, so its table, null, is never asked.
+/// A directory, for notes to name. A host's has a null table; it has no journal either, so no note
+/// is composed.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   auto const* const ours = ReaderDirectory::of(*directory);
   return {ours == nullptr ? nullptr : &ours->table};

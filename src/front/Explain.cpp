@@ -141,7 +141,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
 }
 
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal) {
-  if (!journal.wantsAll()) {
+  if (!journal.wantsAllNotes()) {
     return;
   }
   for (auto const& row : kFields) {

@@ -38,7 +38,8 @@ void Journal::refuse(QVReason reason, std::int64_t position, char const* pattern
 
 void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* pattern,
                         Words words) {
-  if (position == 0 && !hasReadFailed && dataSize() == 0) {  // a size of 0 alone may be wrong
+  // A size of 0 alone may be wrong. But here, the first bytes could not be read either.
+  if (position == 0 && !hasReadFailed && dataSize() == 0) {
     refuse(QVReason::Empty, -1, "the file is empty", {});
     return;
   }
@@ -66,8 +67,10 @@ std::string Journal::cutText(std::int64_t end) {
   if (dataSize() <= 0) {  // not known, or a 0 that may be wrong
     return "the data ends before that";
   }
-  bool const isInFile = end <= dataSize();  // such as when the file has grown since the read
-  return isInFile ? "reading there fails" : composed("the file ends at {}", {Offset{dataSize()}});
+  // Within the size, the bytes should have been delivered: the file may have grown since the read.
+  bool const isWithinSize = end <= dataSize();
+  return isWithinSize ? "reading there fails"
+                      : composed("the file ends at {}", {Offset{dataSize()}});
 }
 
 void Journal::step(std::int64_t position, char const* pattern, Words words) {

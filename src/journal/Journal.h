@@ -18,7 +18,7 @@ class Journal {
   explicit Journal(QVJournal::Detail detail) : wantsAll_(detail == QVJournal::Detail::All) {}
 
   /// Whether all notes are wanted. If not, the `note...` functions below do nothing.
-  bool wantsAll() const { return wantsAll_; }
+  bool wantsAllNotes() const { return wantsAll_; }
 
   using Words = std::initializer_list<Word>;
 
@@ -38,8 +38,9 @@ class Journal {
 
   /// The size of the data in bytes. -1: not known. 0: may be wrong, as for files in /proc.
   std::int64_t dataSize();
-  /// Why the bytes asked for last were not all delivered; in words, for those that end at `end`.
+  /// Why the bytes asked for last were not all delivered.
   QVReason cutReason() const;
+  /// The same in words, for bytes that end at `end`.
   std::string cutText(std::int64_t end);
 
   std::vector<QVNote> notes;
@@ -61,7 +62,9 @@ class Journal {
 };
 
 /// Whether there is a journal that wants all notes.
-inline bool wantsAll(Journal const* journal) { return journal != nullptr && journal->wantsAll(); }
+inline bool wantsAllNotes(Journal const* journal) {
+  return journal != nullptr && journal->wantsAllNotes();
+}
 
 /// States why the read ends. Always false, so that a step can `return refuse(...)`.
 template <class... Values>
@@ -86,7 +89,7 @@ template <class... Values>
 
 template <class... Values>
 void noteStep(Journal* journal, std::int64_t position, char const* pattern, Values... words) {
-  if (wantsAll(journal)) {
+  if (wantsAllNotes(journal)) {
     journal->step(position, pattern, {words...});
   }
 }
@@ -94,7 +97,7 @@ void noteStep(Journal* journal, std::int64_t position, char const* pattern, Valu
 template <class... Values>
 void noteHint(Journal* journal, QVReason reason, std::int64_t position, char const* pattern,
               Values... words) {
-  if (wantsAll(journal)) {
+  if (wantsAllNotes(journal)) {
     journal->hint(reason, position, pattern, {words...});
   }
 }
@@ -102,7 +105,7 @@ void noteHint(Journal* journal, QVReason reason, std::int64_t position, char con
 template <class... Values>
 void noteAbsent(Journal* journal, std::initializer_list<char const*> fields, QVReason reason,
                 char const* pattern, Values... words) {
-  if (wantsAll(journal)) {
+  if (wantsAllNotes(journal)) {
     for (char const* const field : fields) {
       journal->absent(field, reason, pattern, {words...});
     }

@@ -20,7 +20,7 @@ inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
     std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB of memory
-    std::uint64_t{1} << 24U,  // segments, boxes: every 2 bytes of a JPEG's padding count as one
+    std::uint64_t{1} << 24U,  // segments, boxes: zeros in a JPEG read as one every 2 bytes
 };
 
 /// One read of a file: the work done so far, and the journal.
@@ -53,7 +53,8 @@ class ReadScope {
       stream_.reading_.current = &begun_;
     }
   }
-  /// For `readStream`: always begins a read. The record's class is one of the library's own.
+  /// For `readStream` (Formats.h): always begins a read. The record's class is one of the library's
+  /// own.
   ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
     begun_.journal = journal;
     begun_.isLibraryRecord = true;
@@ -81,7 +82,8 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal whether `readBuffer` failed: then `delivered` < 0, `error` is `errno` or 0.
+/// Tells the journal how `readBuffer` went. It failed if `delivered` < 0; `error` is then its
+/// `errno`, or 0 if that is not known.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.

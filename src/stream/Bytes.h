@@ -78,15 +78,11 @@ inline void copyBytes(std::uint8_t* destination, std::uint8_t const* source, std
 }
 
 inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
-/// The last offset at which a read may start. Where `long` has 32 bits, 1 MB is left above it:
-/// enough for the largest directory, of 65535 entries, to end at a valid offset.
+/// The last offset at which a read may start. Where `long` has 32 bits, 1 MB is left above it, so
+/// that the end of the largest directory (65535 entries) still fits a `long`. No file reaches the
+/// largest `long` of 64 bits.
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
-
-/// Where `leaveBox` stops when a box ends beyond all offsets; no read succeeds there. Where `long`
-/// has 32 bits, it is 1 less than the largest end that `endOfBox` gives: the walk through an outer
-/// box with that end looks for another box here, and fails instead of passing for complete.
-inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - (kIsLong32Bit ? 1 : 0);
 
 /// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
 inline bool seek(QVStream& stream, std::int64_t offset) {
@@ -103,10 +99,10 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered == static_cast<std::int64_t>(count)) {
     return true;
   }
-  if (delivered < 0) {  // fewer bytes: the data ends, or `QVReadAheadStream` noted a failure
-    noteReadResult(stream, delivered, /*error=*/0);
+  if (delivered < 0 || delivered > static_cast<std::int64_t>(count)) {
+    noteReadResult(stream, -1, /*error=*/0);  // too many bytes are a failure too
   }
-  return false;
+  return false;  // fewer bytes: the data ends, or `QVReadAheadStream` has noted a failure
 }
 
 /// Calls `readBuffer` until `count` bytes are received or no more come. Returns how many came.
@@ -119,7 +115,7 @@ inline std::size_t readUpTo(QVStream& stream, std::uint8_t* destination, std::si
       break;
     }
     if (delivered < 0 || static_cast<std::uint64_t>(delivered) > wanted) {
-      noteReadResult(stream, -1, /*error=*/0);  // too many bytes are a failure too
+      noteReadResult(stream, /*delivered=*/-1, /*error=*/0);
       break;
     }
     received += static_cast<std::size_t>(delivered);

@@ -13,6 +13,15 @@
 
 namespace app {
 
+namespace {
+
+bool isLink(std::string const& path) {
+  struct stat status = {};
+  return ::lstat(path.c_str(), &status) == 0 && S_ISLNK(status.st_mode);
+}
+
+}  // namespace
+
 FolderWalk::FolderWalk(std::string const& folder, Filter const& filter, Report report)
     : filter_(filter), report_(std::move(report)) {
   enter(folder, /*isFoundByLink=*/false);
@@ -55,32 +64,35 @@ bool FolderWalk::visit(unsigned char type, std::string path, Input& input) {
       return false;
     case DT_LNK:
     case DT_UNKNOWN:  // not every file system gives the type here
-      return visitLinkOrUnknown(std::move(path), input);
+      return visitLinkOrUnknown(type, std::move(path), input);
     default:
       report_(path, "is not a regular file; skipped");
       return false;
   }
 }
 
-bool FolderWalk::visitLinkOrUnknown(std::string path, Input& input) {
+bool FolderWalk::visitLinkOrUnknown(unsigned char type, std::string path, Input& input) {
   struct stat status = {};
   if (::stat(path.c_str(), &status) == -1) {
     if (errno == ELOOP) {
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    input = {std::move(path), /*isRegular=*/false, {}};  // such as a dangling link: reading tells
-    return isPhotoExtension(extensionOf(input.path));
+    // Such as a dangling link: the attempt to read it will give the reason.
+    bool const isPhoto = isPhotoExtension(extensionOf(path));
+    input = {std::move(path), /*isRegular=*/false, {}};
+    return isPhoto;
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);
-    if (!isHidden(name, /*isFolder=*/true)) {  // until now, the rule for files was applied
-      enter(path, /*isFoundByLink=*/true);     // an unknown type counts as a link
+    if (!isHidden(name, /*isFolder=*/true)) {  // `readEntries` did not know that it is a folder
+      enter(path, type == DT_LNK || isLink(path));
     }
     return false;
   }
-  unsigned char const type = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;  // DT_CHR: `visit` skips it
-  return isPhotoExtension(extensionOf(path)) && visit(type, std::move(path), input);
+  // Here, DT_CHR stands for all special files, which `visit` skips.
+  unsigned char const knownType = S_ISREG(status.st_mode) ? DT_REG : DT_CHR;
+  return isPhotoExtension(extensionOf(path)) && visit(knownType, std::move(path), input);
 }
 
 void FolderWalk::enter(std::string const& path, bool isFoundByLink) {

@@ -63,7 +63,7 @@ class FolderWalk {
   void readEntries(DIR* folder, Level& level);
   void setUnreadable(std::string const& path, int error);
   bool visit(unsigned char type, std::string path, Input& input);
-  bool visitLinkOrUnknown(std::string path, Input& input);
+  bool visitLinkOrUnknown(unsigned char type, std::string path, Input& input);
 
   Filter const& filter_;
   Report report_;

@@ -28,11 +28,10 @@ bool Source::nextOfPaths(Input& input) {
       }
       walk_.reset();
       if (isWalkEmpty_) {
-        std::string const refusal = whyUnknown("");  // "... these name a format: tiff tif ..."
         report_(inputs_.paths[nextPath_ - 1],
                 "no photos found in it; hidden and excluded names are "
-                "skipped, and others must end in" +
-                    refusal.substr(refusal.rfind(':') + 1));
+                "skipped, and others must end in " +
+                    photoExtensions());
       }
       continue;
     }
@@ -44,8 +43,8 @@ bool Source::nextOfPaths(Input& input) {
       isWalkEmpty_ = true;
       continue;
     }
-    bool const isRegular = exists && S_ISREG(status.st_mode) && isPhotoExtension(extensionOf(path));
-    input = {path, isRegular, /*problem=*/{}};  // if it names no photo, reading says why
+    // If the path's extension names no format, the library refuses it.
+    input = {path, /*isRegular=*/exists && S_ISREG(status.st_mode), /*problem=*/{}};
     return true;
   }
   return false;

@@ -24,7 +24,7 @@ class Source {
   /// Throws std::system_error when the list cannot be opened. Keeps a reference to the inputs.
   Source(Inputs const& inputs, Report report);
 
-  /// False: `next` would wait for the process that writes the list.
+  /// Whether `next` can begin without waiting for the process that writes the list.
   bool isReady();
   /// The next file, or a folder or list that cannot be read, with its problem. False: the end.
   bool next(Input& input);

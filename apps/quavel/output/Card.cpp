@@ -31,8 +31,9 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
     return {};
   }
   static Fields const usualFields = cardFields();
-  bool const fieldsAreChosen = !form.fields.empty();  // then a path is shown only as one of them
+  bool const fieldsAreChosen = !form.fields.empty();
   bool const showAbsent = form.showAbsent.value_or(fieldsAreChosen);
+  // Who chooses fields gets the path only by choosing it.
   std::string card = fieldsAreChosen ? "" : escapedPath(outcome.path) + "\n";
   for (auto const* field : fieldsAreChosen ? form.fields : usualFields) {
     std::string const text = inWords(*field, outcome);

@@ -73,8 +73,9 @@ Table::Table(Form const& form, Output& output)
       output_(output),
       columns_(rows::columnsOf(form.fields)),
       isTerminal_(output.isTerminal()) {
+  // The path's column is the only one that keeps its end when it is cut.
   while (pathColumn_ < columns_.size() && !columns_[pathColumn_].keepsEnd) {
-    ++pathColumn_;  // when cut, only the path keeps its end
+    ++pathColumn_;
   }
 }
 
@@ -163,7 +164,7 @@ void Table::layOutForTerminal() {
   width_ = width;
   folder_.clear();
   hasDaysOnly_ = false;
-  natural_ = naturalWidths();  // with `folder_` and `hasDaysOnly_` as they are now
+  natural_ = naturalWidths();  // with whole paths and dates
   if (lineWidth(natural_) > width && pathColumn_ < columns_.size()) {
     folder_ = commonFolder(page_, pathColumn_);
     natural_ = naturalWidths();  // without the folder

@@ -14,6 +14,7 @@ namespace app {
 
 namespace {
 
+/// Both values are of the type that the field's words function takes.
 template <class Compare>
 bool meets(Value const& value, Value const& wanted) {
   return Compare()(value, wanted);
@@ -34,11 +35,12 @@ constexpr Relation kRelations[] = {
     {"!=", meets<std::not_equal_to<>>},  {"==", meets<std::equal_to<>>},
     {"=", meets<std::equal_to<>>},       {">", meets<std::greater<>>},
     {"<", meets<std::less<>>},           {"~", containsText}};
-// For each alternative of Words, in their order: what a value must be.
+// What a value must be, by the index of `Field::words`: bool, int32, int64, float, text.
 constexpr char const* kTypes[] = {"true or false", "a whole number", "a whole number", "a number",
                                   "a text"};
 
-/// Parses the whole text as the type that the field's Words function takes; no value if it fails.
+/// Visits the function in a field's `words` only to learn the type of its parameter. Parses the
+/// whole text as that type; no value if it fails.
 struct ParseFor {
   std::string_view text;
 
@@ -58,9 +60,10 @@ struct ParseFor {
   }
 };
 
-/// Dates compare alike in every notation: as files have them, as people see them and in ISO 8601.
-Value comparable(Field const& field, Value value) {
+/// Gives dates one notation: that of files, of the words for people and of ISO 8601 compare alike.
+Value normalized(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
+  // A field is a date if `words::date` puts it into words.
   auto const* const textToWords = std::get_if<std::string (*)(std::string const&)>(&field.words);
   bool const isDateField = textToWords != nullptr && *textToWords == words::date;
   if (isDateField && text != nullptr) {
@@ -84,7 +87,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
       });
   bool const isKnown = relation != std::end(kRelations);
   std::string_view text = comparison.substr(isKnown ? relation->sign.size() : 0);
-  if (!isKnown || text.find_first_of(kSigns) == 0) {  // a second sign, as in "=>5"
+  if (!isKnown || text.find_first_of(kSignCharacters) == 0) {  // a second sign, as in "=>5"
     refuse(whole, "is not a comparison: give >=, <=, !=, ==, >, < or ~ and a value");
   }
   text.remove_prefix(std::min(text.find_first_not_of(' '), text.size()));  // leading blanks
@@ -92,7 +95,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
     refuse(whole, "lacks the value to compare with");
   }
   isMet_ = relation->isMet;
-  wanted_ = comparable(field, std::visit(ParseFor{text}, field.words));
+  wanted_ = normalized(field, std::visit(ParseFor{text}, field.words));
   if (std::holds_alternative<std::monostate>(wanted_)) {
     refuse(text, std::string("is not ") + kTypes[field.words.index()]);
   }
@@ -103,7 +106,7 @@ Condition::Condition(Field const& field, std::string_view comparison) : field_(f
 
 bool Condition::holds(Outcome const& outcome) const {
   Value const value = comparedValue(field_, outcome);
-  return !isAbsent(value) && isMet_(comparable(field_, value), wanted_);
+  return !isAbsent(value) && isMet_(normalized(field_, value), wanted_);
 }
 
 }  // namespace app

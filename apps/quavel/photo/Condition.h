@@ -12,7 +12,7 @@ namespace app {
 class Condition {
  public:
   /// The characters that may begin a comparison, and so end the field's name before it.
-  static constexpr char kSigns[] = "<>=!~";
+  static constexpr char kSignCharacters[] = "<>=!~";
 
   /// `comparison` is a relation and a value, such as ">=3200". If it is malformed or does not suit
   /// the field, throws std::invalid_argument with a message that quotes the wrong part.

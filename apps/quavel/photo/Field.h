@@ -15,16 +15,16 @@ namespace app {
 using Value = std::variant<std::monostate, bool, std::int32_t, std::int64_t, float, std::string>;
 
 /// A function that puts a value of its parameter's type into words.
-using Words = std::variant<std::string (*)(bool), std::string (*)(std::int32_t),
-                           std::string (*)(std::int64_t), std::string (*)(float),
-                           std::string (*)(std::string const&)>;
+using WordsFunction = std::variant<std::string (*)(bool), std::string (*)(std::int32_t),
+                                   std::string (*)(std::int64_t), std::string (*)(float),
+                                   std::string (*)(std::string const&)>;
 
 /// One thing that the command can show about a file.
 struct Field {
   std::string_view name;           ///< As --fields and the machine forms call it.
   char const* label;               ///< As the card and the table call it.
   Value (*value)(Outcome const&);  ///< Gets the exact value.
-  Words words;                     ///< The function that puts that value into words.
+  WordsFunction words;             ///< The function that puts that value into words.
 };
 
 using Fields = std::vector<Field const*>;

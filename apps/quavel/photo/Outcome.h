@@ -21,11 +21,11 @@ struct Problem {
   int systemError = 0;         ///< The `errno` that caused it; 0: none.
 };
 
-/// One file to read.
+/// One file to read, or a folder or a list that cannot be read.
 struct Input {
   std::string path;
   bool isRegular = false;  ///< Known to be a regular file; false: still to be checked.
-  Problem problem;         ///< Set: why the file must not be read.
+  Problem problem;         ///< If set, nothing is read and this is reported.
 };
 
 /// The result of reading one file.
@@ -35,7 +35,7 @@ struct Outcome {
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< Such as "JPEG"; empty: the extension names none.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
-  std::uint64_t furtherSteps = 0;              ///< How many notes of kind `Step` were left out.
+  std::uint64_t furtherSteps = 0;              ///< Steps beyond those in `notes`, which has few.
   bool isShown = true;                         ///< It meets the conditions of --where.
   std::string text;                            ///< Its output in the chosen form, once prepared.
   std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.

@@ -130,6 +130,12 @@ std::string whyUnknown(std::string const& extension) {
   return journal.refusal()->text;
 }
 
+std::string photoExtensions() {
+  // The library lists them only where it refuses another: "... these name a format: tiff tif ...".
+  std::string const refusal = whyUnknown("");
+  return refusal.substr(refusal.rfind(": ") + 2);
+}
+
 Outcome readPhoto(Input input, Detail detail) {
   Outcome outcome;
   outcome.path = std::move(input.path);

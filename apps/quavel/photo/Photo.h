@@ -18,6 +18,8 @@ std::string extensionOf(std::string_view path);
 bool isPhotoExtension(std::string const& extension);
 /// Why an extension names no format; empty when it names one.
 std::string whyUnknown(std::string const& extension);
+/// All extensions that name a format: "tiff tif dng ...".
+std::string photoExtensions();
 
 /// Reads one file. Opens nothing but a regular file, so it never waits for the writer of a FIFO.
 /// The outcome has notes only with `Detail::All`.
