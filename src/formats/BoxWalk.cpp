@@ -47,10 +47,9 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 }
 
 long endOfBox(long start, QVCR3BoxHeader const& header) {
-  constexpr long kMax = std::numeric_limits<long>::max();
+  constexpr std::int64_t kMax = std::numeric_limits<long>::max();
   std::int64_t const end = wrappingSum(start, header.boxSize);
-  bool const isBeyond = end < start || end > std::int64_t{kMax};  // below `start`: wrapped around
-  return isBeyond ? kMax : static_cast<long>(end);
+  return static_cast<long>(end < start ? kMax : std::min(end, kMax));  // below: it wrapped around
 }
 
 void append(std::string& out, PlacedBox box) {
@@ -63,7 +62,7 @@ void append(std::string& out, PlacedBox box) {
 }
 
 void append(std::string& out, BoxContext context) {
-  out += context.text;
+  out += context.noteSuffix;
   if (context.parent.type != 0) {
     append(out, context.parent);
   }

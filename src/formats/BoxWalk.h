@@ -27,8 +27,8 @@ void append(std::string& out, PlacedBox box);
 
 /// A walk over boxes. Notes add to a box's name where it is: " in the moov box at 0x18 (24)".
 struct BoxContext {
-  char const* text = "";         ///< Such as " in the ", with a parent.
-  PlacedBox parent = {};         ///< Type 0: none, and the text says it all.
+  char const* noteSuffix = "";   ///< Such as " in the ", with a parent.
+  PlacedBox parent = {};         ///< Follows the suffix, unless its type is 0.
   std::int64_t previousEnd = 0;  ///< Where the previous box ends by the size that it declares.
 };
 void append(std::string& out, BoxContext context);

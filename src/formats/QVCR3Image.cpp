@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   ReadScope const scope(*stream);
   isRaw = true;
 
-  BoxContext context = {/*text=*/" before a moov box was met"};
+  BoxContext context = {/*noteSuffix=*/" before a moov box was met"};
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
@@ -60,7 +60,8 @@ bool QVCR3Image::storeInfoFromMoov(QVStream const& stream, QVCR3MoovBox const& m
   if (uuidBox.cmt2Box) {
     storeInfoFromCMT2(*uuidBox.cmt2Box);
   } else {
-    // The two APEX fields take the reasons of the values from which they are computed.
+    // Not apexFNumber and apexExposureTime: they take the reasons of the values from which they are
+    // computed.
     noteAbsent(
         journal,
         {"lensModel", "iso", "apertureValue", "shutterSpeedValue", "focalLength", "whiteBalance",

@@ -28,7 +28,8 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
-  BoxContext context = {/*text=*/" in the ", /*parent=*/{box::Moov, stream->baseOffset + start}};
+  BoxContext context = {/*noteSuffix=*/" in the ",
+                        /*parent=*/{box::Moov, stream->baseOffset + start}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (!stepOverBox(stream, context, child)) {

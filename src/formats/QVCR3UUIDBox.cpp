@@ -50,7 +50,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  BoxContext context = {/*text=*/" in the metadata ", /*parent=*/{box::Uuid, position_}};
+  BoxContext context = {/*noteSuffix=*/" in the metadata ", /*parent=*/{box::Uuid, position_}};
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
     if (!stepOverBox(stream, context, child)) {

@@ -12,14 +12,6 @@ constexpr std::int32_t kAbsentNumber = -1;  // in the record; a -1 in the file c
 
 }  // namespace
 
-EntryView findEntry(DirectoryPointer const& directory, unsigned short tag) {
-  if (auto const* const ours = ReaderDirectory::of(*directory)) {
-    return ours->table.entry(tag);
-  }
-  auto const entry = directory->entryForTag(tag);
-  return entry ? EntryView(*entry) : EntryView();
-}
-
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value) {
   auto const entry = findEntry(directory, tag);
   value = entry.size() == 1 ? entry[0] : nullptr;

@@ -15,9 +15,6 @@
 // Steps take the stream by the same reference to a pointer as the public `read`; none replaces it.
 namespace quavel::detail {
 
-/// The first entry with the tag; false as a bool when there is none.
-EntryView findEntry(DirectoryPointer const& directory, unsigned short tag);
-
 /// Finds the only value of a tag's entry. No entry: true, null `value`. Not exactly one: false.
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value);
 

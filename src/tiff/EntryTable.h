@@ -1,7 +1,6 @@
 #ifndef QUAVEL_SRC_TIFF_ENTRYTABLE_H
 #define QUAVEL_SRC_TIFF_ENTRYTABLE_H
 
-#include <algorithm>
 #include <cstdint>
 #include <map>
 #include <memory>
@@ -50,9 +49,12 @@ class EntryTable {
 
   /// The first row with the tag, or null.
   Row const* find(unsigned short tag) const {
-    auto const found =
-        std::find_if(rows_.begin(), rows_.end(), [tag](Row const& row) { return row.tag == tag; });
-    return found == rows_.end() ? nullptr : &*found;
+    for (Row const& row : rows_) {  // `std::find_if` takes more instructions: tables are short
+      if (row.tag == tag) {
+        return &row;
+      }
+    }
+    return nullptr;
   }
   /// The first entry with the tag; false as a bool when there is none.
   EntryView entry(unsigned short tag) const {

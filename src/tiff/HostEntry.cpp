@@ -1,10 +1,9 @@
-// What hosts get of a directory. Declared in EntryTable.h and ReaderDirectory.h.
+// What hosts get of a directory's entries. Declared in EntryTable.h.
 #include <cstring>
 #include <utility>
 
 #include "quavel/QVTiffImageFileDirectoryEntry.h"
 #include "tiff/EntryTable.h"
-#include "tiff/ReaderDirectory.h"
 
 namespace quavel::detail {
 
@@ -55,13 +54,6 @@ std::shared_ptr<EntryTable::Map> EntryTable::takeEntries() {
     map->emplace_hint(map->end(), row.tag, std::move(entry));
   }
   return map;
-}
-
-DirectoryPointer ReaderDirectory::forHost() {
-  auto directory = std::make_shared<QVTiffImageFileDirectory>();
-  directory->nextIFDOffset = nextIFDOffset;
-  directory->entries = table.takeEntries();
-  return directory;
 }
 
 }  // namespace quavel::detail

@@ -15,7 +15,7 @@ bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
   if (!table.read(*stream, wanted)) {
     return false;
   }
-  entries = table.takeEntries();  // hosts keep them even if the offset cannot be read
+  entries = table.takeEntries();  // kept even if the next directory's offset cannot be read
 
   std::uint32_t newNextIFDOffset = 0;
   if (!stream->readLong(&newNextIFDOffset)) {

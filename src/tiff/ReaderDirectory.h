@@ -38,6 +38,9 @@ class ReaderDirectory final : public QVTiffImageFileDirectory {
 bool readTiffHeader(QVStream& stream, unsigned short expectedMagic, QVTiffHeader& header,
                     char const* structure = nullptr);
 
+/// The first entry with the tag; false as a bool when there is none.
+EntryView findEntry(DirectoryPointer const& directory, unsigned short tag);
+
 /// The journal of the read that filled the directory; null for a directory made by a host.
 inline Journal* journalOf(DirectoryPointer const& directory) {
   auto const* const ours = ReaderDirectory::of(*directory);

@@ -1,8 +1,6 @@
 #ifndef QUAVEL_SRC_TIFF_TAGS_H
 #define QUAVEL_SRC_TIFF_TAGS_H
 
-#include <array>
-
 // The tags that are read. Those of TIFF and Exif have their standard names.
 namespace quavel::tag {
 
@@ -47,33 +45,33 @@ inline constexpr Tag RafImageWidth = {0xf001, "(the raw image's width)", "width"
 inline constexpr Tag RafImageLength = {0xf002, "(the raw image's height)", "height"};
 
 /// For notes, which find a tag's name and field by its number.
-inline constexpr std::array kAll = {NewSubfileType,
-                                    ImageWidth,
-                                    ImageLength,
-                                    Model,
-                                    Orientation,
-                                    DateTime,
-                                    SubIFDs,
-                                    ExposureTime,
-                                    FNumber,
-                                    ExifIFDPointer,
-                                    ISOSpeedRatings,
-                                    DateTimeOriginal,
-                                    DateTimeDigitized,
-                                    OffsetTimeOriginal,
-                                    ShutterSpeedValue,
-                                    ApertureValue,
-                                    ExposureBiasValue,
-                                    MeteringMode,
-                                    FocalLength,
-                                    PixelXDimension,
-                                    PixelYDimension,
-                                    WhiteBalance,
-                                    FocalLengthIn35mmFilm,
-                                    LensModel,
-                                    RafDirectoryPointer,
-                                    RafImageWidth,
-                                    RafImageLength};
+inline constexpr Tag kAll[] = {NewSubfileType,
+                               ImageWidth,
+                               ImageLength,
+                               Model,
+                               Orientation,
+                               DateTime,
+                               SubIFDs,
+                               ExposureTime,
+                               FNumber,
+                               ExifIFDPointer,
+                               ISOSpeedRatings,
+                               DateTimeOriginal,
+                               DateTimeDigitized,
+                               OffsetTimeOriginal,
+                               ShutterSpeedValue,
+                               ApertureValue,
+                               ExposureBiasValue,
+                               MeteringMode,
+                               FocalLength,
+                               PixelXDimension,
+                               PixelYDimension,
+                               WhiteBalance,
+                               FocalLengthIn35mmFilm,
+                               LensModel,
+                               RafDirectoryPointer,
+                               RafImageWidth,
+                               RafImageLength};
 
 }  // namespace quavel::tag
 

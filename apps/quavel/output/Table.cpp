@@ -61,7 +61,7 @@ class Table : public Writer {
   std::vector<rows::Row> page_;
   std::chrono::steady_clock::time_point pageStart_ = std::chrono::steady_clock::now();
   // The layout of the rows below the last header:
-  Widths natural_;            // the columns' widths if nothing is cut; empty before the first page
+  Widths natural_;            // the uncut widths, 0 for an empty column; none before the first page
   Widths widths_;             // the columns' widths as shown
   std::size_t width_ = 0;     // the terminal's
   std::string folder_;        // stands above the header and is removed from the paths

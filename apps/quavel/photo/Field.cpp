@@ -41,8 +41,8 @@ Value captureDateOf(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The first date that is not blank. `captureDateOf` may give a blank one: what programs get is as
-/// in the file.
+/// The first date that is not blank, to sort and select by. `captureDateOf` does not skip a blank
+/// one: programs get the dates as they are in the file.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {
@@ -61,7 +61,7 @@ Value valueOfProblem(Outcome const& outcome) {
 
 /// The bytes in hexadecimal of a path that is not valid UTF-8; absent for other paths.
 Value pathBytesOf(Outcome const& outcome) {
-  bool const isUtf8 = isPrintableAscii(outcome.path) || pathAsUtf8(outcome.path) == outcome.path;
+  bool const isUtf8 = pathAsUtf8(outcome.path) == outcome.path;
   if (isUtf8) {
     return {};
   }
