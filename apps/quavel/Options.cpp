@@ -120,7 +120,7 @@ void addChoices(CLI::App& command, Options& options) {
       });
   add("-j,--jobs", "N", "Files read at a time [one a processor; 32 if uncached]",
       [&options](std::string const& jobs) {
-        options.jobs = options.busyJobs = values::jobsOf(jobs);
+        options.diskJobs = options.processorJobs = values::jobsOf(jobs);
       });
   command.add_flag("-q,--quiet", options.isQuiet, "No progress and summary; see quavel(1)");
 }
@@ -183,8 +183,8 @@ ParsedOptions parseOptions(int argc, char const* const* argv) {
   command.footer(kFooter);
   command.formatter(std::make_shared<ShortFormatter>());
   command.get_formatter()->column_width(26);
-  options.busyJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
-  options.jobs = std::max(options.busyJobs, kUncachedJobs);
+  options.processorJobs = std::clamp(std::thread::hardware_concurrency(), 1U, values::kMaxJobs);
+  options.diskJobs = std::max(options.processorJobs, kDiskJobs);
   addInputs(command, options);
   addForms(command, options.form);
   addChoices(command, options);

@@ -18,8 +18,8 @@ struct Options {
   bool fromStdin = false;  ///< One image is read from standard input.
   std::string extension;   ///< Of that image, in lower case.
   Form form;
-  unsigned jobs = 1;      ///< Files read at a time when reading waits for the disk.
-  unsigned busyJobs = 1;  ///< The same while cached files keep the processors busy.
+  unsigned diskJobs = 1;       ///< Files read at a time when reading waits for the disk.
+  unsigned processorJobs = 1;  ///< The same while cached files keep the processors busy.
   bool isQuiet = false;
 };
 

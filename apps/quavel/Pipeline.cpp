@@ -35,8 +35,11 @@ std::size_t nextBatchSize(Batch const& done, std::size_t currentSize) {
                     : std::min(currentSize * 2, kMaxBatch);
 }
 
-Pipeline::Pipeline(unsigned jobs, unsigned busyJobs, Work work)
-    : jobs_(jobs), busyJobs_(busyJobs), waitsForDisk_(!kCanCountWaits), work_(std::move(work)) {}
+Pipeline::Pipeline(unsigned diskJobs, unsigned processorJobs, Work work)
+    : diskJobs_(diskJobs),
+      processorJobs_(processorJobs),
+      waitsForDisk_(!kCanCountWaits),
+      work_(std::move(work)) {}
 
 Pipeline::~Pipeline() {
   {
@@ -54,7 +57,7 @@ void Pipeline::submit(std::unique_ptr<Batch> batch) {
   order_.push_back(std::move(batch));
   std::size_t const usefulThreads = std::min(maxThreads(), order_.size());
   // The first batch may be all there is, often a single file: no thread is worth starting for it.
-  if (jobs_ > 1 && hasSubmitted_ && threads_.size() < usefulThreads) {
+  if (diskJobs_ > 1 && hasSubmitted_ && threads_.size() < usefulThreads) {
     startThread();
   }
   hasSubmitted_ = true;
@@ -91,9 +94,11 @@ bool Pipeline::isOldestDone(std::chrono::milliseconds patience) {
   return patience.count() > 0 ? batchDone_.wait_for(lock, patience, isDone) : isDone();
 }
 
-bool Pipeline::isFull() const { return order_.size() >= (jobs_ == 1 ? 1 : 3 * maxThreads()); }
+bool Pipeline::isFull() const { return order_.size() >= (diskJobs_ == 1 ? 1 : 3 * maxThreads()); }
 
-std::size_t Pipeline::maxThreads() const { return waitsForDisk_ ? jobs_.load() : busyJobs_; }
+std::size_t Pipeline::maxThreads() const {
+  return waitsForDisk_ ? diskJobs_.load() : processorJobs_;
+}
 
 void Pipeline::startThread() {
   interrupt::BlockSignals const block;  // the new thread gets no signals
@@ -101,21 +106,21 @@ void Pipeline::startThread() {
     threads_.emplace_back([this] { runThread(); });
   } catch (std::system_error const&) {
     // No more threads can be started: the running ones do the work, or `submit` if there is none.
-    jobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
-    busyJobs_ = std::min(busyJobs_, jobs_.load());
+    diskJobs_ = std::max(static_cast<unsigned>(threads_.size()), 1U);
+    processorJobs_ = std::min(processorJobs_, diskJobs_.load());
   }
 }
 
 void Pipeline::workOn(Batch& batch) {
-  bool const isMeasured = kCanCountWaits && jobs_ > 1;
+  bool const isMeasured = kCanCountWaits && diskJobs_ > 1;
   long const waitsBefore = isMeasured ? countWaits() : 0;
   try {
     work_(batch);
   } catch (...) {
     batch.failure = std::current_exception();
   }
-  // Reading a cached file causes no wait, any other at least one: more waits than half the files
-  // are taken to mean that most are not cached.
+  // A cached file is read without a wait, another with at least one. If there were more waits than
+  // half as many as files, most files are assumed not to be cached.
   if (isMeasured) {
     waitsForDisk_ = 2 * (countWaits() - waitsBefore) > static_cast<long>(batch.inputs.size());
   }

@@ -29,21 +29,21 @@ struct Batch {
 
 /// In seconds: a longer batch delays results, a far shorter one is not worth giving to a thread.
 constexpr double kLongBatch = 0.002;
-/// The next batch's size in files, which has been `currentSize`: half of it if the batch `done`
-/// took too long or gave too much text, else twice, up to a maximum.
+/// The size of the next batch in files: half of `currentSize` if the batch `done` took too long or
+/// gave too much text, else twice as many, up to a maximum.
 std::size_t nextBatchSize(Batch const& done, std::size_t currentSize);
 
 /// For files that are not cached: 32 jobs are several times as fast as 2, and more gain little.
-constexpr unsigned kUncachedJobs = 32;
+constexpr unsigned kDiskJobs = 32;
 
 /// Works on batches on several threads and returns them in the order of submission. Starts up to
-/// `jobs` threads while the work waits for the disk, so that the disk is never idle, and up to
-/// `busyJobs` while the work keeps the processors busy. The threads run until the destructor.
+/// `diskJobs` threads while the work waits for the disk, so that the disk is never idle, and up to
+/// `processorJobs` while the work keeps the processors busy. The threads run until the destructor.
 class Pipeline {
  public:
   using Work = std::function<void(Batch&)>;
 
-  Pipeline(unsigned jobs, unsigned busyJobs, Work work);
+  Pipeline(unsigned diskJobs, unsigned processorJobs, Work work);
   /// Drops the batches that have not begun and waits for those that have.
   ~Pipeline();
 
@@ -63,8 +63,8 @@ class Pipeline {
   void workOn(Batch& batch);
   void runThread();
 
-  std::atomic<unsigned> jobs_;  // lowered when no more threads can be started; workers read it
-  unsigned busyJobs_;           // used by the caller's thread only
+  std::atomic<unsigned> diskJobs_;  // lowered when no more threads can be started; workers read it
+  unsigned processorJobs_;          // used by the caller's thread only
   std::atomic<bool> waitsForDisk_;
   Work work_;
   std::vector<std::thread> threads_;

@@ -25,7 +25,8 @@ class Runner {
 
  private:
   int runSource(Source& source);
-  std::unique_ptr<Batch> nextBatch(Source& source) const;  // waits for the first file only
+  std::unique_ptr<Batch> nextBatch(
+      Source& source) const;  // waits for its first file, for no further one
   void work(Batch& batch) const;
   void prepare(Outcome& outcome) const;
   void emitOldest();
@@ -41,7 +42,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;  // destroyed before the members above, which its threads use
   std::size_t batchSize_ = 1;
-  bool isErrorHintDue_;  // the CSV lacks `error`, which JSON always has; to be said once
+  bool isErrorHintDue_;  // --fields leaves `error` out of the CSV: to be said once
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -51,7 +52,7 @@ Runner::Runner(Options const& options, Output& output, Console& console)
       writer_(makeWriter(options.form, output)),
       detail_(options.form.hasNotes ? Detail::All : Detail::Refusals),
       progress_(console, options),
-      pipeline_(options.jobs, options.busyJobs, [this](Batch& batch) { work(batch); }),
+      pipeline_(options.diskJobs, options.processorJobs, [this](Batch& batch) { work(batch); }),
       isErrorHintDue_(options.form.kind == FormKind::Csv && !options.form.fields.empty() &&
                       !contains(options.form.fields, "error")) {}
 
@@ -121,9 +122,9 @@ void Runner::work(Batch& batch) const {
 
 void Runner::prepare(Outcome& outcome) const {
   Form const& form = options_.form;
-  // Programs get the dates as they are in the file, unless they ask for ISO 8601.
+  // People get tidy dates; programs get those of the file, unless they ask for ISO 8601.
   if (outcome.record && (form.hasIsoDates || !form.isData())) {
-    tidyDates(*outcome.record, form.hasIsoDates);
+    tidyDates(*outcome.record, /*asIso=*/form.hasIsoDates);
   }
   outcome.isShown = std::all_of(form.conditions.begin(), form.conditions.end(),
                                 [&](Condition const& each) { return each.holds(outcome); });
@@ -150,10 +151,10 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  progress_.count(/*hasRecord=*/!outcome.problem,
-                  outcome.isShown);  // `prepare` may have dropped `record`
-  // The message is dropped where the output says the same: always in the text of --why, and with
-  // --quiet in JSON and CSV.
+  // Not `outcome.record`, which `prepare` may have dropped.
+  progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
+  // The text of --why says it anyway. Programs have the field `error`; with --quiet, they get
+  // nothing else of a shown file, even if --fields leaves it out.
   bool const isMessageDropped = form.isData() ? options_.isQuiet : form.isExplanation();
   if (outcome.problem && !(outcome.isShown && isMessageDropped)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);

@@ -23,7 +23,7 @@
 namespace {
 
 /// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. Not /dev/null: a list read from standard input would be empty instead of refused.
+/// descriptor. Reading a folder fails; from /dev/null, a list would seem to be empty.
 void holdStandardStreams() {
   int fd = -1;
   do {  // each `open` takes the lowest free descriptor

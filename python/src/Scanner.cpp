@@ -17,7 +17,7 @@ namespace {
 
 std::unique_ptr<app::Pipeline> makePipeline(unsigned jobs, std::atomic<bool> const& isClosing) {
   unsigned const processors = std::max(std::thread::hardware_concurrency(), 1U);
-  unsigned const most = jobs != 0 ? jobs : std::max(processors, app::kUncachedJobs);
+  unsigned const most = jobs != 0 ? jobs : std::max(processors, app::kDiskJobs);
   auto const work = [&isClosing](app::Batch& batch) { readBatch(batch, isClosing); };
   return std::make_unique<app::Pipeline>(most, jobs != 0 ? jobs : processors, work);
 }

@@ -14,12 +14,14 @@ struct QVJPEGImage::WalkState {
   unsigned short frameWidth = 0;   ///< The greatest of all SOF0 segments met.
   unsigned short frameHeight = 0;  ///< Likewise.
   std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
-  // For notes only. The numbers are positions in the file; -1: no such segment was met.
-  std::int64_t start = 0;          ///< The segment being read.
-  std::int64_t sof0 = -1;          ///< That last made a frame side greater; first if all are 0 x 0.
-  std::int64_t sof2 = -1;          ///< The last SOF2 segment before `firstScan`.
-  std::int64_t firstScan = -1;     ///< The first SOS segment.
-  char const* missingAtScan = "";  ///< Which segments were not met before `firstScan`.
+  // For notes only. The numbers are positions of segments in the file; -1: none was met.
+  std::int64_t start = 0;  ///< The segment being read.
+  /// The SOF0 that last made `frameWidth` or `frameHeight` greater. If all declare 0 x 0: the
+  /// first.
+  std::int64_t sof0 = -1;
+  std::int64_t sof2 = -1;          ///< The last SOF2 before the first SOS.
+  std::int64_t firstScan = -1;     ///< The first SOS.
+  char const* missingAtScan = "";  ///< Which segments were not met before the first SOS.
 };
 
 namespace detail {
@@ -27,8 +29,8 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes the size that an Exif directory gives, if any: should the record have no size in the end,
-/// this is why. Else the note is not shown.
+/// Notes why an Exif directory's size may not count: a side is missing, too small or too large. The
+/// note is shown only if the record gets no size.
 void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

@@ -37,7 +37,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVARWImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::Orientation, orientation);
+  return storeOptionalNumber(ifd, tag::Orientation, orientation);
 }
 
 bool QVARWImage::storeInfoFromSubIFD0(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

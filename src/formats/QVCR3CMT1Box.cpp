@@ -25,9 +25,11 @@ bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT1Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::Orientation, orientation) &&
-         storeText(ifd, tag::DateTime, dateTime) && storeNumber(ifd, tag::ImageWidth, width) &&
-         storeNumber(ifd, tag::ImageLength, height) && storeText(ifd, tag::Model, model);
+  return storeOptionalNumber(ifd, tag::Orientation, orientation) &&
+         storeOptionalText(ifd, tag::DateTime, dateTime) &&
+         storeOptionalNumber(ifd, tag::ImageWidth, width) &&
+         storeOptionalNumber(ifd, tag::ImageLength, height) &&
+         storeOptionalText(ifd, tag::Model, model);
 }
 
 }  // namespace quavel

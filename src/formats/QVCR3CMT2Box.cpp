@@ -10,8 +10,8 @@ using namespace detail;
 
 namespace {
 
-/// Stores the low 16 bits of the entry's number, whatever its type. No entry: true, the field
-/// untouched. Not exactly one value: false.
+/// Stores the entry's number as `shortValue` gives it: any type is converted. No entry: true, the
+/// field untouched. Not exactly one value: false.
 bool storeShort(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
   ValuePointer value = nullptr;
   if (!findNumber(directory, tag, value)) {
@@ -63,8 +63,9 @@ bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT2Box::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeText(ifd, tag::LensModel, lensModel) && storeShort(ifd, tag::ISOSpeedRatings, iso) &&
-         storeAperture(ifd) && storeShutterSpeed(ifd) &&
+  return storeOptionalText(ifd, tag::LensModel, lensModel) &&
+         storeShort(ifd, tag::ISOSpeedRatings, iso) && storeAperture(ifd) &&
+         storeShutterSpeed(ifd) &&
          storeFraction(ifd, tag::FocalLength, EntryValueType::RATIONAL, focalLength) &&
          storeShort(ifd, tag::WhiteBalance, whiteBalance) &&
          storeShort(ifd, tag::MeteringMode, meteringMode) &&

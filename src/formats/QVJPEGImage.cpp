@@ -218,7 +218,7 @@ bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVJPEGImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::Orientation, orientation);
+  return storeOptionalNumber(ifd, tag::Orientation, orientation);
 }
 
 bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
@@ -240,12 +240,12 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
 
 bool QVJPEGImage::readImgWidth(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
   auto const& sideTag = findEntry(ifd, tag::ImageWidth) ? tag::ImageWidth : tag::PixelXDimension;
-  return storeNumber(ifd, sideTag, side);
+  return storeOptionalNumber(ifd, sideTag, side);
 }
 
 bool QVJPEGImage::readImgHeight(std::shared_ptr<QVTiffImageFileDirectory> const& ifd, int& side) {
   auto const& sideTag = findEntry(ifd, tag::ImageLength) ? tag::ImageLength : tag::PixelYDimension;
-  return storeNumber(ifd, sideTag, side);
+  return storeOptionalNumber(ifd, sideTag, side);
 }
 
 }  // namespace quavel

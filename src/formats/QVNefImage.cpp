@@ -55,7 +55,7 @@ bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> 
                   placed(ifd), static_cast<std::uint32_t>(thumbnailWidth),  // unsigned in the file
                   static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRule);
   }
-  return storeNumber(ifd, tag::Orientation, orientation);
+  return storeOptionalNumber(ifd, tag::Orientation, orientation);
 }
 
 bool QVNefImage::storeInfoFromSubIFD1(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

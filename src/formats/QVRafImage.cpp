@@ -130,13 +130,14 @@ bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
 
 bool QVRafImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   // `readMainIFD` asks for no size, but a host may pass a directory that has one.
-  return storeNumber(ifd, tag::ImageWidth, width) && storeNumber(ifd, tag::ImageLength, height) &&
-         storeNumber(ifd, tag::Orientation, orientation);
+  return storeOptionalNumber(ifd, tag::ImageWidth, width) &&
+         storeOptionalNumber(ifd, tag::ImageLength, height) &&
+         storeOptionalNumber(ifd, tag::Orientation, orientation);
 }
 
 bool QVRafImage::storeInfoFromFujiTagsIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::RafImageWidth, width) &&
-         storeNumber(ifd, tag::RafImageLength, height);
+  return storeOptionalNumber(ifd, tag::RafImageWidth, width) &&
+         storeOptionalNumber(ifd, tag::RafImageLength, height);
 }
 
 }  // namespace quavel

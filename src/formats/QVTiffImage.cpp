@@ -75,11 +75,13 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVTiffImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::Orientation, orientation) && storeText(ifd, tag::DateTime, dateTime);
+  return storeOptionalNumber(ifd, tag::Orientation, orientation) &&
+         storeOptionalText(ifd, tag::DateTime, dateTime);
 }
 
 bool QVTiffImage::storeInfoFromFullImageIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return storeNumber(ifd, tag::ImageWidth, width) && storeNumber(ifd, tag::ImageLength, height);
+  return storeOptionalNumber(ifd, tag::ImageWidth, width) &&
+         storeOptionalNumber(ifd, tag::ImageLength, height);
 }
 
 }  // namespace quavel

@@ -22,7 +22,8 @@ bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePoin
   return value != nullptr || refuseContent(directory, tag, "exactly one wanted");
 }
 
-bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field) {
+bool storeOptionalNumber(DirectoryPointer const& directory, unsigned short tag,
+                         std::int32_t& field) {
   ValuePointer value = nullptr;
   if (!findNumber(directory, tag, value)) {
     return false;
@@ -42,10 +43,10 @@ bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, 
     return refuse(journalOf(directory), QVReason::MissingPart, positionOf(directory),
                   "no {} in {}; {}", TagName{tag}, placed(directory), rule);
   }
-  return storeNumber(directory, tag, field);
+  return storeOptionalNumber(directory, tag, field);
 }
 
-bool storeText(DirectoryPointer const& directory, unsigned short tag, std::string& field) {
+bool storeOptionalText(DirectoryPointer const& directory, unsigned short tag, std::string& field) {
   auto const entry = findEntry(directory, tag);
   if (!entry) {
     noteNoEntry(directory, tag);
@@ -146,7 +147,8 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  // Only a number is refused for this type: `storeText` takes such an entry as an empty text.
+  // Only a number is refused for this type: `storeOptionalText` takes such an entry as an empty
+  // text.
   bool const isUndefined = row->typeCode == kUndefinedCode;
   return refuse(ours->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",

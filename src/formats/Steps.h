@@ -19,14 +19,15 @@ namespace quavel::detail {
 bool findNumber(DirectoryPointer const& directory, unsigned short tag, ValuePointer& value);
 
 /// Stores the entry's number. No entry: true, the field untouched. Not exactly one value: false.
-bool storeNumber(DirectoryPointer const& directory, unsigned short tag, std::int32_t& field);
+bool storeOptionalNumber(DirectoryPointer const& directory, unsigned short tag,
+                         std::int32_t& field);
 
 /// The same for a number that must be present. No entry: false, and the refusal states the `rule`.
 bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field);
 
 /// Stores the entry's text. No entry: true, the field untouched. A value not of type ASCII: false.
-bool storeText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
+bool storeOptionalText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
 
 /// Reads the directory at `offset`, counted from the TIFF header's start; null on failure.
 DirectoryPointer readDirectoryAt(std::shared_ptr<QVStream>& stream, PartName const& name,
@@ -71,11 +72,11 @@ inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileTyp
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory, for notes to name. A host's has a null table; it has no journal either, so no note
-/// is composed.
+/// A directory, for notes to name. A host's has no name, but no note is composed of it either.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
+  static constexpr PartName kNoName = {};
   auto const* const ours = ReaderDirectory::of(*directory);
-  return {ours == nullptr ? nullptr : &ours->table};
+  return ours == nullptr ? PlacedDirectory{kNoName, -1} : ours->table.placed();
 }
 
 /// Where a directory begins in the file; -1 for one made by a host.

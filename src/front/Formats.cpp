@@ -93,8 +93,12 @@ Format const* formatOf(std::string_view extension) {
 std::shared_ptr<QVMetadata> readPath(std::string const& path, Journal* journal) {
   std::string extension = extensionOf(path);
   std::transform(extension.begin(), extension.end(), extension.begin(), lowerCase);
-  auto stream = openReadAhead(path, journal == nullptr ? nullptr : &journal->fd);
-  if (journal != nullptr && journal->fd == -1) {
+  int fd = -1;
+  auto stream = openReadAhead(path, &fd);
+  if (journal != nullptr) {
+    journal->fd = fd;  // for the file's size
+  }
+  if (journal != nullptr && fd == -1) {
     // Opening has failed: the stream has no bytes, so `readStream` refuses it too. The first
     // refusal counts.
     journal->systemError = errno;
@@ -112,7 +116,7 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     return nullptr;
   }
   ReadScope const scope(*stream, journal);
-  std::int64_t const start = positionForNotes(journal, *stream);
+  std::int64_t const start = positionForNotes(journal, *stream);  // not used without a journal
   auto record = format->makeRecord();
   if (!record->read(stream)) {
     record = nullptr;

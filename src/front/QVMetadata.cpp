@@ -10,8 +10,8 @@ QVMetadata::QVMetadata() = default;
 QVMetadata::~QVMetadata() = default;
 
 bool QVMetadata::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
-  return detail::storeText(ifd, tag::DateTimeOriginal, dateTimeOriginal) &&
-         detail::storeText(ifd, tag::DateTimeDigitized, dateTimeDigitized);
+  return detail::storeOptionalText(ifd, tag::DateTimeOriginal, dateTimeOriginal) &&
+         detail::storeOptionalText(ifd, tag::DateTimeDigitized, dateTimeDigitized);
 }
 
 std::string QVMetadata::captureDate() const {

@@ -8,7 +8,7 @@
 
 namespace quavel::detail {
 
-/// Seeks up to this position are not tried out, as every file system accepts them.
+/// Every file system accepts a seek to a position up to this, so it need not be tried.
 inline constexpr std::int64_t kMaxUncheckedSeek = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read states its position, so that a seek needs no system

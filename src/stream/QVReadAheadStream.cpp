@@ -21,11 +21,11 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   std::int64_t const base = source.baseOffset;
   source.baseOffset = detail::wrappingSum(base, target);
   source.setOffset(0);
-  bool const seemsThere = source.getOffset() == 0;
+  bool const isAtZero = source.getOffset() == 0;
   source.baseOffset = base;
-  // A source that ignores `baseOffset` has just gone to 0 and still gives 0 now. One that has moved
-  // gives the target, truncated to a `long`.
-  return seemsThere && source.getOffset() == static_cast<long>(target);
+  // That 0 proves nothing yet: a source that ignores `baseOffset` has gone to its start. With the
+  // old base, it gives 0 again, while one that has moved gives the target, truncated to a `long`.
+  return isAtZero && source.getOffset() == static_cast<long>(target);
 }
 
 }  // namespace
@@ -57,21 +57,22 @@ long QVReadAheadStream::getOffset() {
 
 void QVReadAheadStream::setOffset(long const& offset) {
   std::int64_t const target = detail::wrappingSum(baseOffset, offset);
+  // The source moves when it is read. Only a high position is tried at once: it may refuse that.
   if (target >= 0 && (target <= detail::kMaxUncheckedSeek || seekSource(target))) {
     position_ = target;
   }
 }
 
 bool QVReadAheadStream::seekSource(std::int64_t target) {
-  sourcePosition_ = -1;  // not known until a read succeeds
-  source_->setOffset(0);
+  sourcePosition_ = -1;   // not known until a read succeeds
+  source_->setOffset(0);  // where the source stays if it refuses the seek
   if (fitsLong(target)) {
     source_->setOffset(static_cast<long>(target));
   } else if (seekByBase(*source_, target)) {
     return true;
   }
-  // A source that stays at 0 has refused the seek. One that stops at its end has accepted it: a
-  // read delivers nothing there, as it would past the end.
+  // A source may also stop at its end. That is no refusal: a read delivers nothing there, as it
+  // would past the end.
   return source_->getOffset() != 0;
 }
 
@@ -123,7 +124,7 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   bool const mustSeek = sourcePosition_ != position_;
   sourcePosition_ = -1;  // not known until the read succeeds
   if (mustSeek) {
-    if (fitsLong(position_)) {
+    if (fitsLong(position_)) {  // our `setOffset` has seen that the source accepts it
       source_->setOffset(static_cast<long>(position_));
     } else if (!seekSource(position_)) {
       return -1;

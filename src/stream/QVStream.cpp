@@ -63,7 +63,7 @@ void QVStream::swapLLittleToHost(unsigned int* value) const {
   reverseUnlessHostOrderIs(ByteOrder::LittleEndian, *this, value);
 }
 
-void QVStream::swapLLLitleToHost(unsigned long long* value) const {
+void QVStream::swapLLLitleToHost(unsigned long long* value) const {  // see QVStream.h
   reverseUnlessHostOrderIs(ByteOrder::LittleEndian, *this, value);
 }
 

@@ -21,14 +21,14 @@ constexpr std::size_t kMaxReservedRows = 256;
 
 bool refuseEntryCount(Journal* journal, EntryTable const& table) {
   return refuseCut(journal, table.position(), kEntryCountSize, "the entry count of {}",
-                   PlacedDirectory{&table});
+                   table.placed());
 }
 
 bool refuseNextOffset(Journal* journal, EntryTable const& table, std::uint16_t entryCount) {
   std::int64_t const entriesSize = std::int64_t{kEntrySize} * entryCount;
   return refuseCut(journal, table.position() + kEntryCountSize + entriesSize, sizeof(std::uint32_t),
                    "the offset of the next directory, after the {} entries of {}", entryCount,
-                   PlacedDirectory{&table});
+                   table.placed());
 }
 
 }  // namespace
@@ -49,15 +49,16 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
     if (!walk.bufferTag()) {
       return refuseCut(journal_, walk.position(), kEntryTagSize, "entry {} of {} of {}",
-                       walk.number(), entryCount_, PlacedDirectory{this});
+                       walk.number(), entryCount_, placed());
     }
     unsigned short const tag = walk.tag();
     if (!wanted.take(tag)) {
       continue;
     }
     RawEntry entry;
-    // `setOffset` reports no failure: if a stream does not seek to the values, they are read where
-    // it stands. That must be the entry's end, as if the walk did not read ahead.
+    // The walk may have read ahead, so the stream goes to the entry's end first. `readValues` seeks
+    // from there to the values; a host's stream that ignores this seek is read from the entry's
+    // end.
     if (!seek(stream, walk.nextOffset()) || !walk.parseRest(&entry)) {
       return refuseCut(journal_, walk.position() + std::int64_t{kEntryTypePosition},
                        kEntryFieldPosition - kEntryTypePosition, "{}",
@@ -106,7 +107,7 @@ bool EntryTable::readWithNext(QVStream& stream, std::uint32_t offset, TagList ta
   if (!stream.readLong(nextIFDOffset)) {
     return refuseNextOffset(journal_, *this, entryCount_);
   }
-  noteStep(journal_, position_, "{}: has {} of the {} wanted entries", PlacedDirectory{this},
+  noteStep(journal_, position_, "{}: has {} of the {} wanted entries", placed(),
            static_cast<std::uint32_t>(rows_.size()), static_cast<std::uint32_t>(tags.size()));
   return true;
 }
@@ -140,9 +141,9 @@ bool EntryTable::refuseValues(Row const& row, RawEntry const& entry, QVStream& s
 }
 
 void append(std::string& out, PlacedDirectory directory) {
-  append(out, directory.table->name());
+  append(out, directory.name);
   out += " at ";
-  append(out, Offset{directory.table->position()});
+  append(out, Offset{directory.position});
 }
 
 void append(std::string& out, PlacedEntry entry) {

@@ -21,8 +21,14 @@ namespace detail {
 
 class Journal;
 
-/// A directory's wanted entries, with all their values in one array. The directory's name and its
-/// position in the file are for notes; seeks take offsets, which count from `baseOffset`.
+/// A directory in a note: "IFD0 at 8".
+struct PlacedDirectory {
+  PartName const& name;
+  std::int64_t position;  ///< In the file.
+};
+void append(std::string& out, PlacedDirectory directory);
+
+/// A directory's wanted entries, with all their values in one array.
 class EntryTable {
  public:
   struct Row {
@@ -36,6 +42,7 @@ class EntryTable {
     std::uint32_t valueCount() const { return typeCode == kUndefinedCode ? 0 : count; }
   };
 
+  /// The directory's name and its position in the file are only for notes.
   EntryTable(PartName const& name, std::int64_t position) : name_(name), position_(position) {}
 
   /// Reads the directory at the stream's position: the entry count, then the wanted entries, until
@@ -69,6 +76,7 @@ class EntryTable {
 
   PartName const& name() const { return name_; }
   std::int64_t position() const { return position_; }
+  PlacedDirectory placed() const { return {name_, position_}; }
   Journal* journal() const { return journal_; }  ///< Of the read that filled the table, or null.
 
  private:
@@ -85,8 +93,8 @@ class EntryTable {
   std::vector<QVTiffImageFileDirectoryEntryValue> values_;
 };
 
-// Only hosts are given values and UNDEFINED bytes as objects. The next three functions and
-// `takeEntries` prepare them, in HostEntry.cpp.
+// Hosts get entries as objects that share their values; the library's readers use `entry` instead.
+// `takeEntries` and the next three functions, all in HostEntry.cpp, make what hosts get.
 using ValueBlock = std::vector<QVTiffImageFileDirectoryEntryValue>;
 using ValueList = std::vector<std::shared_ptr<QVTiffImageFileDirectoryEntryValue>>;
 
@@ -98,17 +106,10 @@ std::shared_ptr<ValueList> listOf(std::shared_ptr<ValueBlock> const& block, std:
 /// end cuts off are zeros. Of more bytes, their offset is kept, in this machine's byte order.
 std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed);
 
-/// Gives an entry for a host its `count` bytes or their offset, from `undefinedBytesOrOffset`.
+/// Stores in a host's entry the `count` bytes or the offset that `undefinedBytesOrOffset` has
+/// given.
 void storeUndefined(std::uint32_t count, std::uint32_t bytesOrOffset,
                     QVTiffImageFileDirectoryEntry& entry);
-
-/// A directory in a note: "IFD0 at 8".
-struct PlacedDirectory {
-  /// Null for a host's directory. That has no journal, so no note is composed and `append`, which
-  /// needs a table, is never called.
-  EntryTable const* table;
-};
-void append(std::string& out, PlacedDirectory directory);
 
 /// An entry in a note: "0x0132 DateTime at 0xe6 (230) in IFD0".
 struct PlacedEntry {

@@ -91,7 +91,8 @@ bool PathList::refill() {
   } while (count == -1 && errno == EINTR);
   error = count == -1 ? errno : 0;
   atEnd_ = count <= 0;
-  // What precedes a failed read is a part of a path, which could be another file's: it is dropped.
+  // After a failed read, the buffer holds only a part of a path. As a path, it could name another
+  // file, so it is dropped.
   buffer_.resize(count == -1 ? 0 : size + static_cast<std::size_t>(count));
   return !atEnd_;
 }

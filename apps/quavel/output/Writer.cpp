@@ -72,8 +72,8 @@ class SortingWriter : public Writer {
   std::vector<Outcome> outcomes_;
 };
 
-/// The path of each file that gave a record, ended by a NUL. If there are conditions, all files
-/// that come here meet them and are listed, with or without a record.
+/// The path of each file that gave a record, ended by a NUL. If there are conditions, such as
+/// 'reason==empty', all files that come here meet them and are listed, with or without a record.
 TextMaker paths(Form const& form, bool isForTerminal) {
   return [hasConditions = !form.conditions.empty(), isForTerminal](Outcome const& outcome) {
     std::string const path = isForTerminal ? escapedPath(outcome.path) : outcome.path;

@@ -14,7 +14,7 @@ namespace app {
 
 namespace {
 
-/// Both values are of the type that the field's words function takes.
+/// Compares two values of the same type, which `ParseFor` makes sure of.
 template <class Compare>
 bool meets(Value const& value, Value const& wanted) {
   return Compare()(value, wanted);
@@ -48,7 +48,7 @@ struct ParseFor {
   Value operator()(std::string (*)(T)) const {
     std::decay_t<T> value = {};
     if constexpr (std::is_same_v<decltype(value), std::string>) {
-      return text.empty() ? Value() : Value(std::string(text));
+      return std::string(text);
     } else if constexpr (std::is_same_v<T, bool>) {
       return text == "true" || text == "false" ? Value(text == "true") : Value();
     } else {
@@ -60,7 +60,8 @@ struct ParseFor {
   }
 };
 
-/// Gives dates one notation: that of files, of the words for people and of ISO 8601 compare alike.
+/// Turns a date into one notation, so that dates compare as equal whether they are written as in
+/// files, as in words or in ISO 8601.
 Value normalized(Field const& field, Value value) {
   auto* const text = std::get_if<std::string>(&value);
   // A field is a date if `words::date` puts it into words.

@@ -98,8 +98,9 @@ bool isPrintableAscii(std::string_view text) {
     std::memcpy(&word, text.data(), sizeof word);
     found |= word | (word - kSpaces) | (word + kOnes);
   }
+  // The last bytes, fewer than eight. The rest of the word stays spaces, which are printable.
   word = kSpaces;
-  for (char const c : text) {  // fewer than eight: spaces stay before them
+  for (char const c : text) {
     word = (word << 8U) | static_cast<unsigned char>(c);
   }
   found |= word | (word - kSpaces) | (word + kOnes);
