@@ -22,7 +22,7 @@ bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
   }
   QVCR3BoxHeader const& header = *metadataBox.boxHeader;
   std::int64_t const outerBase = stream->baseOffset;
-  PlacedBox const found = {header.type(), outerBase + start};
+  PlacedBox const found = {header.boxType, outerBase + start};
   if (found.type != type) {
     return refuse(journalOf(*stream), QVReason::OtherKind, found.position, "the {} is not a {} box",
                   found, type == box::CMT1 ? "CMT1" : "CMT2");

@@ -15,7 +15,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   }
   // Back into the box, which the base class has stepped over.
   stream->setOffset(start + static_cast<long>(box::kHeaderSize));
-  PlacedBox const thisBox = {boxHeader->type(), stream->baseOffset + start};
+  PlacedBox const thisBox = {boxHeader->boxType, stream->baseOffset + start};
   if (thisBox.type != box::Moov) {
     return refuse(journalOf(*stream), QVReason::OtherKind, thisBox.position,
                   "the {} is not a moov box", thisBox);
@@ -23,7 +23,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   long const end = endOfBox(start, *boxHeader);
 
   bool const isRead = readChildren(stream, start, end);
-  leaveBox(*stream, end);
+  leaveBox(*stream, end);  // after a failure too
   return isRead;
 }
 

@@ -27,7 +27,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   if (!QVCR3Box::read(stream)) {  // reads the header, skips the payload
     return false;
   }
-  PlacedBox const uuid = {boxHeader->type(), stream->baseOffset + start};
+  PlacedBox const uuid = {boxHeader->boxType, stream->baseOffset + start};
   position_ = uuid.position;
   if (uuid.type != box::Uuid) {
     return refuse(journal, QVReason::OtherKind, uuid.position, "the {} is not a uuid box", uuid);

@@ -78,7 +78,7 @@ std::string composed(char const* pattern, std::initializer_list<Word> words) {
   for (Word const& word : words) {
     auto const brace = rest.find('{');  // of a "{}": patterns have no other braces
     if (brace == rest.npos) {
-      break;  // callers choose between patterns, of which one may need fewer words
+      break;  // the pattern needs no more words: some callers choose between two patterns
     }
     text += rest.substr(0, brace);
     word.appendTo(text);

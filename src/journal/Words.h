@@ -46,8 +46,8 @@ void append(std::string& out, HexPair pair);
 void append(std::string& out, HexCode code);
 void append(std::string& out, QuotedBytes bytes);
 
-/// A part of a note's text: a value of any type that has an `append` function, above or where the
-/// type is declared. The value must outlive the word.
+/// A part of a note's text: a value of any type for which there is an `append` function. The value
+/// must outlive the word.
 class Word {
  public:
   template <class Value>

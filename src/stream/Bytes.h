@@ -84,7 +84,8 @@ inline constexpr bool kIsLong32Bit = sizeof(long) < sizeof(std::int64_t);
 inline constexpr long kLastOffset =
     std::numeric_limits<long>::max() - (kIsLong32Bit ? 1L << 20U : 0);
 
-/// Moves the stream to an offset. False: no read may start there, and the stream has not moved.
+/// Moves the stream to an offset, which may be negative. False: no read may start there, or it does
+/// not fit a `long`; the stream has not moved.
 inline bool seek(QVStream& stream, std::int64_t offset) {
   if (offset > kLastOffset || offset < std::numeric_limits<long>::min()) {
     return false;
@@ -102,7 +103,8 @@ inline bool readExactly(QVStream& stream, std::uint8_t* destination, std::size_t
   if (delivered < 0 || delivered > static_cast<std::int64_t>(count)) {
     noteReadResult(stream, -1, /*error=*/0);  // too many bytes are a failure too
   }
-  return false;  // fewer bytes: the data ends, or `QVReadAheadStream` has noted a failure
+  // Fewer bytes are not noted here: the data ends, or `QVReadAheadStream` has noted a failure.
+  return false;
 }
 
 /// Calls `readBuffer` until `count` bytes are received or no more come. Returns how many came.

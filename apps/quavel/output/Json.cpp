@@ -18,7 +18,8 @@ void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && mayNeedEscapes(*text)) {
-    // If it could steer the terminal, all that is not ASCII becomes \uNNNN.
+    // JSON escapes control characters itself. If the text has others that could steer the terminal,
+    // all that is not ASCII becomes \uNNNN.
     bool const couldSteer = isForTerminal && escaped(*text) != *text;
     json +=
         nlohmann::json(*text).dump(-1, ' ', couldSteer, nlohmann::json::error_handler_t::replace);
@@ -60,29 +61,35 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
 struct Member {
   Field const* field;
   std::string name;    // such as `,"iso":`
-  std::string absent;  // such as `,"iso":null`
+  std::string absent;  // such as `,"iso":null`; empty: an absent value is left out
 };
 
 using Members = std::vector<Member>;
 
-Members membersOf(Fields const& fields) {
+Members membersOf(Fields const& fields, bool showAbsent) {
   Members members;
-  for (auto const* field : fields) {
+  auto const add = [&members](Field const* field, bool isShownAbsent) {
     std::string const name = ",\"" + std::string(field->name) + "\":";
-    members.push_back({field, name, name + "null"});
+    members.push_back({field, name, isShownAbsent ? name + "null" : ""});
+  };
+  for (auto const* field : fields) {
+    add(field, showAbsent);
+  }
+  if (contains(fields, "path") && !contains(fields, "pathBytes")) {
+    add(fieldNamed("pathBytes"), false);  // has a value only for a path that is not UTF-8
   }
   return members;
 }
 
 void appendMembers(std::string& json, Members const& members, Outcome const& outcome,
-                   bool showAbsent, bool isForTerminal) {
+                   bool isForTerminal) {
   for (auto const& member : members) {
     Value const value = member.field->value(outcome);
-    if (!std::holds_alternative<std::monostate>(value)) {
+    if (std::holds_alternative<std::monostate>(value)) {
+      json += member.absent;
+    } else {
       json += member.name;
       appendValue(json, value, isForTerminal);
-    } else if (showAbsent) {
-      json += member.absent;
     }
   }
 }
@@ -90,23 +97,17 @@ void appendMembers(std::string& json, Members const& members, Outcome const& out
 }  // namespace
 
 TextMaker jsonObjectMaker(Form const& form, bool isForTerminal) {
-  Fields const fields = form.fields.empty() ? recordFields() : form.fields;
-  // The field pathBytes is absent if the path is UTF-8. If not, it goes with the path, wanted or
-  // not.
-  bool const recordMayLackIt = contains(fields, "path") && !contains(fields, "pathBytes");
-  return [&form, isForTerminal, recordMayLackIt, recordMembers = membersOf(fields),
-          problemMembers = membersOf({fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
-                                      fieldNamed("position")}),
-          pathBytesMember = membersOf({fieldNamed("pathBytes")})](Outcome const& outcome) {
+  bool const showAbsent = form.showAbsent.value_or(true);
+  Fields const recordMembers = form.fields.empty() ? recordFields() : form.fields;
+  Fields const problemMembers = {fieldNamed("path"), fieldNamed("error"), fieldNamed("reason"),
+                                 fieldNamed("position")};
+  return [&form, isForTerminal, ofRecord = membersOf(recordMembers, showAbsent),
+          ofProblem = membersOf(problemMembers, showAbsent)](Outcome const& outcome) {
     std::string object;
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
-    appendMembers(object, outcome.record ? recordMembers : problemMembers, outcome,
-                  form.showAbsent.value_or(true), isForTerminal);
-    if (!outcome.record || recordMayLackIt) {
-      appendMembers(object, pathBytesMember, outcome, /*showAbsent=*/false, isForTerminal);
-    }
+    appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome, isForTerminal);
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
-    object.replace(0, 1, "{");  // in place of the first comma; an empty object has none
+    object.replace(0, 1, "{");  // replaces the first comma, if there is a member
     object += form.kind == FormKind::Jsonl ? "}\n" : "}";
     return object;
   };
