@@ -9,7 +9,8 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
   if (!wantsAllNotes(journal)) {
     return;
   }
-  // A segment's length may have led beyond the data. A size of 0 may be wrong.
+  // A segment's length may have led beyond the data. The size is -1 if it is not known; a size of 0
+  // may be wrong, as for files in /proc.
   bool const isSizeKnown = journal->dataSize() > 0;
   std::int64_t const end = isSizeKnown ? std::min(position, journal->dataSize()) : position;
   if (journal->hasReadFailed) {
@@ -64,7 +65,7 @@ void QVJPEGImage::noteHints(Journal* journal, WalkState const& walk) {
              "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
              Offset{walk.sof2});
   }
-  if (walk.firstScan >= 0) {
+  if (walk.firstScan >= 0) {  // with SOF0 and APP1 before it, the walk would have ended
     noteHint(journal, QVReason::PictureData, walk.firstScan,
              "No {} was met before the scan at {}; the walk goes on through the picture data and "
              "takes it for segments",

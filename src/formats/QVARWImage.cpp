@@ -22,7 +22,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
                            exifIFD)) {
     return false;
   }
-  if (!exifIFD) {  // cameras always write one; without it, no size is looked for either
+  if (!exifIFD) {  // cameras always write one: a file without it is not searched further
     noteAbsent(journalOf(*stream), {"width", "height"}, QVReason::NotInFile,
                "no {} in {}, without which the raw image is not looked for",
                TagName{tag::ExifIFDPointer}, placed(mainIFD));
@@ -33,7 +33,7 @@ bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
                   {tag::NewSubfileType, tag::ImageWidth, tag::ImageLength}, rawIFD)) {
     return false;
   }
-  return !rawIFD || storeInfoFromSubIFD0(rawIFD);  // without a raw IFD, the record has no size
+  return !rawIFD || storeInfoFromSubIFD0(rawIFD);  // `readSubIFD` has noted that there is none
 }
 
 bool QVARWImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {

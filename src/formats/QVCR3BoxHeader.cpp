@@ -12,7 +12,7 @@ bool QVCR3BoxHeader::read(std::shared_ptr<QVStream>& stream) {
   std::array<std::uint8_t, box::kHeaderSize> bytes;
   std::size_t const received = detail::readUpTo(*stream, bytes.data(), bytes.size());
   bool const isReversed = detail::needsReversal(*stream);
-  if (received >= sizeof(boxSize)) {  // hosts get the size even if the type is cut off
+  if (received >= sizeof(boxSize)) {  // set even if the type is cut off, as QVCR3BoxHeader.h says
     boxSize = detail::numberAt<std::uint32_t>(bytes.data(), isReversed);
   }
   if (received < bytes.size()) {

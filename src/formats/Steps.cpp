@@ -147,8 +147,8 @@ bool refuseContent(DirectoryPointer const& directory, unsigned short tag, char c
   if (row == nullptr) {
     return false;
   }
-  // Only a number is refused for this type: `storeOptionalText` takes such an entry as an empty
-  // text.
+  // An UNDEFINED entry has no values, so `storeOptionalText` accepts it as an empty text: if one is
+  // refused, a number was wanted.
   bool const isUndefined = row->typeCode == kUndefinedCode;
   return refuse(ours->table.journal(), QVReason::MalformedEntry, row->position,
                 isUndefined ? "{} is of type UNDEFINED; one number wanted" : "{} holds {}; {}",

@@ -27,6 +27,7 @@ bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, 
                          std::int32_t& field);
 
 /// Stores the entry's text. No entry: true, the field untouched. A value not of type ASCII: false.
+/// No values, as for UNDEFINED: true, the text is empty.
 bool storeOptionalText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
 
 /// Reads the directory at `offset`, counted from the TIFF header's start; null on failure.

@@ -82,7 +82,7 @@ struct Signature {
   std::uint8_t size;
   char bytes[9];
   char kind[36];          ///< As it stands after "looks like".
-  std::uint8_t families;  ///< Whose files begin like this; 0: no family's.
+  std::uint8_t families;  ///< Whose readers need no hint at this kind; 0: none.
 };
 
 constexpr std::uint8_t kTiffFamilies = kTiff | kNef | kArw;
@@ -145,7 +145,7 @@ void noteAbsences(Format const& format, QVMetadata const& record, Journal& journ
     return;
   }
   for (auto const& row : kFields) {
-    if (isAbsent(row, record)) {
+    if (isAbsent(row, record)) {  // the readers' reasons are not among `notes` yet
       journal.notes.push_back(absence(row, format, journal));
     }
   }

@@ -68,7 +68,7 @@ std::int64_t PositionedFile::readBuffer(std::uint8_t* destination, std::size_t c
     return 0;
   }
   ++reads_;
-  bool const isTimed = reads_ == 1 && file::kTakesAdvice;  // only for advice
+  bool const isTimed = reads_ == 1 && file::kTakesAdvice;  // the time only decides about advice
   auto delivered = isTimed ? readTimed(destination, count) : readUntimed(destination, count);
   if (delivered == -1 && errno == ESPIPE) {
     delivered = readPipe(destination, count);

@@ -26,12 +26,12 @@ std::wstring widened(std::string const& path) {
   return wide.data();
 }
 
-/// The path as Windows takes it. An absolute path has room for MAX_PATH characters, its NUL among
-/// them. A longer one is made absolute and gets the prefix `\\?\`; in it, `\\server\share` is
-/// written `\\?\UNC\server\share`.
+/// The path as Windows takes it. If its absolute form, with the NUL, does not fit into MAX_PATH
+/// characters, that form gets the prefix `\\?\`; `\\server\share` then becomes
+/// `\\?\UNC\server\share`.
 std::wstring withLongPathPrefix(std::wstring const& path) {
   DWORD const size = ::GetFullPathNameW(path.c_str(), 0, nullptr, nullptr);  // with NUL; 0: failed
-  if (size < MAX_PATH) {
+  if (size <= MAX_PATH) {
     return path;
   }
   std::vector<wchar_t> buffer(size);

@@ -37,7 +37,7 @@ class EntryWalk {
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
   /// Buffers the current entry's tag, which may move the stream. False: the data ends within it.
-  /// The buffer is filled with whole entries: the rest is missing only where the data ends.
+  /// `parseRest` need not read more: the rest of an entry is only missing where the data ends.
   bool bufferTag() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }

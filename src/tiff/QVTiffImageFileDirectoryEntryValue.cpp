@@ -150,7 +150,7 @@ bool QVTiffImageFileDirectoryEntryValue::read(std::shared_ptr<QVStream>& stream)
       return readInto(*this, *stream, &QVStream::readLong) &&  // a fraction: two numbers
              readInto(*this, *stream, &QVStream::readLong, /*position=*/4);
     default:
-      return false;  // UNDEFINED, or an unknown type: callers can set `type` to any number
+      return false;  // size 0: UNDEFINED or an unknown type, as callers can set any
   }
 }
 

@@ -58,9 +58,10 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // A second after an interrupt, the process ends even within a write, which must not cut a piece.
-  // So a pipe gets at most PIPE_BUF bytes at once: it takes them all or, while it is full, none. A
-  // file gets everything at once.
+  // An interrupt ends the process after a second at most, even within a write. To keep pieces whole
+  // all the same, a pipe gets as many of them as fit into PIPE_BUF bytes, which it takes all
+  // together or not at all. (A longer piece may be cut.) A file does not wait, so it gets
+  // everything at once.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
