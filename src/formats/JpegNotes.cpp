@@ -48,7 +48,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =
       walk.sawSOF0 ? composed("the SOF0 segment at {} declares {} x {}",
-                              {Offset{walk.sof0}, walk.frameWidth, walk.frameHeight})
+                              {Offset{walk.sof0Position}, walk.frameWidth, walk.frameHeight})
                    : "no baseline frame (SOF0) was met";
   noteAbsent(journal, {"width", "height"}, QVReason::NotInFile, "{}; {}", frameText, exifText);
   if (!walk.sawExif) {
@@ -60,16 +60,16 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
 }
 
 void QVJPEGImage::noteHints(Journal* journal, WalkState const& walk) {
-  if (walk.sof2 >= 0) {
-    noteHint(journal, QVReason::NotBaseline, walk.sof2,
+  if (walk.sof2Position >= 0) {
+    noteHint(journal, QVReason::NotBaseline, walk.sof2Position,
              "The frame at {} is progressive (SOF2); only a baseline frame (SOF0) gives a size",
-             Offset{walk.sof2});
+             Offset{walk.sof2Position});
   }
-  if (walk.firstScan >= 0) {  // with SOF0 and APP1 before it, the walk would have ended
-    noteHint(journal, QVReason::PictureData, walk.firstScan,
+  if (walk.firstScanPosition >= 0) {  // with SOF0 and APP1 before it, the walk would have ended
+    noteHint(journal, QVReason::PictureData, walk.firstScanPosition,
              "No {} was met before the scan at {}; the walk goes on through the picture data and "
              "takes it for segments",
-             walk.missingAtScan, Offset{walk.firstScan});
+             walk.missingAtScan, Offset{walk.firstScanPosition});
   }
 }
 

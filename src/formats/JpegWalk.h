@@ -15,13 +15,13 @@ struct QVJPEGImage::WalkState {
   unsigned short frameHeight = 0;  ///< Likewise.
   std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
   // For notes only. The numbers are positions of segments in the file; -1: none was met.
-  std::int64_t start = 0;  ///< The segment being read.
+  std::int64_t position = 0;  ///< The segment being read.
   /// The SOF0 that last made `frameWidth` or `frameHeight` greater. If all declare 0 x 0: the
   /// first.
-  std::int64_t sof0 = -1;
-  std::int64_t sof2 = -1;          ///< The last SOF2 before the first SOS.
-  std::int64_t firstScan = -1;     ///< The first SOS.
-  char const* missingAtScan = "";  ///< Which segments were not met before the first SOS.
+  std::int64_t sof0Position = -1;
+  std::int64_t sof2Position = -1;       ///< The last SOF2 before the first SOS.
+  std::int64_t firstScanPosition = -1;  ///< The first SOS.
+  char const* missingAtScan = "";       ///< Which segments were not met before the first SOS.
 };
 
 namespace detail {

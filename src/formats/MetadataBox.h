@@ -15,7 +15,7 @@ namespace quavel::detail {
 template <class MetadataBox>
 bool readMetadataBox(MetadataBox& metadataBox, std::uint32_t type,
                      std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   long const start = stream->getOffset();
   if (!metadataBox.QVCR3Box::read(stream)) {  // reads the header, skips the payload
     return false;

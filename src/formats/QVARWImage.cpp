@@ -8,7 +8,7 @@ namespace quavel {
 using namespace detail;
 
 bool QVARWImage::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   isRaw = true;
 
   auto const mainIFD =

@@ -7,7 +7,7 @@ namespace quavel {
 QVCR3Box::~QVCR3Box() = default;
 
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
-  detail::ReadScope const scope(*stream);
+  auto const scope = detail::ReadScope::beginOrJoin(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
   detail::BoxContext context;  // without a suffix: notes name no box around this one
   return detail::stepOverBox(stream, context, *boxHeader);

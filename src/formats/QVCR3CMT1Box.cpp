@@ -13,7 +13,7 @@ bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   // Nothing uses ExifIFDPointer, SubIFDs and NewSubfileType. They are listed to be checked: if one
   // of these entries is malformed, so may the rest be, and the box is refused.
   auto const mainIFD =

@@ -52,7 +52,7 @@ bool QVCR3CMT2Box::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3CMT2Box::readExif(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   auto const mainIFD = readFirstDirectory(  // in this box, the Exif directory
       stream,
       {tag::LensModel, tag::ISOSpeedRatings, tag::ApertureValue, tag::ShutterSpeedValue,

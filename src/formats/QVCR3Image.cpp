@@ -10,7 +10,7 @@ namespace quavel {
 using namespace detail;
 
 bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   isRaw = true;
 
   BoxContext context = {/*noteSuffix=*/" before a moov box was met"};

@@ -8,7 +8,7 @@ namespace quavel {
 using namespace detail;
 
 bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   long const start = stream->getOffset();
   if (!QVCR3Box::read(stream)) {
     return false;

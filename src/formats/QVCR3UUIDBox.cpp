@@ -21,7 +21,7 @@ bool readAndKeepChild(std::shared_ptr<QVStream>& stream, long start,
 }  // namespace
 
 bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   Journal* const journal = scope.reading().journal;
   long const start = stream->getOffset();
   if (!QVCR3Box::read(stream)) {  // reads the header, skips the payload

@@ -32,10 +32,10 @@ constexpr int kMaxThumbnailSide = 500;
 
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
-// Bytes to skip after the markers whose length is not read: after DRI its length and interval,
-// after a marker without payload 2 bytes, though the next marker may be there. Hosts know these
-// numbers by the public map below; the walk does not use it, as it may not be initialised yet when
-// a host's static object reads a file.
+// Bytes to skip after the markers whose length is not read. After DRI: its length and interval.
+// After a marker without payload: 2 bytes. They may be the next marker, but these are the numbers
+// that the public map below gives to hosts. The walk uses this array, as the map may not be
+// initialised yet when a host's static object reads a file.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -56,13 +56,21 @@ bool seekNext(QVStream& stream, std::int64_t offset) {
                                            kMarkerSize, "the marker of the next segment");
 }
 
+/// What the walk has not met. It has not met both APP1 and SOF0: it would have ended.
+char const* missingSegments(bool sawAPP1, bool sawSOF0) {
+  if (sawAPP1) {
+    return "SOF0";
+  }
+  return sawSOF0 ? "APP1" : "SOF0 or APP1";
+}
+
 }  // namespace
 
 std::map<std::uint16_t, std::uint16_t> const QVJPEGImage::markerSkipLengths(kFixedSkips.begin(),
                                                                             kFixedSkips.end());
 
 bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   Reading& reading = scope.reading();
   Journal* const journal = reading.journal;
   stream->byteOrder = ByteOrder::BigEndian;
@@ -81,9 +89,9 @@ bool QVJPEGImage::read(std::shared_ptr<QVStream>& stream) {
   WalkState walk;
   while (!walk.sawAPP1 || !walk.sawSOF0) {
     stream->byteOrder = ByteOrder::BigEndian;  // an Exif segment may have changed it
-    walk.start = positionForNotes(journal, *stream);
+    walk.position = positionForNotes(journal, *stream);
     if (!stream->readShort(&marker)) {
-      noteEnd(journal, walk.start);
+      noteEnd(journal, walk.position);
       break;
     }
     if (!reading.spend(Work::SegmentsAndBoxes, 1) || !readSegment(stream, marker, walk) ||
@@ -110,8 +118,8 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
 
   unsigned short length = 0;
   if (!stream->readShort(&length)) {
-    return refuseCut(journalOf(*stream), walk.start + kMarkerSize, kLengthSize,
-                     "the length of the segment {} at {}", HexCode{marker}, Offset{walk.start});
+    return refuseCut(journalOf(*stream), walk.position + kMarkerSize, kLengthSize,
+                     "the length of the segment {} at {}", HexCode{marker}, Offset{walk.position});
   }
   walk.nextOffset = std::int64_t{stream->getOffset()} + length - kLengthSize;
   if (marker == kAPP1 && !readAPP1(stream, walk)) {
@@ -121,15 +129,13 @@ bool QVJPEGImage::readSegment(std::shared_ptr<QVStream>& stream, unsigned short 
     return false;
   }
   // The rest is for notes.
-  if (marker == kSOS && walk.firstScan < 0) {
-    walk.firstScan = walk.start;
-    bool const sawOne = walk.sawAPP1 || walk.sawSOF0;  // not both: the walk would have ended
-    char const* const other = walk.sawAPP1 ? "SOF0" : "APP1";
-    walk.missingAtScan = sawOne ? other : "SOF0 or APP1";
+  if (marker == kSOS && walk.firstScanPosition < 0) {
+    walk.firstScanPosition = walk.position;
+    walk.missingAtScan = missingSegments(walk.sawAPP1, walk.sawSOF0);
   }
-  // After an SOS segment, picture data may look like an SOF2 marker, and a hint at it be wrong.
-  if (marker == kSOF2 && walk.firstScan < 0) {
-    walk.sof2 = walk.start;
+  // After an SOS segment, what looks like an SOF2 marker may be picture data.
+  if (marker == kSOF2 && walk.firstScanPosition < 0) {
+    walk.sof2Position = walk.position;
   }
   return true;
 }
@@ -138,18 +144,18 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   Journal* const journal = journalOf(*stream);
   std::array<std::uint8_t, 4> identifier;
   if (!readExactly(*stream, identifier.data(), identifier.size())) {
-    return refuseCut(journal, walk.start + kPayloadPosition, identifier.size(),
-                     "the identifier of the APP1 segment at {}", Offset{walk.start});
+    return refuseCut(journal, walk.position + kPayloadPosition, identifier.size(),
+                     "the identifier of the APP1 segment at {}", Offset{walk.position});
   }
   bool const isExif = identifier == kExifIdentifier;
-  noteStep(journal, walk.start, "the APP1 segment at {}: {}", Offset{walk.start},
+  noteStep(journal, walk.position, "the APP1 segment at {}: {}", Offset{walk.position},
            isExif ? "Exif" : "not Exif");
   if (isExif) {
     unsigned short twoZeros = 0;  // not checked
     if (!stream->readShort(&twoZeros)) {
-      return refuseCut(journal, walk.start + kPayloadPosition + std::int64_t{identifier.size()},
+      return refuseCut(journal, walk.position + kPayloadPosition + std::int64_t{identifier.size()},
                        sizeof(twoZeros), "the end of the Exif identifier of the APP1 segment at {}",
-                       Offset{walk.start});
+                       Offset{walk.position});
     }
     std::int64_t const outerBase = stream->baseOffset;  // `readExifSegment` changes it
     if (!readExifSegment(stream)) {
@@ -158,7 +164,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
     stream->baseOffset = outerBase;
     walk.sawExif = true;
   }
-  walk.sawAPP1 = true;  // Exif or not: after SOF0, the walk looks for no other
+  walk.sawAPP1 = true;  // even if it is not Exif: with SOF0 too, the walk ends
   return true;
 }
 
@@ -167,15 +173,15 @@ bool QVJPEGImage::readSOF0(std::shared_ptr<QVStream>& stream, WalkState& walk) {
   unsigned short height = 0;
   unsigned short width = 0;
   if (!stream->readByte(&precision) || !stream->readShort(&height) || !stream->readShort(&width)) {
-    return refuseCut(journalOf(*stream), walk.start + kPayloadPosition,
+    return refuseCut(journalOf(*stream), walk.position + kPayloadPosition,
                      sizeof(precision) + sizeof(height) + sizeof(width), "the SOF0 segment at {}",
-                     Offset{walk.start});
+                     Offset{walk.position});
   }
-  noteStep(journalOf(*stream), walk.start, "the SOF0 segment at {} declares {} x {}",
-           Offset{walk.start}, width, height);
+  noteStep(journalOf(*stream), walk.position, "the SOF0 segment at {} declares {} x {}",
+           Offset{walk.position}, width, height);
   // Until an APP1 is met, the walk goes on and may find more frames: the greatest sides count.
-  if (walk.sof0 < 0 || width > walk.frameWidth || height > walk.frameHeight) {
-    walk.sof0 = walk.start;
+  if (walk.sof0Position < 0 || width > walk.frameWidth || height > walk.frameHeight) {
+    walk.sof0Position = walk.position;  // for notes
   }
   walk.frameHeight = std::max(walk.frameHeight, height);
   walk.frameWidth = std::max(walk.frameWidth, width);
@@ -201,7 +207,7 @@ void QVJPEGImage::reconcileSizeWith(WalkState const& walk) {
 }
 
 bool QVJPEGImage::readExifSegment(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   stream->baseOffset += stream->getOffset();
 
   auto const mainIFD =
@@ -230,7 +236,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
-  noteWhyNoSize(ifd, exifWidth, exifHeight);
+  noteWhyNoSize(ifd, exifWidth, exifHeight);  // shown only if the record gets no size
   if (exifWidth > kMaxThumbnailSide && exifHeight > kMaxThumbnailSide) {
     width = exifWidth;
     height = exifHeight;

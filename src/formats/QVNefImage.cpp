@@ -18,7 +18,7 @@ constexpr char kThumbnailRule[] = "a NEF's first directory must be 160 x 120";
 }  // namespace
 
 bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   isRaw = true;
 
   auto const mainIFD = readFirstDirectory(stream, {tag::SubIFDs, tag::ImageWidth, tag::ImageLength,

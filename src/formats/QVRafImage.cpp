@@ -59,7 +59,7 @@ void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
 }  // namespace
 
 bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   Journal* const journal = scope.reading().journal;
   isRaw = true;
 
@@ -95,7 +95,7 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   auto const mainIFD = readFirstDirectory(stream, {tag::Orientation, tag::ExifIFDPointer},
                                           "the embedded JPEG's Exif segment");
   if (!mainIFD || !storeInfoFromMainIFD(mainIFD)) {
@@ -108,7 +108,7 @@ bool QVRafImage::readMainIFD(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVRafImage::readFujiIFD(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   auto const rawSectionIFD =
       readFirstDirectory(stream, {tag::RafDirectoryPointer}, "the raw section");
   if (!rawSectionIFD) {

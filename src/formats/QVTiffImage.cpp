@@ -55,7 +55,7 @@ DirectoryPointer chooseFullImageIFD(std::shared_ptr<QVStream>& stream,
 }  // namespace
 
 bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
-  ReadScope const scope(*stream);
+  auto const scope = ReadScope::beginOrJoin(*stream);
   auto const mainIFD = readFirstDirectory(
       stream, {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::ExifIFDPointer,
                tag::SubIFDs, tag::NewSubfileType, tag::DateTime});

@@ -115,7 +115,7 @@ std::shared_ptr<QVMetadata> readStream(std::shared_ptr<QVStream> stream,
     refuseExtension(journal, extension);
     return nullptr;
   }
-  ReadScope const scope(*stream, journal);
+  auto const scope = ReadScope::begin(*stream, journal);
   std::int64_t const start = positionForNotes(journal, *stream);  // not used without a journal
   auto record = format->makeRecord();
   if (!record->read(stream)) {

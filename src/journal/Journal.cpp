@@ -67,7 +67,8 @@ std::string Journal::cutText(std::int64_t end) {
   if (dataSize() <= 0) {  // not known, or a 0 that may be wrong
     return "the data ends before that";
   }
-  // Within the size, the bytes should have been delivered: the file may have grown since the read.
+  // Bytes within the size may be missing too, as when the file has grown since: then its end is not
+  // the reason.
   bool const isWithinSize = end <= dataSize();
   return isWithinSize ? "reading there fails"
                       : composed("the file ends at {}", {Offset{dataSize()}});
@@ -103,7 +104,9 @@ QVNote* Journal::absenceOf(char const* field) {
   return found == absences_.end() ? nullptr : &*found;
 }
 
-void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {  // see Reading.h
+// The next two functions are declared in Reading.h, where Journal is not complete.
+
+void noteReadResult(QVStream const& stream, std::int64_t delivered, int error) {
   if (Journal* const journal = journalOf(stream)) {
     journal->hasReadFailed = delivered < 0;
     journal->systemError = delivered < 0 ? error : 0;

@@ -48,18 +48,10 @@ class Reading {
 class ReadScope {
  public:
   /// For a public operation: begins a read, or joins the one during which it was called.
-  explicit ReadScope(QVStream& stream) : stream_(stream), outer_(stream.reading_.current) {
-    if (outer_ == nullptr) {
-      stream_.reading_.current = &begun_;
-    }
-  }
-  /// For `readStream` (Formats.h): always begins a read. The record's class is one of the library's
-  /// own.
-  ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
-    begun_.journal = journal;
-    begun_.isLibraryRecord = true;
-    stream_.reading_.current = &begun_;
-  }
+  static ReadScope beginOrJoin(QVStream& stream) { return ReadScope(stream); }
+  /// For `readStream` (Formats.h): always begins a read, of a record of the library's own class.
+  static ReadScope begin(QVStream& stream, Journal* journal) { return {stream, journal}; }
+
   ~ReadScope() { stream_.reading_.current = outer_; }
   ReadScope(ReadScope const&) = delete;
   ReadScope& operator=(ReadScope const&) = delete;
@@ -68,6 +60,17 @@ class ReadScope {
   static Reading* current(QVStream const& stream) { return stream.reading_.current; }
 
  private:
+  explicit ReadScope(QVStream& stream) : stream_(stream), outer_(stream.reading_.current) {
+    if (outer_ == nullptr) {
+      stream_.reading_.current = &begun_;
+    }
+  }
+  ReadScope(QVStream& stream, Journal* journal) : stream_(stream), outer_(stream.reading_.current) {
+    begun_.journal = journal;
+    begun_.isLibraryRecord = true;
+    stream_.reading_.current = &begun_;
+  }
+
   QVStream& stream_;
   Reading* outer_;  // null: none was under way
   Reading begun_;   // not used after joining `outer_`

@@ -25,7 +25,7 @@ long QVMStream::getOffset() {
 }
 
 void QVMStream::setOffset(long const& newOffset) {
-  // As an unsigned number, a target before the start is past the end, and so leads to the end.
+  // A negative target becomes a huge unsigned number, so it leads to the end as one past it does.
   auto const target = static_cast<std::uint64_t>(detail::wrappingSum(baseOffset, newOffset));
   offset = std::min(target, length);
 }

@@ -21,7 +21,7 @@ std::uint32_t undefinedBytesOrOffset(RawEntry const& entry, bool isReversed) {
   if (entry.count > kEntryFieldSize) {  // in an UNDEFINED entry, each value is a byte
     return valueOffset(entry, isReversed);
   }
-  std::uint32_t bytes = 0;
+  std::uint32_t bytes = 0;  // stays 0 where the file's end cuts the field off
   std::memcpy(&bytes, entry.field, entry.fieldBytesRead);
   return bytes;
 }

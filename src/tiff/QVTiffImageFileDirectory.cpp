@@ -9,7 +9,7 @@ QVTiffImageFileDirectory::QVTiffImageFileDirectory() = default;
 
 bool QVTiffImageFileDirectory::read(std::shared_ptr<QVStream>& stream,
                                     std::vector<unsigned short> const& tags) {
-  detail::ReadScope const scope(*stream);
+  auto const scope = detail::ReadScope::beginOrJoin(*stream);
   detail::WantedTags wanted(tags.data(), tags.size());
   detail::EntryTable table(/*name=*/{}, detail::positionOf(*stream));  // both are for its notes
   if (!table.read(*stream, wanted)) {

@@ -29,7 +29,7 @@ class WantedTags {
     }
   }
 
-  /// Whether the tag is still wanted. A listed tag no longer is after this call.
+  /// Whether the tag is still wanted. If it is listed, it is struck off the list.
   bool take(unsigned short tag) {
     if (!mayBeWanted(tag)) {
       return false;
@@ -87,8 +87,8 @@ class WantedTags {
 
   bool const wantsAll_;
   std::uint64_t mask_ = 0;  // the `bitOf` of all listed tags: rules out most others quickly
-  std::size_t left_ =
-      0;  // how many listed tags are still to be met: in a short list, its first ones
+  /// How many listed tags are still to be met. In a short list, they come first.
+  std::size_t left_ = 0;
   std::array<unsigned short, kMaxShortList> shortList_;
   std::unique_ptr<LongList> longList_;  // null while the short list is enough
 };

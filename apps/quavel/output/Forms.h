@@ -18,14 +18,14 @@ std::string cardOf(Form const& form, Outcome const& outcome);
 /// Why a file gives no record, or which fields its record lacks and why: a verdict, then details.
 std::string explanationOf(Outcome const& outcome);
 
-/// CSV by RFC 4180: a header row, then a row for each file. Absent values are empty. The maker
-/// escapes characters that could steer the terminal if the rows are for one.
+/// CSV by RFC 4180: a header row, then a row for each file. Absent values are empty. With
+/// `isForTerminal`, characters that could steer the terminal are escaped.
 std::string csvHeader(Form const& form);
 TextMaker csvRowMaker(Form const& form, bool isForTerminal);
 
 /// JSON objects, each on one line. For JSON Lines, each includes its line end; in an array, the
 /// writer adds commas and line ends. An infinity, which JSON lacks, is "Infinity" or "-Infinity".
-/// The maker escapes as that of CSV does, and it refers to `form`, which must outlive it.
+/// Characters are escaped as in CSV. The maker keeps a reference to `form`.
 TextMaker jsonObjectMaker(Form const& form, bool isForTerminal);
 
 /// A table for people. It is laid out a page of 500 rows at a time, so that no more are held in

@@ -65,7 +65,7 @@ std::string readAll(Problem& problem) {
 bool isDate(std::string const& text) {
   std::tm time = {};
   char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
-  std::tm day = {};
+  std::tm day = {};  // the date alone: a leap second would carry into the next day
   day.tm_year = time.tm_year;
   day.tm_mon = time.tm_mon;
   day.tm_mday = time.tm_mday;
@@ -112,10 +112,10 @@ std::string extensionOf(std::string_view path) {
 }
 
 bool isPhotoExtension(std::string const& extension) {
-  static quavel::QVReader const library("");  // reads no file; is only asked for formats
-  // Known ones are kept: for them, `createMetadata` makes a whole record at every call.
+  static quavel::QVReader const reader("");  // reads no file; is only asked for formats
+  // Known extensions are cached, as asking for one makes a whole record; for others, it makes none.
   thread_local std::unordered_set<std::string> known;
-  if (known.count(extension) == 0 && library.createMetadata(extension) != nullptr) {
+  if (known.count(extension) == 0 && reader.createMetadata(extension) != nullptr) {
     known.insert(extension);
   }
   return known.count(extension) != 0;
