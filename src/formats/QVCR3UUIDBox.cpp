@@ -27,22 +27,25 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   if (!QVCR3Box::read(stream)) {  // reads the header, skips the payload
     return false;
   }
-  PlacedBox const uuid = {boxHeader->boxType, stream->baseOffset + start};
-  position_ = uuid.position;
-  if (uuid.type != box::Uuid) {
-    return refuse(journal, QVReason::OtherKind, uuid.position, "the {} is not a uuid box", uuid);
+  PlacedBox const thisBox = {boxHeader->boxType, stream->baseOffset + start};
+  position_ = thisBox.position;
+  if (thisBox.type != box::Uuid) {
+    return refuse(journal, QVReason::OtherKind, thisBox.position, "the {} is not a uuid box",
+                  thisBox);
   }
   long const end = endOfBox(start, *boxHeader);
 
-  stream->setOffset(start + static_cast<long>(box::kHeaderSize));  // back from the box's end
+  stream->setOffset(
+      start + static_cast<long>(
+                  box::kHeaderSize));  // back from the box's end; headers of 16 bytes are refused
   for (auto& word : userType) {
     if (!stream->readLong(&word)) {
-      return refuseCut(journal, uuid.position + box::kHeaderSize, sizeof(userType),
-                       "the 16-byte identifier of the {}", uuid);
+      return refuseCut(journal, thisBox.position + box::kHeaderSize, sizeof(userType),
+                       "the 16-byte identifier of the {}", thisBox);
     }
   }
   bool const isMetadata = userType == metadataUUID;
-  noteStep(journal, uuid.position, "{}: {}", uuid,
+  noteStep(journal, thisBox.position, "{}: {}", thisBox,
            isMetadata ? "the metadata" : "another identifier");
   bool const isRead = !isMetadata || readChildren(stream, end);  // any other box is skipped
   leaveBox(*stream, end);

@@ -16,7 +16,8 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
   auto const subIFDs = findEntry(mainIFD, tag::SubIFDs);
   auto const count = static_cast<std::uint32_t>(subIFDs.size());
   for (std::uint32_t i = 0; i < count; ++i) {
-    // The SubIFD's Orientation is not used (the main IFD's is), only checked: see `TagList`.
+    // The SubIFD's Orientation is not used (the main IFD's is). As `TagList` says, it is listed so
+    // that a malformed one refuses the file.
     auto subIFD =
         readDirectoryAt(stream, subIFDName(i, count), subIFDs[i]->longValue(),
                         {tag::ImageWidth, tag::ImageLength, tag::Orientation, tag::NewSubfileType});
@@ -24,6 +25,8 @@ DirectoryPointer readFullImageSubIFD(std::shared_ptr<QVStream>& stream,
     if (!subIFD || !findNumber(subIFD, tag::NewSubfileType, type)) {
       return nullptr;
     }
+    // By TIFF, no NewSubfileType means a full image. In a SubIFD that is not trusted: it could as
+    // well be a preview.
     if (type != nullptr && !isReducedImage(type->longValue())) {
       return subIFD;
     }
@@ -68,7 +71,7 @@ bool QVTiffImage::read(std::shared_ptr<QVStream>& stream) {
     return false;
   }
 
-  DirectoryPointer exifIFD;  // not used further
+  DirectoryPointer exifIFD;  // not used further; OffsetTimeOriginal in it is only checked
   return readAndStoreExifIFD(
       *this, stream, mainIFD,
       {tag::DateTimeOriginal, tag::OffsetTimeOriginal, tag::DateTimeDigitized}, exifIFD);

@@ -26,12 +26,12 @@ class EntryView {
 
   explicit operator bool() const { return exists_; }
 
-  /// The number of values; 0 for an UNDEFINED entry, which has bytes instead.
+  /// The number of values; 0 for an UNDEFINED entry, whose bytes a view does not give.
   std::size_t size() const { return size_; }
   ValuePointer operator[](std::size_t i) const { return shared_ ? shared_[i].get() : values_ + i; }
 
-  /// Stores the text before the first NUL. False: a value before it is not of type ASCII (a host's
-  /// entry may mix types); the text ends there.
+  /// Stores the text before the first NUL. False: a value before that NUL is not of type ASCII (a
+  /// host's entry may mix types), and `out` holds the text before that value.
   bool convertToString(std::string& out) const;
 
  private:

@@ -78,10 +78,12 @@ bool FolderWalk::visitLinkOrUnknown(unsigned char type, std::string path, Input&
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    // Such as a dangling link: the attempt to read it will give the reason.
-    bool const isPhoto = isPhotoExtension(extensionOf(path));
+    // Reading the photo will give the reason, such as that the link is dangling.
+    if (!isPhotoExtension(extensionOf(path))) {
+      return false;
+    }
     input = {std::move(path), /*isRegular=*/false, {}};
-    return isPhoto;
+    return true;
   }
   if (S_ISDIR(status.st_mode)) {
     std::string const name = path.substr(path.rfind('/') + 1);

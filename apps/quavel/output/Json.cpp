@@ -51,9 +51,9 @@ std::string notesOf(Outcome const& outcome, bool isForTerminal) {
     object["text"] = textAsUtf8(note.text);
     notes.push_back(std::move(object));
   }
-  std::string const further = ",\"furtherSteps\":" + std::to_string(outcome.furtherSteps);
+  std::string const further = ",\"furtherSteps\":" + std::to_string(outcome.unnotedSteps);
   return ",\"notes\":" + notes.dump(-1, ' ', /*ensure_ascii=*/isForTerminal) +
-         (outcome.furtherSteps == 0 ? "" : further);
+         (outcome.unnotedSteps == 0 ? "" : further);
 }
 
 /// How a field is written in an object. Each begins with a comma; `jsonObjectMaker` replaces the

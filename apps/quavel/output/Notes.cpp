@@ -58,10 +58,11 @@ std::string absencesOf(std::vector<QVNote> const& notes) {
 std::string explanationOf(Outcome const& outcome) {
   std::string text =
       verdictOf(outcome) + linesOf(outcome.notes, QVNoteKind::Step, "  read: ", "\n");
-  if (outcome.furtherSteps != 0) {
-    text += "  read: " + std::to_string(outcome.furtherSteps) + " more\n";
+  if (outcome.unnotedSteps != 0) {  // only the first steps have notes
+    text += "  read: " + std::to_string(outcome.unnotedSteps) + " more\n";
   }
-  text += linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n");  // hints are sentences
+  // Unlike the others, hints are whole sentences, and get a full stop.
+  text += linesOf(outcome.notes, QVNoteKind::Hint, "  note: ", ".\n");
   return text + absencesOf(outcome.notes);
 }
 

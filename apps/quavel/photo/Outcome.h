@@ -35,7 +35,7 @@ struct Outcome {
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< Such as "JPEG"; empty: the extension names none.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
-  std::uint64_t furtherSteps = 0;              ///< Parts read after the few that `notes` names.
+  std::uint64_t unnotedSteps = 0;              ///< Parts read after the few that `notes` names.
   bool isShown = true;                         ///< It meets the conditions of --where.
   std::string text;                            ///< Its output in the chosen form, once prepared.
   std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.

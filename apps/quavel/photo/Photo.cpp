@@ -93,7 +93,7 @@ void fill(Outcome& outcome, Detail detail, Read read) {
     outcome.format = journal.format();
     if (detail == Detail::All) {
       outcome.notes = journal.notes();
-      outcome.furtherSteps = journal.furtherSteps();
+      outcome.unnotedSteps = journal.furtherSteps();
     }
   } catch (std::exception const& error) {
     outcome.problem = reason::failure(error);
