@@ -14,8 +14,8 @@ constexpr unsigned kMaxJobs = 256;
 void addFields(std::string const& list, Fields& fields);
 void setSort(Form& form, std::string const& name);
 void addConditions(std::vector<std::string> const& texts, Form& form);
-/// Drops slashes at a glob's end. For a glob with a slash elsewhere, which is matched with whole
-/// paths, adds a second one that matches their ends.
+/// Appends the globs, without slashes at their ends. One with a slash in it, such as a/b, is
+/// matched with whole paths, so */a/b is appended too, which matches it in any folder.
 void addExcluded(std::vector<std::string> const& globs, std::vector<std::string>& excluded);
 /// Whether the choice is `trueWord`, such as "show". The only other is `falseWord`, such as "skip".
 bool choose(std::string const& option, std::string const& choice, char const* falseWord,

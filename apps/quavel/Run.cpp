@@ -151,10 +151,11 @@ void Runner::emitOldest() {
 
 void Runner::emit(Outcome&& outcome) {
   Form const& form = options_.form;
-  // Not `outcome.record`, which `prepare` may have dropped.
+  // Not `outcome.record`, which the writer's `prepare` may have dropped.
   progress_.count(/*hasRecord=*/!outcome.problem, outcome.isShown);
-  // The text of --why says it anyway. Programs have the field `error`; with --quiet, they get
-  // nothing else of a shown file, even if --fields leaves it out.
+  // The message is dropped if the output shows the file and tells the reason. The text of --why
+  // does. JSON and CSV do so in the field `error`, but people may want the message too unless
+  // --quiet is given; it then drops the message even if --fields leaves `error` out.
   bool const isMessageDropped = form.isData() ? options_.isQuiet : form.isExplanation();
   if (outcome.problem && !(outcome.isShown && isMessageDropped)) {
     console_.printFileMessage(outcome.path, outcome.problem.text);

@@ -29,8 +29,8 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes why an Exif directory's size may not count: a side is missing, too small or too large. The
-/// note is shown only if the record gets no size.
+/// Notes, for any image size that an Exif directory declares, why it would not be used: a side is
+/// missing, too small or too large. The note is shown only if the record gets no size.
 void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

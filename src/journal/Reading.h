@@ -19,8 +19,8 @@ enum class Work : std::uint8_t { Directories, Entries, Values, SegmentsAndBoxes 
 inline constexpr std::array<std::uint64_t, 4> kMaxWork = {
     std::uint64_t{1} << 14U,  // directories: each takes up to a dozen reads from the file
     std::uint64_t{1} << 24U,  // entries walked over
-    std::uint64_t{1} << 20U,  // values: they and their directories take less than 32 MB of memory
-    std::uint64_t{1} << 24U,  // segments, boxes: zeros in a JPEG read as one every 2 bytes
+    std::uint64_t{1} << 20U,  // values: with all directories, they take less than 32 MB of memory
+    std::uint64_t{1} << 24U,  // segments and boxes: in a JPEG, every 2 zeros count as a segment
 };
 
 /// One read of a file: the work done so far, and the journal.

@@ -47,7 +47,7 @@ bool EntryTable::read(QVStream& stream, WantedTags& wanted) {
   values_.reserve(kReservedValues);
   EntryWalk walk(stream, entryCount_, position_ + kEntryCountSize);
   for (; !walk.isAtEnd() && !wanted.allMet(); walk.advance()) {
-    if (!walk.bufferTag()) {
+    if (!walk.bufferEntry()) {  // not even the tag is there
       return refuseCut(journal_, walk.position(), kEntryTagSize, "entry {} of {} of {}",
                        walk.number(), entryCount_, placed());
     }

@@ -36,9 +36,12 @@ class EntryWalk {
   /// Where the current entry begins in the file.
   std::int64_t position() const { return firstPosition_ + kSignedEntrySize * passed(); }
 
-  /// Buffers the current entry's tag, which may move the stream. False: the data ends within it.
-  /// `parseRest` need not read more: the rest of an entry is only missing where the data ends.
-  bool bufferTag() { return isBufferedUpTo(kEntryTagSize) || fillBuffer(); }
+  /// Buffers the current entry, which may move the stream. False: the data ends within its tag.
+  bool bufferEntry() {
+    // The buffer is filled with whole entries: if it has this one's tag, it has all of the entry
+    // that the data has.
+    return isBufferedUpTo(kEntryTagSize) || fillBuffer();
+  }
 
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 

@@ -25,8 +25,8 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   // No more is read than is used: the stream must stand where a value in the field ends.
   entry.fieldBytesRead = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Up to 4 bytes are in the field: hosts get those that could be read, even if this then fails.
-    // Of more bytes, the field has the offset.
+    // Up to 4 bytes are in the field itself: hosts get those that could be read, even though `read`
+    // then fails. For more bytes, the field has the offset, which is of use only if it is whole.
     if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
       storeUndefined(entry.count, undefinedBytesOrOffset(entry, needsReversal(*stream)), *this);
     }

@@ -24,7 +24,8 @@ class Source {
   /// Throws std::system_error when the list cannot be opened. Keeps a reference to the inputs.
   Source(Inputs const& inputs, Report report);
 
-  /// Whether `next` can begin without waiting for the process that writes the list.
+  /// Whether `next` can begin without waiting for the process that writes the list. It may still
+  /// wait for the rest of a path.
   bool isReady();
   /// The next file, or a folder or list that cannot be read, with its problem. False: the end.
   bool next(Input& input);

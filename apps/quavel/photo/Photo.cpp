@@ -131,7 +131,8 @@ std::string whyUnknown(std::string const& extension) {
 }
 
 std::string photoExtensions() {
-  // The library lists them only where it refuses another: "... these name a format: tiff tif ...".
+  // The library lists the extensions only where it refuses an unknown one: "... these name a
+  // format: tiff tif ...".
   std::string const refusal = whyUnknown("");
   return refusal.substr(refusal.rfind(": ") + 2);
 }

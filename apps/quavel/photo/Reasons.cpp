@@ -77,6 +77,7 @@ Problem failure(std::exception const& error) {
 Problem refusal(QVJournal const& journal) {
   quavel::QVNote const& note = *journal.refusal();
   std::string lead = leadOf(note.reason);
+  // The hint that the file looks like another format is among the notes with any `Detail`.
   for (auto const& other : journal.notes()) {
     if (other.reason == QVReason::OtherContent) {
       lead = other.text + ": ";
