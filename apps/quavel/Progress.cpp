@@ -131,7 +131,7 @@ std::string Progress::line(double seconds) const {
 
 void Progress::sumUp() {
   std::size_t const files = records_ + failures_;
-  // For a single file, a summary adds nothing to the record or to the explanation of --why.
+  // Of a single file, the output has said all: the record or, with --why, why there is none.
   bool const isOutputEnough = files == 1 && (failures_ == 0 || options_.form.isExplanation());
   if (options_.isQuiet || isOutputEnough) {
     return;

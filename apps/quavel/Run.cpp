@@ -42,7 +42,7 @@ class Runner {
   Progress progress_;
   Pipeline pipeline_;  // destroyed before the members above, which its threads use
   std::size_t batchSize_ = 1;
-  bool isErrorHintDue_;  // --fields leaves `error` out of the CSV: to be said once
+  bool isErrorHintDue_;  // it is to be said that the CSV has no `error` (JSON always has)
 };
 
 Runner::Runner(Options const& options, Output& output, Console& console)
@@ -80,7 +80,7 @@ int Runner::runSource(Source& source) {
   while (true) {
     if (!source.isReady()) {  // show all there is while the next path is awaited
       emitAll();
-      writer_->pause();
+      writer_->writeHeldBack();
       output_.flush();
     }
     auto batch = nextBatch(source);

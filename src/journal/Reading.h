@@ -35,7 +35,7 @@ class Reading {
 
   Journal* journal = nullptr;  ///< Null: no notes are wanted.
 
-  /// False: the record may be of a host's class, which needs each directory's public `entries`.
+  /// False: the record's class may be derived by a host, and so need directories' public `entries`.
   bool isLibraryRecord = false;
 
  private:
@@ -49,7 +49,8 @@ class ReadScope {
  public:
   /// For a public operation: begins a read, or joins the one during which it was called.
   static ReadScope beginOrJoin(QVStream& stream) { return ReadScope(stream); }
-  /// For `readStream` (Formats.h): always begins a read, of a record of the library's own class.
+  /// For `readStream` (Formats.h): always begins a read, as it has a journal of its own. The
+  /// record's class is one of the library's.
   static ReadScope begin(QVStream& stream, Journal* journal) { return {stream, journal}; }
 
   ~ReadScope() { stream_.reading_.current = outer_; }

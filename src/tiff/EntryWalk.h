@@ -46,15 +46,15 @@ class EntryWalk {
   unsigned short tag() const { return numberIn<std::uint16_t>(0); }
 
   /// Takes what follows the tag. False: the data ends within the type or the count.
-  bool parseRest(RawEntry* entry) const {
+  bool parseRest(RawEntry* rest) const {
     if (!isBufferedUpTo(kEntryFieldPosition)) {
       return false;
     }
-    entry->typeCode = numberIn<std::uint16_t>(kEntryTypePosition);
-    entry->count = numberIn<std::uint32_t>(kValueCountPosition);
-    entry->field = entry_ + kEntryFieldPosition;
-    auto const available = static_cast<std::size_t>(bufferEnd_ - entry->field);
-    entry->fieldBytesRead = std::min(available, kEntryFieldSize);
+    rest->typeCode = numberIn<std::uint16_t>(kEntryTypePosition);
+    rest->count = numberIn<std::uint32_t>(kValueCountPosition);
+    rest->field = entry_ + kEntryFieldPosition;
+    auto const available = static_cast<std::size_t>(bufferEnd_ - rest->field);
+    rest->fieldBytesRead = std::min(available, kEntryFieldSize);
     return true;
   }
 

@@ -6,7 +6,7 @@ namespace app::rows {
 
 namespace {
 
-constexpr std::size_t kLeastWidth = 3;          // of a chosen field's column, in cells
+constexpr std::size_t kLeastWidth = 3;          // of a chosen field's column when shortened
 constexpr std::size_t kLeastPathWidth = 8;      // the same for the path's column
 constexpr std::size_t kDateColumn = 1;          // its index among the default columns
 constexpr std::size_t kDayEnd = 10;             // where the day ends in a date: "2018-02-21"
@@ -14,7 +14,8 @@ constexpr std::size_t kMinuteEnd = 16;          // where the minute ends: "2018-
 constexpr std::size_t kDateWidth = kMinuteEnd;  // of the column, in cells
 
 std::vector<Column> defaultColumns() {
-  // Label, least width, rank (the highest is left out first, 0 never), keeps its end when cut.
+  // Label, least width when shortened, rank (the highest is left out first, 0 never), keeps its
+  // end.
   return {{"File", 20, 0, true},     {"Captured", kDateWidth, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},           {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};

@@ -38,7 +38,7 @@ class Table : public Writer {
 
   void prepare(Outcome& outcome) const override;
   void add(Outcome&& outcome) override;
-  void pause() override;
+  void writeHeldBack() override;
   void end() override;
 
  private:
@@ -109,7 +109,7 @@ void Table::add(Outcome&& outcome) {
   }
 }
 
-void Table::pause() {
+void Table::writeHeldBack() {
   if (isTerminal_ && files_ > 1) {
     writePage(/*isLast=*/false);
   }

@@ -20,7 +20,7 @@ class Writer {
   /// Takes a prepared outcome, in the order of the output.
   virtual void add(Outcome&& outcome) = 0;
   /// Writes what is held back. Called when the next outcome may take a while.
-  virtual void pause() {}
+  virtual void writeHeldBack() {}
   virtual void end() {}
 };
 
