@@ -25,16 +25,17 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   if (!readingOf(*stream).spend(Work::SegmentsAndBoxes, 1)) {
     return false;
   }
-  bool const isInReach = start <= kLastOffset;
-  if (!isInReach || !header.read(stream)) {
+  bool const mayReadHere = start <= kLastOffset;  // always, where `long` has 64 bits
+  if (!mayReadHere || !header.read(stream)) {
     // The header should be where the previous box ends. The stream may stand before that:
-    // `leaveBox` stops at `kOutOfReach`, a memory stream at its end.
+    // `leaveBox` stops at `kLastBoxEnd`, a memory stream at its end.
     std::int64_t const nextBox = std::max(std::int64_t{start}, context.previousEnd);
     return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
                      "the header of the next box{}", context);
   }
   // A size below the header's would lead the walk back to this box, or into its header. The
-  // standard gives 0 and 1 a meaning; they are refused too, as no metadata follows such a box.
+  // standard gives 0 and 1 a meaning; they are refused too, as cameras write no such box before the
+  // metadata.
   if (header.boxSize < box::kHeaderSize) {
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",

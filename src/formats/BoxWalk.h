@@ -25,11 +25,11 @@ struct PlacedBox {
 };
 void append(std::string& out, PlacedBox box);
 
-/// A walk over boxes. Notes add to a box's name where it is: " in the moov box at 0x18 (24)".
+/// What notes say of a walk's boxes after the box's name: " in the moov box at 0x18 (24)".
 struct BoxContext {
-  char const* noteSuffix = "";   ///< Such as " in the ", with a parent.
+  char const* noteSuffix = "";   ///< Such as " in the " or " before a moov box was met".
   PlacedBox parent = {};         ///< Follows the suffix, unless its type is 0.
-  std::int64_t previousEnd = 0;  ///< Where the previous box ends by the size that it declares.
+  std::int64_t previousEnd = 0;  ///< The offset at which the previous box ends by its own size.
 };
 void append(std::string& out, BoxContext context);
 
@@ -40,13 +40,14 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// Where `leaveBox` stops if a box ends beyond all offsets. It is 1 less than the end that
-/// `endOfBox` then gives. If the outer box has that end too, the walk through it goes on from here
-/// and fails, as there is no data; at its end, it would pass for complete.
-inline constexpr long kOutOfReach = std::numeric_limits<long>::max() - 1;
+/// The highest offset to which `leaveBox` moves. For a box that ends beyond all offsets, `endOfBox`
+/// gives 1 more. A walk goes on while its offset is below the end of the box around it: in such a
+/// box, it goes on from here and fails for lack of data, instead of stopping as if all had been
+/// read.
+inline constexpr long kLastBoxEnd = std::numeric_limits<long>::max() - 1;
 
-/// Moves to the end of a box, but no further than `kOutOfReach`.
-inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kOutOfReach)); }
+/// Moves to the end of a box, but no further than `kLastBoxEnd`.
+inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kLastBoxEnd)); }
 
 }  // namespace detail
 }  // namespace quavel

@@ -43,7 +43,7 @@ bool Source::nextOfPaths(Input& input) {
       isWalkEmpty_ = true;
       continue;
     }
-    // If the path's extension names no format, the library refuses it.
+    // Any extension is taken: the library refuses those that name no format.
     input = {path, /*isRegular=*/exists && S_ISREG(status.st_mode), /*problem=*/{}};
     return true;
   }

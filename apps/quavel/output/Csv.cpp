@@ -45,7 +45,8 @@ TextMaker csvRowMaker(Form const& form, bool isForTerminal) {
       std::string text;
       appendExact(text, field->value(outcome));
       if (isForTerminal) {
-        // In `text`, a path has lost its bytes that are not UTF-8.
+        // In the text of a path, U+FFFD stands for bytes that are not UTF-8; a terminal can get
+        // them escaped.
         text = field->name == "path" ? escapedPath(outcome.path) : escaped(text);
       }
       row += quoted(text) + ',';

@@ -17,7 +17,7 @@ inline constexpr char kSpecialFile[] = "special-file";
 inline constexpr char kBadPath[] = "bad-path";
 inline constexpr char kUnreadableFolder[] = "unreadable-folder";
 inline constexpr char kUnreadableList[] = "unreadable-list";
-inline constexpr char kTooLong[] = "too-long";  // the photo on standard input
+inline constexpr char kTooLong[] = "too-long";  // more than 1 GiB on standard input
 inline constexpr char kOutOfMemory[] = "out-of-memory";
 inline constexpr char kUnexpected[] = "unexpected";
 

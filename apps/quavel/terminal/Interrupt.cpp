@@ -70,8 +70,8 @@ void handle(int signal) {
 
 void install() {
   struct sigaction action = {};
-  // Without SA_RESTART, a signal ends a blocked write. That in Output.cpp is not repeated before
-  // `leaveIfSignalled` has been called.
+  // `sa_flags` lacks SA_RESTART, so that a signal ends a blocked write. The one in Output.cpp is
+  // not repeated before `leaveIfSignalled` has been called.
   action.sa_handler = handle;
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);

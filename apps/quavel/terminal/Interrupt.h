@@ -51,8 +51,8 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// Ends the process now, not when the WriteScope does, if a signal has arrived. Only to be called
-/// while none of the scope's bytes are written, or all of them, so that no line is cut.
+/// If a signal has arrived, ends the process now instead of at the end of the WriteScope. Only to
+/// be called while none of the scope's bytes are written, or all of them, so that no line is cut.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt
