@@ -218,13 +218,17 @@ class Endings(CommandTest):
         self.assertEqual(process.wait(60), -signal.SIGINT)
 
     def test_records_come_before_the_list_ends_and_ignored_interrupts_stay_ignored(self):
-        with self.start("-q", "--jsonl", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
+        os.makedirs(os.path.join(self.folder, "walked", "z"))  # nothing is found in z, the last
+        for name in ("walked/b.tif", "walked/c.tif"):
+            self.put(name, photo())
+        with self.start("-q", "--jsonl", "walked", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
                         preexec_fn=lambda: signal.signal(signal.SIGINT, signal.SIG_IGN)) as process:
-            for _ in range(3):
-                process.stdin.write(b"a.tif\n")
-                process.stdin.flush()
+            for name in ["walked/b.tif", "walked/c.tif"] + 3 * ["a.tif"]:
                 self.assertTrue(select.select([process.stdout], [], [], 60)[0])
-                self.assertEqual(json.loads(process.stdout.readline())["path"], "a.tif")
+                self.assertEqual(json.loads(process.stdout.readline())["path"], name)
+                if name != "walked/b.tif":
+                    process.stdin.write(b"a.tif\n")
+                    process.stdin.flush()
                 process.send_signal(signal.SIGINT)
             process.send_signal(signal.SIGTERM)
             self.assertEqual(process.wait(60), -signal.SIGTERM)

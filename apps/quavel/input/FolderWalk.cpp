@@ -78,10 +78,10 @@ bool FolderWalk::visitLinkOrUnknown(unsigned char type, std::string path, Input&
       report_(path, "is a symbolic link that leads to itself; skipped");
       return false;
     }
-    // Reading the photo will give the reason, such as that the link is dangling.
     if (!isPhotoExtension(extensionOf(path))) {
       return false;
     }
+    // Reading the photo will give the reason, such as that the link is dangling.
     input = {std::move(path), /*isRegular=*/false, {}};
     return true;
   }
@@ -137,7 +137,7 @@ bool FolderWalk::isExcluded(std::string const& folder, std::string_view name) co
   return std::any_of(filter_.excluded.begin(), filter_.excluded.end(), [&](auto const& glob) {
     bool const isForPaths = glob.find('/') != std::string::npos;
     std::string const candidate = (isForPaths ? folder : std::string()) + std::string(name);
-    return ::fnmatch(glob.c_str(), candidate.c_str(), /*flags=*/0) == 0;
+    return ::fnmatch(glob.c_str(), candidate.c_str(), /*flags=*/0) == 0;  // `*` also matches "/"
   });
 }
 
@@ -156,7 +156,7 @@ void FolderWalk::readEntries(DIR* folder, Level& level) {
     errno = 0;
   }
   if (errno != 0) {
-    setUnreadable(level.path, errno);  // the photos found so far are read all the same
+    setUnreadable(level.path, errno);  // those photos that were found are read all the same
   }
   char const* const names = level.names.data();
   std::sort(level.entries.begin(), level.entries.end(), [names](Entry const& a, Entry const& b) {

@@ -14,10 +14,24 @@ Source::Source(Inputs const& inputs, Report report) : inputs_(inputs), report_(s
 }
 
 bool Source::isReady() {
-  return walk_ || nextPath_ < inputs_.paths.size() || !list_ || list_->isReady();
+  if (!list_ || list_->isReady() || ahead_) {
+    return true;
+  }
+  Input input;
+  if (nextOfPaths(input)) {  // a walk does not know whether there is more before it finds it
+    ahead_ = std::move(input);
+  }
+  return ahead_.has_value();
 }
 
-bool Source::next(Input& input) { return nextOfPaths(input) || nextOfList(input); }
+bool Source::next(Input& input) {
+  if (ahead_) {
+    input = std::move(*ahead_);
+    ahead_.reset();
+    return true;
+  }
+  return nextOfPaths(input) || nextOfList(input);
+}
 
 bool Source::nextOfPaths(Input& input) {
   while (walk_ || nextPath_ < inputs_.paths.size()) {

@@ -15,7 +15,7 @@ struct Inputs {
   std::vector<std::string> paths;
   std::string list;             ///< A file of paths; "-": standard input; empty: none.
   bool isNulSeparated = false;  ///< The list: its paths end with a NUL, not with a line feed.
-  Filter filter;                ///< For the folders among the paths.
+  Filter filter;                ///< For what is found in folders; what is named itself is read.
 };
 
 /// The files that the inputs name, in their order: paths, then the list.
@@ -37,11 +37,12 @@ class Source {
 
   Inputs const& inputs_;
   Report report_;
+  std::optional<Input> ahead_;  // what `isReady` has found already
   std::size_t nextPath_ = 0;
   std::optional<FolderWalk> walk_;  // through the folder `inputs_.paths[nextPath_ - 1]`
   bool isWalkEmpty_ = true;         // so far
   bool isCrlfReported_ = false;     // that the list's lines end with CR LF
-  std::optional<PathList> list_;
+  std::optional<PathList> list_;    // none: none was named, or it has ended
 };
 
 }  // namespace app
