@@ -4,6 +4,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <ctime>
 #include <exception>
@@ -19,7 +20,6 @@ namespace {
 
 using quavel::QVJournal;
 
-constexpr std::size_t kDateSize = 19;
 constexpr std::size_t kMaxInput = std::size_t{1} << 30;  // bytes on standard input
 
 Problem whyNotRegular(mode_t mode) {
@@ -63,18 +63,20 @@ std::string readAll(Problem& problem) {
 }
 
 bool isDate(std::string const& text) {
+  constexpr std::string_view kForm = "0000:00:00 00:00:00";  // 0: any digit
+  bool const isWellFormed =
+      std::equal(text.begin(), text.end(), kForm.begin(), kForm.end(),
+                 [](char c, char form) { return form == '0' ? '0' <= c && c <= '9' : c == form; });
   std::tm time = {};
-  char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
+  if (!isWellFormed || ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time) == nullptr) {
+    return false;
+  }
   std::tm day = {};  // the date alone: a leap second would carry into the next day
   day.tm_year = time.tm_year;
   day.tm_mon = time.tm_mon;
   day.tm_mday = time.tm_mday;
   ::timegm(&day);  // turns a day that does not exist, such as 30 February, into a later one
-  bool const isWhole = text.size() == kDateSize && end == text.c_str() + kDateSize;
-  // strptime accepts any number of blanks before a number.
-  bool const hasOneBlank = text.find(' ') == 10 && text.rfind(' ') == 10;
-  bool const isReal = day.tm_mday == time.tm_mday && time.tm_sec <= 60;  // strptime accepts 61
-  return isWhole && hasOneBlank && isReal;
+  return day.tm_mday == time.tm_mday && time.tm_sec <= 60;  // `strptime` accepts 61
 }
 
 /// Fills the outcome from what `read` returns, unless it has a problem already. `read` may also set
@@ -96,6 +98,7 @@ void fill(Outcome& outcome, Detail detail, Read read) {
       outcome.unnotedSteps = journal.furtherSteps();
     }
   } catch (std::exception const& error) {
+    outcome.record = nullptr;
     outcome.problem = reason::failure(error);
   }
 }
