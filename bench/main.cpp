@@ -114,13 +114,14 @@ void printNotes(Seconds const& seconds, std::vector<Sample> const& samples) {
   for (std::string const what : {"path", "memory", "floor"}) {
     std::cout << " " << what << " " << seconds.at(what + " on 1") / seconds.at(what + " on 2");
   }
-  std::cout << "\n\nNot counted at 1 GB, for it takes more than a second:";
+  std::string slow;
   for (auto const& sample : samples) {
     if (sample.values.count("padded calls") == 0) {
-      std::cout << " " << sample.path.substr(sample.path.rfind('/') + 1);
+      slow += " " + sample.path.substr(sample.path.rfind('/') + 1);
     }
   }
-  std::cout << "\n";
+  std::cout << "\n\nNot counted at 1 GB, for it takes more than a second:"
+            << (slow.empty() ? " none" : slow) << "\n";
 }
 
 /// Many repetitions of all benchmarks in random order spread the machine's noise evenly. The user's

@@ -25,7 +25,7 @@ namespace quavel::detail {
 namespace {
 
 /// Memory for a record of any class, as none adds members to QVMetadata. One storage type keeps
-/// the library small: `make_shared` is compiled once instead of ten times.
+/// the library small: `make_shared` is compiled once, not for each class.
 struct RecordStorage {
   RecordStorage() {}  // with `= default`, `make_shared` would set the bytes to zero
   ~RecordStorage() { record->~QVMetadata(); }
