@@ -10,14 +10,13 @@ namespace quavel {
 struct QVJPEGImage::WalkState {
   bool sawAPP1 = false;  ///< An APP1 segment, Exif or not.
   bool sawSOF0 = false;
-  bool sawExif = false;            ///< An Exif segment, which was read.
-  unsigned short frameWidth = 0;   ///< The greatest width of all SOF0 segments met.
-  unsigned short frameHeight = 0;  ///< The greatest height.
-  std::int64_t nextOffset = 0;     ///< Of the next segment, from the stream's `baseOffset`.
-  // For notes only. The numbers are positions of segments in the file; -1: none was met.
-  std::int64_t position = 0;  ///< The segment being read.
-  /// The SOF0 that last made `frameWidth` or `frameHeight` greater. If all declare 0 x 0: the
-  /// first.
+  unsigned short frameWidth = 0;   ///< The greatest width in any SOF0 segment.
+  unsigned short frameHeight = 0;  ///< The greatest height, maybe in another one.
+  std::int64_t nextOffset = 0;     ///< Of the next segment; `baseOffset` is the same for all.
+  // For notes, when there is a journal. The numbers are positions in the file; -1: not met.
+  bool sawExif = false;        ///< An Exif segment, which was read.
+  std::int64_t position = -1;  ///< The segment being read; set for each.
+  /// The SOF0 that last made `frameWidth` or `frameHeight` greater. If all are 0 x 0: the first.
   std::int64_t sof0Position = -1;
   std::int64_t sof2Position = -1;       ///< The last SOF2 before the first SOS.
   std::int64_t firstScanPosition = -1;  ///< The first SOS.
@@ -29,8 +28,8 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes, for any image size that an Exif directory declares, why it would not be used: a side is
-/// missing, at most 500 or not below 2^31. The note is shown only if the record gets no size.
+/// Notes what size an Exif directory gives. It counts only if both sides are there, above 500 and
+/// below 2^31. The note is shown only if the record gets no size.
 void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

@@ -14,6 +14,7 @@ bool QVCR3CMT1Box::read(std::shared_ptr<QVStream>& stream) {
 
 bool QVCR3CMT1Box::readExif(std::shared_ptr<QVStream>& stream) {
   auto const scope = ReadScope::beginOrJoin(*stream);
+  // What CMT1 holds is a TIFF structure with a main directory, despite the function's name.
   // Nothing uses ExifIFDPointer, SubIFDs and NewSubfileType. They are listed to be checked: if one
   // of these entries is malformed, so may the rest be, and the box is refused.
   auto const mainIFD =

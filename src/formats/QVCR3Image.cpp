@@ -13,7 +13,7 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   auto const scope = ReadScope::beginOrJoin(*stream);
   isRaw = true;
 
-  BoxContext context = {/*noteSuffix=*/" before a moov box was met"};
+  BoxContext context = {/*noteSuffix=*/" before a moov box was met"};  // of notes on these boxes
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;

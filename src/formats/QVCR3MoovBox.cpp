@@ -23,7 +23,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   long const end = endOfBox(start, *boxHeader);
 
   bool const isRead = readChildren(stream, start, end);
-  leaveBox(*stream, end);  // after a failure too
+  leaveBox(*stream, end);  // after a failure too: a host may go on with the next box
   return isRead;
 }
 

@@ -33,9 +33,9 @@ constexpr int kMaxThumbnailSide = 500;
 constexpr std::array<std::uint8_t, 4> kExifIdentifier = {'E', 'x', 'i', 'f'};
 
 // Bytes to skip after the markers whose length is not read. After DRI: its length and interval.
-// After a marker without payload: 2 bytes. They may be the next marker, but these are the numbers
-// that the public map below gives to hosts. The walk uses this array, as the map may not be
-// initialised yet when a host's static object reads a file.
+// After a marker without payload: 2 bytes, even if the next marker is there, because the public map
+// below has always given these numbers. The walk uses this array, as the map may not be initialised
+// yet when a host's static object reads a file.
 constexpr std::array<std::pair<std::uint16_t, std::uint16_t>, 11> kFixedSkips = {{
     {0xffd8, 2},  // SOI
     {0xffdd, 4},  // DRI
@@ -56,7 +56,7 @@ bool seekNext(QVStream& stream, std::int64_t offset) {
                                            kMarkerSize, "the marker of the next segment");
 }
 
-/// What the walk has not met. It has not met both APP1 and SOF0: it would have ended.
+/// Which of the two segments that together end the walk were not met; at least one was not.
 char const* missingSegments(bool sawAPP1, bool sawSOF0) {
   if (sawAPP1) {
     return "SOF0";
@@ -164,7 +164,7 @@ bool QVJPEGImage::readAPP1(std::shared_ptr<QVStream>& stream, WalkState& walk) {
     stream->baseOffset = outerBase;
     walk.sawExif = true;
   }
-  walk.sawAPP1 = true;  // even if it is not Exif: with SOF0 too, the walk ends
+  walk.sawAPP1 = true;  // even if it is not Exif: once SOF0 is met too, the walk ends
   return true;
 }
 

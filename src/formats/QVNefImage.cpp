@@ -13,7 +13,7 @@ namespace {
 // cameras write a different size; their files are refused.
 constexpr std::int32_t kThumbnailWidth = 160;
 constexpr std::int32_t kThumbnailHeight = 120;
-constexpr char kThumbnailRule[] = "a NEF's first directory must be 160 x 120";
+constexpr char kThumbnailRuleText[] = "a NEF's first directory must be 160 x 120";
 
 }  // namespace
 
@@ -46,14 +46,14 @@ bool QVNefImage::read(std::shared_ptr<QVStream>& stream) {
 bool QVNefImage::storeInfoFromMainIFD(std::shared_ptr<QVTiffImageFileDirectory> const& ifd) {
   std::int32_t thumbnailWidth = 0;
   std::int32_t thumbnailHeight = 0;
-  if (!storeRequiredNumber(ifd, tag::ImageWidth, kThumbnailRule, thumbnailWidth) ||
-      !storeRequiredNumber(ifd, tag::ImageLength, kThumbnailRule, thumbnailHeight)) {
+  if (!storeRequiredNumber(ifd, tag::ImageWidth, kThumbnailRuleText, thumbnailWidth) ||
+      !storeRequiredNumber(ifd, tag::ImageLength, kThumbnailRuleText, thumbnailHeight)) {
     return false;
   }
   if (thumbnailWidth != kThumbnailWidth || thumbnailHeight != kThumbnailHeight) {
     return refuse(journalOf(ifd), QVReason::WrongImage, positionOf(ifd), "{} declares {} x {}; {}",
                   placed(ifd), static_cast<std::uint32_t>(thumbnailWidth),  // unsigned in the file
-                  static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRule);
+                  static_cast<std::uint32_t>(thumbnailHeight), kThumbnailRuleText);
   }
   return storeOptionalNumber(ifd, tag::Orientation, orientation);
 }

@@ -33,7 +33,8 @@ bool readSectionOffset(std::shared_ptr<QVStream>& stream, char const* section, l
   return true;
 }
 
-/// Whether a JPEG begins with SOI and an Exif segment, of any length (bytes 4 and 5).
+/// Whether a JPEG begins with SOI and an Exif segment. The segment's length, bytes 4 and 5, may be
+/// any.
 bool opensWithExif(std::array<std::uint8_t, kBytesBeforeTiffHeader> const& bytes) {
   return std::memcmp(bytes.data(), "\xff\xd8\xff\xe1", 4) == 0 &&
          std::memcmp(bytes.data() + 6, "Exif\0\0", 6) == 0;
@@ -42,7 +43,7 @@ bool opensWithExif(std::array<std::uint8_t, kBytesBeforeTiffHeader> const& bytes
 /// Notes what the embedded image begins with, if that may be why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
-  // `baseOffset` is still that of the TIFF header in the image.
+  // `baseOffset` is still at the TIFF header in the image, so this offset is negative.
   if (!wantsAllNotes(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
     return;
   }
@@ -76,7 +77,8 @@ bool QVRafImage::read(std::shared_ptr<QVStream>& stream) {
   if (!readSectionOffset(stream, "the embedded JPEG", kImageOffsetPosition, imageOffset)) {
     return false;
   }
-  // The sum has 32 bits, as all offsets in the file: beyond 4 GB, it wraps around.
+  // Added in 32 bits on purpose, as all offsets of the file have 32 bits: a sum beyond 4 GB, which
+  // only a damaged file has, wraps around.
   stream->baseOffset = imageOffset + kBytesBeforeTiffHeader;
   stream->setOffset(0);
   if (!readMainIFD(stream)) {

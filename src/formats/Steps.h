@@ -26,8 +26,8 @@ bool storeOptionalNumber(DirectoryPointer const& directory, unsigned short tag,
 bool storeRequiredNumber(DirectoryPointer const& directory, unsigned short tag, char const* rule,
                          std::int32_t& field);
 
-/// Stores the entry's text. No entry: true, the field untouched. A value not of type ASCII: false.
-/// No values, as for UNDEFINED: true, the text is empty.
+/// Stores the entry's text. No entry: true, the field untouched. An UNDEFINED entry, which has no
+/// values: true, the text is empty. Before a NUL, a value not of type ASCII: false.
 bool storeOptionalText(DirectoryPointer const& directory, unsigned short tag, std::string& field);
 
 /// Reads the directory at `offset`, counted from the TIFF header's start; null on failure.
@@ -73,7 +73,8 @@ inline bool isReducedImage(std::uint32_t newSubfileType) { return (newSubfileTyp
 bool storeFullImageSize(DirectoryPointer const& directory, std::int32_t& width,
                         std::int32_t& height);
 
-/// A directory, for notes to name. A host's has no name, but no note is composed of it either.
+/// A directory, for notes to name. A host's directory has no name; it has no journal either, so
+/// notes never come to speak of it.
 inline PlacedDirectory placed(DirectoryPointer const& directory) {
   static constexpr PartName kNoName = {};
   auto const* const ours = ReaderDirectory::of(*directory);

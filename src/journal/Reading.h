@@ -11,7 +11,8 @@ namespace quavel::detail {
 
 class Journal;
 
-/// Work that a file can make a read do many times over.
+/// Work that a file can make a read do many times over. `kMaxWork` and `refuseWork` have this
+/// order.
 enum class Work : std::uint8_t { Directories, Entries, Values, SegmentsAndBoxes };
 
 /// The most work of each kind in one read, far above what cameras' files need. The formats
@@ -58,6 +59,7 @@ class ReadScope {
   ReadScope& operator=(ReadScope const&) = delete;
 
   Reading& reading() const { return *stream_.reading_.current; }
+  /// The read that a stream serves, or null. (A stream shows it to this class only.)
   static Reading* current(QVStream const& stream) { return stream.reading_.current; }
 
  private:
@@ -86,8 +88,8 @@ inline Journal* journalOf(QVStream const& stream) {
   return reading == nullptr ? nullptr : reading->journal;
 }
 
-/// Tells the journal how `readBuffer` went. It failed if `delivered` < 0; `error` is then its
-/// `errno`, or 0 if that is not known.
+/// Tells the journal how `readBuffer` went. If `delivered` < 0, it failed; `error` is then its
+/// `errno`, or 0 if that is not known. Otherwise, an earlier failure no longer counts.
 void noteReadResult(QVStream const& stream, std::int64_t delivered, int error);
 
 /// Where the stream stands in the file.

@@ -29,7 +29,8 @@ struct HexCode {
   std::uint16_t value;
 };
 
-/// Text of the file: printable ASCII as it is, any other byte like "\x1b".
+/// Text of the file, for quotation marks around it: printable ASCII as it is, other bytes like
+/// \x1b.
 struct QuotedBytes {
   std::uint8_t const* bytes;
   std::size_t count;

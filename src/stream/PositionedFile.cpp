@@ -44,7 +44,7 @@ PositionedFile::PositionedFile(std::string const& path) : QVFStream(path) {}
 std::int64_t PositionedFile::readTimed(std::uint8_t* destination, std::size_t count) {
   int const filesLeft = filesToAdvise.load(std::memory_order_relaxed);
   if (filesLeft > 0) {
-    file::expectFewReads(fd);
+    file::adviseNoReadAhead(fd);
   }
   auto const start = std::chrono::steady_clock::now();
   std::int64_t const delivered = file::readAt(fd, destination, count, position_);
@@ -57,7 +57,7 @@ std::int64_t PositionedFile::readTimed(std::uint8_t* destination, std::size_t co
 
 std::int64_t PositionedFile::readUntimed(std::uint8_t* destination, std::size_t count) {
   if (reads_ >= kReadsOfAWalk && position_ >= fetchEnd_) {
-    file::expectReads(fd, position_, kFetchSize);
+    file::adviseToFetch(fd, position_, kFetchSize);
     fetchEnd_ = position_ + kFetchSize;
   }
   return file::readAt(fd, destination, count, position_);
@@ -102,8 +102,8 @@ long PositionedFile::getOffset() {
 
 void PositionedFile::setOffset(long const& offset) {
   std::int64_t const target = wrappingSum(baseOffset, offset);  // hosts may set any `baseOffset`
-  // Reads state their position, so there is no need to seek. But the file system may refuse a high
-  // position: then this must stay where it is, as QVFStream does.
+  // Reads state their position, so a seek is only tried to learn whether the file system accepts a
+  // high one. If not, the stream stays where it is, as QVFStream does.
   if (target >= 0 && (target <= kMaxUncheckedSeek || file::seek(fd, target) == target)) {
     position_ = target;
   }

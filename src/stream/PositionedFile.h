@@ -12,10 +12,11 @@ namespace quavel::detail {
 inline constexpr std::int64_t kMaxUncheckedSeek = 0x7fffffff;
 
 /// A file for a few scattered reads. Each read states its position, so that a seek needs no system
-/// call. Many reads are taken for a walk to the file's end: then the system is advised to fetch
-/// what follows. If the first read is slow, files come from the disk, not from the system's cache:
-/// then, for the files opened next, the system is advised not to read ahead. A pipe is read front
-/// to back only.
+/// call. A pipe is read front to back only.
+///
+/// The system gets advice. After many reads of a file, a walk to its end is assumed: the system is
+/// to fetch what follows. A slow first read of a file is taken as a sign that files come from the
+/// disk, not from the system's cache: in files that are opened next, it is not to read ahead.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);

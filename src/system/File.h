@@ -61,19 +61,19 @@ inline std::int64_t size(int fd) {
 
 inline constexpr bool kTakesAdvice = true;
 
-/// Advises the system not to read ahead in the file: reads will be few and far apart.
-inline void expectFewReads(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
+/// Advises the system not to read ahead in the file, as reads will be few and far apart.
+inline void adviseNoReadAhead(int fd) { ::posix_fadvise(fd, 0, 0, POSIX_FADV_RANDOM); }
 
-/// Advises the system to fetch these `count` bytes now: they will be read soon.
-inline void expectReads(int fd, std::int64_t begin, std::int64_t count) {
+/// Advises the system to fetch these `count` bytes now, as they will be read soon.
+inline void adviseToFetch(int fd, std::int64_t begin, std::int64_t count) {
   ::posix_fadvise(fd, begin, count, POSIX_FADV_WILLNEED);
 }
 
 #else
 
 inline constexpr bool kTakesAdvice = false;
-inline void expectFewReads(int /*fd*/) {}
-inline void expectReads(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
+inline void adviseNoReadAhead(int /*fd*/) {}
+inline void adviseToFetch(int /*fd*/, std::int64_t /*begin*/, std::int64_t /*count*/) {}
 
 #endif  // POSIX_FADV_RANDOM
 

@@ -81,7 +81,7 @@ bool EntryTable::readEntry(QVStream& stream, unsigned short tag, std::int64_t po
                            RawEntry const& entry) {
   auto const firstValue = static_cast<std::uint32_t>(values_.size());
   Row row = {tag, entry.typeCode, entry.count, position, /*bytesOrOffset=*/0, firstValue};
-  if (!isKnown(entry.typeCode) || hasTooManyValues(entry) || !hasWholeField(entry)) {
+  if (!isKnown(entry.typeCode) || hasTooManyValues(entry) || !hasUsedFieldBytes(entry)) {
     return refuseEntry(row, entry);
   }
   if (entry.typeCode == kUndefinedCode) {

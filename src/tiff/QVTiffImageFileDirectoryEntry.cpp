@@ -22,18 +22,20 @@ bool QVTiffImageFileDirectoryEntry::read(std::shared_ptr<QVStream>& stream) {
   }
   std::array<std::uint8_t, kEntryFieldSize> field;
   entry.field = field.data();
-  // No more is read than is used: the stream must stand where a value in the field ends.
+  // Only the bytes that are used are read, as QVTiffImageFileDirectoryEntry.h says where the stream
+  // stands afterwards.
   entry.fieldBytesRead = readUpTo(*stream, field.data(), usedFieldSize(entry));
   if (entry.typeCode == kUndefinedCode) {
-    // Up to 4 bytes are in the field itself: hosts get those that could be read, even though `read`
-    // then fails. For more bytes, the field has the offset, which is of use only if it is whole.
-    if (entry.count <= kEntryFieldSize || hasWholeField(entry)) {
+    // Up to 4 bytes are in the field itself: hosts get as many as could be read, even if some are
+    // missing, which makes this function return false. For more bytes, the field has their offset,
+    // which is of use only if it is whole.
+    if (entry.count <= kEntryFieldSize || hasUsedFieldBytes(entry)) {
       storeUndefined(entry.count, undefinedBytesOrOffset(entry, needsReversal(*stream)), *this);
     }
-    return hasWholeField(entry);
+    return hasUsedFieldBytes(entry);
   }
   auto const block = std::make_shared<ValueBlock>();  // which all pointers in `values` share
-  if (!hasWholeField(entry) || !readValues(*stream, entry, *block)) {
+  if (!hasUsedFieldBytes(entry) || !readValues(*stream, entry, *block)) {
     return false;
   }
   values = listOf(block, /*first=*/0, block->size());

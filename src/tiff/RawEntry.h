@@ -61,8 +61,8 @@ inline std::size_t usedFieldSize(RawEntry const& entry) {
   return static_cast<std::size_t>(std::min<std::uint64_t>(sizeOfValues(entry), kEntryFieldSize));
 }
 
-/// Whether all the bytes of the field that the entry uses were read.
-inline bool hasWholeField(RawEntry const& entry) {
+/// Whether those bytes of the field were all read.
+inline bool hasUsedFieldBytes(RawEntry const& entry) {
   return entry.fieldBytesRead >= usedFieldSize(entry);
 }
 

@@ -48,7 +48,7 @@ void append(std::string& out, PartName const& part) {
 
 char const* fieldOf(unsigned short tag) {
   auto const* const row = findTag(tag);
-  bool const hasField = row != nullptr && row->field[0] != '\0';
+  bool const hasField = row != nullptr && row->field[0] != '\0';  // an empty array: none
   return hasField ? row->field : nullptr;
 }
 

@@ -14,8 +14,8 @@ constexpr std::size_t kMinuteEnd = 16;          // where the minute ends: "2018-
 constexpr std::size_t kDateWidth = kMinuteEnd;  // of the column, in cells
 
 std::vector<Column> defaultColumns() {
-  // Label, least width when shortened, rank (the highest is left out first, 0 never), keeps its
-  // end.
+  // Label, width below which it is not shortened, rank (the highest is left out first, 0 never),
+  // keeps its end.
   return {{"File", 20, 0, true},     {"Captured", kDateWidth, 1, false}, {"Size", 9, 6, false},
           {"Orient.", 7, 3, false},  {"Camera", 12, 2, false},           {"Lens", 12, 4, false},
           {"Exposure", 12, 5, false}};
