@@ -18,20 +18,21 @@ char const* meaningOf(std::uint32_t size) {
 
 }  // namespace
 
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header) {
-  Journal* const journal = journalOf(*stream);
-  long const start = stream->getOffset();
-  std::int64_t const position = wrappingSum(stream->baseOffset, start);
-  if (!readingOf(*stream).spend(Work::SegmentsAndBoxes, 1)) {
+bool BoxWalk::stepOver(QVCR3BoxHeader& header) {
+  QVStream& stream = *stream_;
+  Journal* const journal = journalOf(stream);
+  long const start = stream.getOffset();
+  std::int64_t const position = wrappingSum(stream.baseOffset, start);
+  if (!readingOf(stream).spend(Work::SegmentsAndBoxes, 1)) {
     return false;
   }
   bool const mayReadHere = start <= kLastOffset;  // always, where `long` has 64 bits
-  if (!mayReadHere || !header.read(stream)) {
+  if (!mayReadHere || !header.read(stream_)) {
     // The header should be where the previous box ends. The stream may stand before that:
-    // `leaveBox` stops at `kLastBoxEnd`, a memory stream at its end.
-    std::int64_t const nextBox = std::max(std::int64_t{start}, context.previousEnd);
-    return refuseCut(journal, wrappingSum(stream->baseOffset, nextBox), box::kHeaderSize,
-                     "the header of the next box{}", context);
+    // `leaveBox` stops before the largest `long`, and a memory stream at its end.
+    std::int64_t const nextBox = std::max(std::int64_t{start}, previousEnd_);
+    return refuseCut(journal, wrappingSum(stream.baseOffset, nextBox), box::kHeaderSize,
+                     "the header of the next box{}", place_);
   }
   // A size below the header's would lead the walk back to this box, or into its header. The
   // standard gives 0 and 1 a meaning; they are refused too, as cameras write no such box before the
@@ -39,11 +40,11 @@ bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3Bo
   if (header.boxSize < box::kHeaderSize) {
     return refuse(journal, QVReason::MalformedBox, position,
                   "the {}{} has size {}; at least its header's 8 bytes are wanted{}",
-                  PlacedBox{header.boxType, position}, context, header.boxSize,
+                  PlacedBox{header.boxType, position}, place_, header.boxSize,
                   meaningOf(header.boxSize));
   }
-  context.previousEnd = wrappingSum(start, header.boxSize);
-  leaveBox(*stream, endOfBox(start, header));
+  previousEnd_ = wrappingSum(start, header.boxSize);
+  leaveBox(stream, endOfBox(start, header));
   return true;
 }
 
@@ -62,10 +63,10 @@ void append(std::string& out, PlacedBox box) {
   append(out, Offset{box.position});
 }
 
-void append(std::string& out, BoxContext context) {
-  out += context.noteSuffix;
-  if (context.parent.type != 0) {
-    append(out, context.parent);
+void append(std::string& out, BoxPlace place) {
+  out += place.words;
+  if (place.parent.type != 0) {
+    append(out, place.parent);
   }
 }
 

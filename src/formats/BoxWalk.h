@@ -25,29 +25,38 @@ struct PlacedBox {
 };
 void append(std::string& out, PlacedBox box);
 
-/// What notes say of a walk's boxes after the box's name: " in the moov box at 0x18 (24)".
-struct BoxContext {
-  char const* noteSuffix = "";   ///< Such as " in the " or " before a moov box was met".
-  PlacedBox parent = {};         ///< Follows the suffix, unless its type is 0.
-  std::int64_t previousEnd = 0;  ///< The offset at which the previous box ends by its own size.
+/// Where a box is, as a note says it after the box's name: " in the moov box at 0x18 (24)".
+struct BoxPlace {
+  char const* words = "";  ///< Such as " in the " or " before a moov box was met".
+  PlacedBox parent = {};   ///< Follows the words, unless its type is 0.
 };
-void append(std::string& out, BoxContext context);
+void append(std::string& out, BoxPlace place);
 
-/// Reads the box header at the stream's position. Moves past the box and sets `previousEnd`.
-/// False: the header cannot be read, the size in it is below 8, or there are too many boxes.
-bool stepOverBox(std::shared_ptr<QVStream>& stream, BoxContext& context, QVCR3BoxHeader& header);
+/// A walk over consecutive boxes, of which the first begins at the stream's position.
+class BoxWalk {
+ public:
+  /// `place` is where notes say that the boxes are.
+  BoxWalk(std::shared_ptr<QVStream>& stream, BoxPlace place) : stream_(stream), place_(place) {}
+
+  /// Reads the header of the box at the stream's position, and moves past the box. False: the
+  /// header cannot be read, the size in it is below 8, or there are too many boxes.
+  bool stepOver(QVCR3BoxHeader& header);
+
+ private:
+  std::shared_ptr<QVStream>& stream_;
+  BoxPlace place_;
+  std::int64_t previousEnd_ = 0;  // the offset at which the previous box should end
+};
 
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
 
-/// The highest offset to which `leaveBox` moves. For a box that ends beyond all offsets, `endOfBox`
-/// gives 1 more. A walk goes on while its offset is below the end of the box around it: in such a
-/// box, it goes on from here and fails for lack of data, instead of stopping as if all had been
-/// read.
-inline constexpr long kLastBoxEnd = std::numeric_limits<long>::max() - 1;
-
-/// Moves to the end of a box, but no further than `kLastBoxEnd`.
-inline void leaveBox(QVStream& stream, long end) { stream.setOffset(std::min(end, kLastBoxEnd)); }
+/// Moves to the end of a box. If that is the largest `long`, stops 1 before it: an outer box may
+/// have the same end, and a walk through that must not take it for reached. It goes on, and fails
+/// as there is no data.
+inline void leaveBox(QVStream& stream, long end) {
+  stream.setOffset(std::min(end, std::numeric_limits<long>::max() - 1));
+}
 
 }  // namespace detail
 }  // namespace quavel

@@ -9,8 +9,8 @@ QVCR3Box::~QVCR3Box() = default;
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
   auto const scope = detail::ReadScope::beginOrJoin(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
-  detail::BoxContext context;  // without a suffix: notes name no box around this one
-  return detail::stepOverBox(stream, context, *boxHeader);
+  detail::BoxWalk walk(stream, /*place=*/{});  // notes do not say where this box is
+  return walk.stepOver(*boxHeader);
 }
 
 std::shared_ptr<QVCR3BoxHeader> QVCR3Box::header() const { return boxHeader; }

@@ -13,11 +13,11 @@ bool QVCR3Image::read(std::shared_ptr<QVStream>& stream) {
   auto const scope = ReadScope::beginOrJoin(*stream);
   isRaw = true;
 
-  BoxContext context = {/*noteSuffix=*/" before a moov box was met"};  // of notes on these boxes
+  BoxWalk walk(stream, /*place=*/{" before a moov box was met"});
   while (true) {
     long const boxStart = stream->getOffset();
     QVCR3BoxHeader header;
-    if (!stepOverBox(stream, context, header)) {
+    if (!walk.stepOver(header)) {
       return false;
     }
     PlacedBox const found = {header.boxType, stream->baseOffset + boxStart};

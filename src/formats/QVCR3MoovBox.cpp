@@ -28,11 +28,11 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3MoovBox::readChildren(std::shared_ptr<QVStream>& stream, long start, long end) {
-  BoxContext context = {/*noteSuffix=*/" in the ",
-                        /*parent=*/{box::Moov, stream->baseOffset + start}};
+  BoxPlace const place = {/*words=*/" in the ", /*parent=*/{box::Moov, stream->baseOffset + start}};
+  BoxWalk walk(stream, place);
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (!stepOverBox(stream, context, child)) {
+    if (!walk.stepOver(child)) {
       return false;
     }
     if (child.boxType != box::Uuid) {

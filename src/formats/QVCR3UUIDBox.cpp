@@ -53,10 +53,11 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
 }
 
 bool QVCR3UUIDBox::readChildren(std::shared_ptr<QVStream>& stream, long end) {
-  BoxContext context = {/*noteSuffix=*/" in the metadata ", /*parent=*/{box::Uuid, position_}};
+  BoxPlace const place = {/*words=*/" in the metadata ", /*parent=*/{box::Uuid, position_}};
+  BoxWalk walk(stream, place);
   QVCR3BoxHeader child;
   for (long childStart = stream->getOffset(); childStart < end; childStart = stream->getOffset()) {
-    if (!stepOverBox(stream, context, child)) {
+    if (!walk.stepOver(child)) {
       return false;
     }
     std::uint32_t const type = child.boxType;

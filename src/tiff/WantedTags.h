@@ -10,8 +10,8 @@
 
 namespace quavel::detail {
 
-/// The tags that a reader wants. Some, such as OffsetTimeOriginal, are not used but only checked:
-/// if their entry is malformed, so may the rest be, and the file is refused.
+/// The tags whose entries a reader looks at. Some, such as OffsetTimeOriginal, are not used but
+/// only checked: a malformed entry among them is a sign of damage, and the file is refused.
 using TagList = std::initializer_list<unsigned short>;
 
 /// The tags that are still wanted while a directory is read. A listed tag is wanted until it is

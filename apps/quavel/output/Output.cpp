@@ -90,7 +90,7 @@ void Output::finish() {
           std::exchange(tail_, nullptr)) {  // once, even if `giveUp` calls this again
     writeWhole(tail);
   }
-  interrupt::setTail(nullptr);  // not earlier: an interrupt within `writeWhole` needs the tail
+  interrupt::setTail(nullptr);  // not earlier: an interrupt before its first byte writes the tail
 }
 
 void Output::giveUp() noexcept {

@@ -12,7 +12,8 @@ class Console;
 /// Thrown when nobody reads the output any more.
 struct OutputClosed {};
 
-/// Standard output. What is added in one piece stays whole, even when the command is interrupted.
+/// Standard output. What is added in one piece stays whole, even when the command is interrupted
+/// (in a pipe, up to PIPE_BUF bytes).
 class Output {
  public:
   explicit Output(Console& console);

@@ -11,7 +11,8 @@ namespace app {
 bool isPrintableAscii(std::string_view text);
 /// A text from a file as UTF-8. If any of it is not valid UTF-8, all of it is taken for Latin-1.
 std::string textAsUtf8(std::string text);
-/// A file name as UTF-8: each byte that is not UTF-8, and each NUL, is replaced by U+FFFD.
+/// A file name as UTF-8: each byte that is not UTF-8, and each NUL, is replaced by U+FFFD. (A NUL
+/// is in a path from a list that is split at the wrong character.)
 std::string pathAsUtf8(std::string const& path);
 
 /// Makes visible all that could steer a terminal or mislead its reader: control characters, bytes
