@@ -47,7 +47,7 @@ class Progress {
   std::size_t shown_ = 0;
   std::thread totalCounter_;           // runs `countTotal`
   std::mutex mutex_;                   // guards `isEnding_`
-  std::condition_variable endSignal_;  // wakes `countTotal` from a pause
+  std::condition_variable endSignal_;  // ends a pause, in which `countTotal` leaves the disk alone
   bool isEnding_ = false;
   std::atomic<std::size_t> total_{0};  // how many files there are; 0: unknown
 };

@@ -25,8 +25,7 @@ class Runner {
 
  private:
   int runSource(Source& source);
-  std::unique_ptr<Batch> nextBatch(
-      Source& source) const;  // waits for its first file, for no further one
+  std::unique_ptr<Batch> nextBatch(Source& source) const;  // begins to wait for its first file only
   void work(Batch& batch) const;
   void prepare(Outcome& outcome) const;
   void emitOldest();

@@ -23,7 +23,8 @@
 namespace {
 
 /// Opens a folder in place of each closed standard stream, so that no photo gets the stream's
-/// descriptor. Reading a folder fails; from /dev/null, a list would seem to be empty.
+/// descriptor. Not /dev/null: a list of paths on standard input would then seem to be empty, while
+/// reading a folder fails.
 void holdStandardStreams() {
   int fd = -1;
   do {  // each `open` takes the lowest free descriptor

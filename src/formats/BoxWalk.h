@@ -7,6 +7,7 @@
 #include <memory>
 #include <string>
 
+#include "formats/BoxTypes.h"
 #include "journal/Journal.h"
 #include "journal/Reading.h"
 #include "stream/Bytes.h"
@@ -38,8 +39,9 @@ class BoxWalk {
   /// `place` is where notes say that the boxes are.
   BoxWalk(std::shared_ptr<QVStream>& stream, BoxPlace place) : stream_(stream), place_(place) {}
 
-  /// Reads the header of the box at the stream's position, and moves past the box. False: the
-  /// header cannot be read, the size in it is below 8, or there are too many boxes.
+  /// Reads the header of the box at the stream's position, and moves past the whole box; `enterBox`
+  /// goes back to its content. False: the header cannot be read, the size in it is below 8, or
+  /// there are too many boxes.
   bool stepOver(QVCR3BoxHeader& header);
 
  private:
@@ -50,6 +52,12 @@ class BoxWalk {
 
 /// The offset at which a box ends, or the largest `long` if the end is beyond all offsets.
 long endOfBox(long start, QVCR3BoxHeader const& header);
+
+/// Moves to the content of a box that begins at `start`. Its header has 8 bytes: one for a 64-bit
+/// size, of 16, was refused.
+inline void enterBox(QVStream& stream, long start) {
+  stream.setOffset(static_cast<long>(wrappingSum(start, box::kHeaderSize)));
+}
 
 /// Moves to the end of a box. If that is the largest `long`, stops 1 before it: an outer box may
 /// have the same end, and a walk through that must not take it for reached. It goes on, and fails

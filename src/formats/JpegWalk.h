@@ -28,8 +28,8 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes what size an Exif directory gives. It counts only if both sides are there, above 500 and
-/// below 2^31. The note is shown only if the record gets no size.
+/// Notes what size an Exif directory gives. To count, both sides must be above 500 and below 2^31.
+/// The note is shown only if the record gets no size.
 void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

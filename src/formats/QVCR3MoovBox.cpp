@@ -13,8 +13,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   if (!QVCR3Box::read(stream)) {
     return false;
   }
-  // Back into the box, which the base class has stepped over.
-  stream->setOffset(start + static_cast<long>(box::kHeaderSize));
+  enterBox(*stream, start);  // the base class has stepped over it
   PlacedBox const thisBox = {boxHeader->boxType, stream->baseOffset + start};
   if (thisBox.type != box::Moov) {
     return refuse(journalOf(*stream), QVReason::OtherKind, thisBox.position,
@@ -23,7 +22,7 @@ bool QVCR3MoovBox::read(std::shared_ptr<QVStream>& stream) {
   long const end = endOfBox(start, *boxHeader);
 
   bool const isRead = readChildren(stream, start, end);
-  leaveBox(*stream, end);  // after a failure too: a host may go on with the next box
+  leaveBox(*stream, end);  // even after a failure
   return isRead;
 }
 

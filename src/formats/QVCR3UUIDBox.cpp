@@ -35,9 +35,7 @@ bool QVCR3UUIDBox::read(std::shared_ptr<QVStream>& stream) {
   }
   long const end = endOfBox(start, *boxHeader);
 
-  stream->setOffset(
-      start + static_cast<long>(
-                  box::kHeaderSize));  // back from the box's end; headers of 16 bytes are refused
+  enterBox(*stream, start);
   for (auto& word : userType) {
     if (!stream->readLong(&word)) {
       return refuseCut(journal, thisBox.position + box::kHeaderSize, sizeof(userType),

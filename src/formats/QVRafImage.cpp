@@ -43,7 +43,7 @@ bool opensWithExif(std::array<std::uint8_t, kBytesBeforeTiffHeader> const& bytes
 /// Notes what the embedded image begins with, if that may be why its directories are not found.
 void noteOtherOpening(QVStream& stream, std::uint32_t imageOffset) {
   Journal* const journal = journalOf(stream);
-  // `baseOffset` is still at the TIFF header in the image, so this offset is negative.
+  // `baseOffset` is still at the TIFF header in the image: this offset is usually -12.
   if (!wantsAllNotes(journal) || !seek(stream, imageOffset - stream.baseOffset)) {
     return;
   }

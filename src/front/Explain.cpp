@@ -127,7 +127,7 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
-      // The wrong kind of file explains any refusal, except one because reading failed.
+      // The wrong kind of file explains any refusal but one for a limit, or because reading failed.
       for (QVNote& note : journal.notes) {
         if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
           note.reason = QVReason::OtherKind;

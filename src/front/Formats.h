@@ -35,7 +35,8 @@ Format const* formatOf(std::string_view extension);
 void noteAbsences(Format const& format, QVMetadata const& record, Journal& journal);
 
 /// If the refused file, which begins at `start`, looks like another format: notes which one, and
-/// replaces the refusal's reason by `OtherKind`. Only the reason `ReadError` is not replaced.
+/// replaces the refusal's reason by `OtherKind`. The reason `ReadError` stays, and so does
+/// that of a limit.
 void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start, Journal& journal);
 
 /// The record of the file at a path, or null. The journal may be null, here and below.

@@ -37,7 +37,7 @@ std::shared_ptr<QVMetadata> QVJournal::read(std::string const& path) {
 std::shared_ptr<QVMetadata> QVJournal::read(unsigned char* buffer, std::size_t length,
                                             std::string const& extension) {
   detail::Journal journal = begin();
-  journal.knownSize = static_cast<std::int64_t>(length);
+  journal.knownSize = static_cast<std::int64_t>(length);  // for notes; a path's file tells its own
   auto memory = std::make_shared<QVMStream>(buffer, static_cast<unsigned long>(length));
   memory->length = length;  // the constructor takes an `unsigned long`: 32 bits on Windows
   return keep(journal, detail::readStream(std::move(memory), extension, &journal));

@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "journal/Reading.h"
+#include "stream/Bytes.h"
 #include "system/File.h"
 
 namespace quavel::detail {
@@ -45,7 +46,7 @@ void Journal::refuseCut(std::int64_t position, std::int64_t count, char const* p
   }
   refuse(cutReason(), position, "{}: {} {} wanted at {}, but {}",
          {composed(pattern, words), count, count == 1 ? "byte" : "bytes", Offset{position},
-          cutText(position + count)});
+          cutText(wrappingSum(position, count))});
 }
 
 std::int64_t Journal::dataSize() {

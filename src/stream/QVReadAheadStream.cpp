@@ -124,7 +124,7 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   bool const mustSeek = sourcePosition_ != position_;
   sourcePosition_ = -1;  // not known until the read succeeds
   if (mustSeek) {
-    if (fitsLong(position_)) {  // our `setOffset` has seen that the source accepts it
+    if (fitsLong(position_)) {  // our `setOffset` has tried it if it is a high one
       source_->setOffset(static_cast<long>(position_));
     } else if (!seekSource(position_)) {
       return -1;

@@ -26,8 +26,8 @@ inline constexpr Tag ExifIFDPointer = {0x8769, "ExifIFDPointer"};
 inline constexpr Tag ISOSpeedRatings = {0x8827, "ISOSpeedRatings", "iso"};
 inline constexpr Tag DateTimeOriginal = {0x9003, "DateTimeOriginal", "dateTimeOriginal"};
 inline constexpr Tag DateTimeDigitized = {0x9004, "DateTimeDigitized", "dateTimeDigitized"};
-inline constexpr Tag OffsetTimeOriginal = {0x9011,
-                                           "OffsetTimeOriginal"};  // only checked: see TagList
+// Only checked, not used: see `TagList`.
+inline constexpr Tag OffsetTimeOriginal = {0x9011, "OffsetTimeOriginal"};
 inline constexpr Tag ShutterSpeedValue = {0x9201, "ShutterSpeedValue", "shutterSpeedValue"};
 inline constexpr Tag ApertureValue = {0x9202, "ApertureValue", "apertureValue"};
 inline constexpr Tag ExposureBiasValue = {0x9204, "ExposureBiasValue", "exposureBiasValue"};

@@ -14,14 +14,15 @@ Source::Source(Inputs const& inputs, Report report) : inputs_(inputs), report_(s
 }
 
 bool Source::isReady() {
-  if (!list_ || list_->isReady() || ahead_) {
+  if (!list_ || ahead_) {
     return true;
   }
   Input input;
-  if (nextOfPaths(input)) {  // a walk does not know whether there is more before it finds it
+  if (nextOfPaths(input)) {  // a walk only knows that there is more once it has found it
     ahead_ = std::move(input);
+    return true;
   }
-  return ahead_.has_value();
+  return list_->isReady();
 }
 
 bool Source::next(Input& input) {

@@ -16,8 +16,8 @@ namespace app {
 
 namespace {
 
-/// Writes all bytes. The caller holds a WriteScope. An interrupt before the first byte is written
-/// ends the process.
+/// Writes all bytes. The caller holds a WriteScope, so an interrupt ends the process only
+/// afterwards, or here while no byte is written.
 void writeWhole(std::string_view bytes) {
   bool isBegun = false;
   while (!bytes.empty()) {
@@ -58,10 +58,10 @@ void Output::flush() {
   if (isTerminal_ && !pending_.empty()) {
     console_.hideProgress();
   }
-  // An interrupt ends the process after a second at most, even within a write. To keep pieces whole
-  // all the same, a pipe gets as many of them as fit into PIPE_BUF bytes, which it takes all
-  // together or not at all. (A longer piece may be cut.) A file does not wait, so it gets
-  // everything at once.
+  // A WriteScope delays an interrupt by a second at most; a write that takes longer is cut off. To
+  // keep pieces whole all the same, a pipe gets as many of them as fit into PIPE_BUF bytes, which
+  // it takes all together or not at all. (A longer piece may be cut.) A file does not make a write
+  // wait, so it gets everything at once.
   std::size_t const maxWrite = isFile_ ? pending_.size() : std::size_t{PIPE_BUF};
   std::size_t begin = 0;
   for (std::size_t i = 0; i < ends_.size(); ++i) {
@@ -86,11 +86,12 @@ void Output::enclose(std::string_view head, char const* tail) {
 void Output::finish() {
   flush();
   interrupt::WriteScope const scope;
-  if (char const* const tail =
-          std::exchange(tail_, nullptr)) {  // once, even if `giveUp` calls this again
+  // Forgotten first, so that `giveUp`, after a failure, does not write it again. The interrupt's
+  // copy comes last: an interrupt before the first byte must still write the tail.
+  if (char const* const tail = std::exchange(tail_, nullptr)) {
     writeWhole(tail);
   }
-  interrupt::setTail(nullptr);  // not earlier: an interrupt before its first byte writes the tail
+  interrupt::setTail(nullptr);
 }
 
 void Output::giveUp() noexcept {

@@ -68,7 +68,8 @@ bool isDate(std::string const& text) {
       std::equal(text.begin(), text.end(), kForm.begin(), kForm.end(),
                  [](char c, char form) { return form == '0' ? '0' <= c && c <= '9' : c == form; });
   std::tm time = {};
-  if (!isWellFormed || ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time) == nullptr) {
+  char const* const end = ::strptime(text.c_str(), "%Y:%m:%d %H:%M:%S", &time);
+  if (!isWellFormed || end != text.c_str() + text.size()) {  // of 96 seconds, it takes only the 9
     return false;
   }
   std::tm day = {};  // the date alone: a leap second would carry into the next day

@@ -70,8 +70,8 @@ void handle(int signal) {
 
 void install() {
   struct sigaction action = {};
-  // `sa_flags` lacks SA_RESTART, so that a signal ends a blocked write. The one in Output.cpp is
-  // not repeated before `leaveIfSignalled` has been called.
+  // `sa_flags` lacks SA_RESTART, so that a signal ends a blocked write. That in Output.cpp then
+  // calls `leaveIfSignalled`, unless some of its bytes are written already.
   action.sa_handler = handle;
   // While a signal is handled, only the alarm gets through.
   ::sigfillset(&action.sa_mask);

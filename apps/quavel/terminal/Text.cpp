@@ -86,10 +86,10 @@ bool isUtf8(std::string_view text) {
 }  // namespace
 
 bool isPrintableAscii(std::string_view text) {
-  // Eight bytes at a time. Bytes from 0x80 on have the top bit; those below ' ' get it when ' ' is
-  // subtracted, 0x7f when 1 is added. A printable byte never gets it. A borrow or a carry can
-  // change the next byte, but it comes only from a byte that is not printable: the answer is the
-  // same.
+  // Eight bytes at a time. A byte from 0x80 on has its top bit set. One below ' ' sets it when ' '
+  // is subtracted, and 0x7f sets it when 1 is added. A printable byte never does. A borrow or a
+  // carry can change the next byte, but it comes only from a byte that is not printable: the answer
+  // is the same.
   constexpr std::uint64_t kOnes = 0x0101010101010101;
   constexpr std::uint64_t kSpaces = kOnes * ' ';
   std::uint64_t word = 0;
