@@ -16,7 +16,7 @@
 #ifdef __GLIBC__
 #include <malloc.h>
 #endif
-#ifndef O_PATH  // which not every system has
+#ifndef O_PATH  // which needs no permission to read; not every system has it
 #define O_PATH O_RDONLY
 #endif
 
@@ -36,9 +36,10 @@ void holdStandardStreams() {
 }
 
 int runOptions(app::ParsedOptions const& parsed, app::Output& output, app::Console& console) {
-  if (!parsed.status) {  // else there is only a text to print, such as that of --help
+  if (!parsed.status.has_value()) {
     return app::run(parsed.options, output, console);
   }
+  // There is only a text to print, such as that of --help.
   if (*parsed.status == app::kSuccess) {
     output.add(parsed.text);
     output.flush();

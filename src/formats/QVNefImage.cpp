@@ -9,8 +9,9 @@ using namespace detail;
 
 namespace {
 
-// A file is read as a NEF only if its first directory describes a thumbnail of this size. Some
-// cameras write a different size; their files are refused.
+// A file is read as a NEF only if its first directory describes a thumbnail of this size. This
+// tells NEFs from other TIFF structures, at a price: the files of cameras that write another are
+// refused.
 constexpr std::int32_t kThumbnailWidth = 160;
 constexpr std::int32_t kThumbnailHeight = 120;
 constexpr char kThumbnailRuleText[] = "a NEF's first directory must be 160 x 120";

@@ -19,7 +19,8 @@ std::string pathAsUtf8(std::string const& path);
 /// that are not UTF-8 and characters that reorder their neighbours become \n, \t, \xNN or \u{NNNN}.
 /// The result is always one line of valid UTF-8.
 std::string escaped(std::string const& text);
-/// The same for a path; its own backslashes are doubled, to tell them from those of an escape.
+/// The same for a path, which must be exact: its own backslashes are doubled, to tell them from
+/// those of an escape.
 std::string escapedPath(std::string path);
 
 /// The number of terminal cells that an escaped text takes.
