@@ -21,7 +21,7 @@ void detail::noteEnd(Journal* journal, std::int64_t position) {
   }
 }
 
-void detail::noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height) {
+void detail::noteExifSize(DirectoryPointer const& exifIFD, int width, int height) {
   if (!wantsAllNotes(journalOf(exifIFD))) {
     return;
   }
@@ -43,7 +43,7 @@ void QVJPEGImage::noteWhatIsMissing(Journal* journal, WalkState const& walk) {
   if (!wantsAllNotes(journal)) {
     return;
   }
-  // The note from `noteWhyNoSize`, if any. The note below replaces it, and so repeats its text.
+  // The note from `noteExifSize`, if any. The note below replaces it, and so repeats its text.
   QVNote const* const exifNote = journal->absenceOf("width");
   std::string const exifText = exifNote == nullptr ? "no Exif IFD gives a size" : exifNote->text;
   std::string const frameText =

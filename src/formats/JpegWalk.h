@@ -12,7 +12,7 @@ struct QVJPEGImage::WalkState {
   bool sawSOF0 = false;
   unsigned short frameWidth = 0;   ///< The greatest width in any SOF0 segment.
   unsigned short frameHeight = 0;  ///< The greatest height, maybe in another one.
-  std::int64_t nextOffset = 0;     ///< Of the next segment; `baseOffset` is the same for all.
+  std::int64_t nextOffset = 0;     ///< Of the next segment, from the walk's `baseOffset`.
   // For notes, when there is a journal. The numbers are positions in the file; -1: not met.
   bool sawExif = false;        ///< An Exif segment, which was read.
   std::int64_t position = -1;  ///< The segment being read; set for each.
@@ -28,9 +28,9 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes what size an Exif directory gives. To count, both sides must be above 500 and below 2^31.
-/// The note is shown only if the record gets no size.
-void noteWhyNoSize(DirectoryPointer const& exifIFD, int width, int height);
+/// Notes what size an Exif directory gives, for a record that gets no size: a side is then missing,
+/// at most 500, or from 2^31 on. If the record gets a size, the note is not shown.
+void noteExifSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail
 }  // namespace quavel

@@ -236,7 +236,7 @@ bool QVJPEGImage::storeInfoFromExifIFD(std::shared_ptr<QVTiffImageFileDirectory>
   if (!readImgWidth(ifd, exifWidth) || !readImgHeight(ifd, exifHeight)) {
     return false;
   }
-  noteWhyNoSize(ifd, exifWidth, exifHeight);  // shown only if the record gets no size
+  noteExifSize(ifd, exifWidth, exifHeight);  // shown only if the record gets no size
   if (exifWidth > kMaxThumbnailSide && exifHeight > kMaxThumbnailSide) {
     width = exifWidth;
     height = exifHeight;

@@ -16,7 +16,8 @@ inline constexpr std::int64_t kMaxUncheckedSeek = 0x7fffffff;
 ///
 /// The system gets advice. After many reads of a file, a walk to its end is assumed: the system is
 /// to fetch what follows. A slow first read of a file is taken as a sign that files come from the
-/// disk, not from the system's cache: in files that are opened next, it is not to read ahead.
+/// disk, not from the system's cache: in the files that are opened next, the system is not to
+/// read ahead.
 class PositionedFile : public QVFStream {
  public:
   explicit PositionedFile(std::string const& path);

@@ -23,8 +23,8 @@ bool seekByBase(QVStream& source, std::int64_t target) {
   source.setOffset(0);
   bool const isAtZero = source.getOffset() == 0;
   source.baseOffset = base;
-  // That 0 proves nothing yet: a source that ignores `baseOffset` has gone to its start. With the
-  // old base, it gives 0 again, while one that has moved gives the target, truncated to a `long`.
+  // A source that ignores `baseOffset` has gone to its start, and gives 0 with either base. One
+  // that has moved gives the target with the old base, truncated to a `long`.
   return isAtZero && source.getOffset() == static_cast<long>(target);
 }
 
@@ -124,7 +124,8 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   bool const mustSeek = sourcePosition_ != position_;
   sourcePosition_ = -1;  // not known until the read succeeds
   if (mustSeek) {
-    if (fitsLong(position_)) {  // our `setOffset` has tried it if it is a high one
+    // A high position has been tried by our `setOffset`. One that fits no `long` needs it again.
+    if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
     } else if (!seekSource(position_)) {
       return -1;

@@ -31,8 +31,8 @@ bool QVTiffHeader::read(std::shared_ptr<QVStream>& stream, unsigned short expect
 bool detail::readTiffHeader(QVStream& stream, unsigned short expectedMagic, QVTiffHeader& header,
                             char const* structure) {
   Journal* const journal = journalOf(stream);
-  // Where the header should begin, for notes only. That is not before `baseOffset`: if a damaged
-  // file puts it beyond the end of a buffer, the stream stands before it, at that end.
+  // Where the header should begin, for notes. The stream may stand before `baseOffset`: it stops at
+  // the end of a buffer, and a damaged file may put `baseOffset` beyond that.
   std::int64_t const start = std::max(positionForNotes(journal, stream), stream.baseOffset);
   PartName const name = {"the TIFF header", structure};
 

@@ -45,7 +45,7 @@ std::string inWords(Field const& field, Outcome const& outcome);
 bool isAbsent(Value const& value);
 
 /// The value to sort and select by. For captureDate, it is the first of the original, digitized and
-/// file dates that is not blank; the field's own value may be a blank date.
+/// file dates that is not blank.
 Value comparedValue(Field const& field, Outcome const& outcome);
 
 /// Appends the value for programs: a text as it is, "true" or "false", "Infinity" or "-Infinity",

@@ -51,8 +51,9 @@ class WriteScope {
   WriteScope& operator=(WriteScope const&) = delete;
 };
 
-/// If a signal has arrived, ends the process now instead of at the end of the WriteScope. Only to
-/// be called while none of the scope's bytes are written, or all of them, so that no line is cut.
+/// If a signal has arrived, ends the process now: to wait for the end of the WriteScope could be to
+/// wait for a blocked write. Only to be called while none of the scope's bytes are written, or all
+/// of them, so that no line is cut.
 void leaveIfSignalled();
 
 }  // namespace app::interrupt
