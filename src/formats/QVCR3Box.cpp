@@ -9,7 +9,7 @@ QVCR3Box::~QVCR3Box() = default;
 bool QVCR3Box::read(std::shared_ptr<QVStream>& stream) {
   auto const scope = detail::ReadScope::beginOrJoin(*stream);
   boxHeader = std::make_shared<QVCR3BoxHeader>();
-  detail::BoxWalk walk(stream, /*place=*/{});  // notes do not say where this box is
+  detail::BoxWalk walk(stream, /*place=*/{});  // a box around this one is not known here
   return walk.stepOver(*boxHeader);
 }
 

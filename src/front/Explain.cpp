@@ -63,7 +63,8 @@ QVNote absence(FieldRow const& row, Format const& format, Journal& journal) {
     return {QVNoteKind::Absence, QVReason::NotInFormat, -1, row.name, text, /*systemError=*/0};
   }
   FieldRow const& origin = *(&row + row.rowsToOrigin);  // the row itself, unless it is computed
-  auto const* const noted = journal.absenceOf(origin.name);  // null: no reader has said why
+  // Null would be a fault of ours: each reader says why. The note then only names the field.
+  auto const* const noted = journal.absenceOf(origin.name);
   QVNote note = {QVNoteKind::Absence, QVReason::None, -1, "", "", /*systemError=*/0};
   if (noted != nullptr) {
     note = *noted;
@@ -82,9 +83,10 @@ struct Signature {
   std::uint8_t size;
   char bytes[9];
   char kind[36];          ///< As it stands after "looks like".
-  std::uint8_t families;  ///< Whose readers need no hint at this kind; 0: none.
+  std::uint8_t families;  ///< Whose files may begin so; the others get a hint.
 };
 
+// No hint is needed at a BigTIFF structure in these: the TIFF header's own refusal names it.
 constexpr std::uint8_t kTiffFamilies = kTiff | kNef | kArw;
 
 constexpr Signature kSignatures[] = {
@@ -127,7 +129,8 @@ void noteOtherContent(Format const& format, QVStream& stream, std::int64_t start
       QuotedBytes const brand = {opening.data() + kBrandPosition, kBrandSize};
       char const* const kind = row.kind;
       std::string const text = hasBrand ? composed("{} of brand \"{}\"", {kind, brand}) : kind;
-      // The wrong kind of file explains any refusal but one for a limit, or because reading failed.
+      // The wrong kind of file explains a refusal, unless reading failed. A refusal for a limit has
+      // a kind of its own and keeps its reason too.
       for (QVNote& note : journal.notes) {
         if (note.kind == QVNoteKind::Refusal && note.reason != QVReason::ReadError) {
           note.reason = QVReason::OtherKind;
@@ -144,8 +147,10 @@ void noteAbsences(Format const& format, QVMetadata const& record, Journal& journ
   if (!journal.wantsAllNotes()) {
     return;
   }
+  // The reasons that readers gave are kept apart from `notes`. Those of the fields that stayed
+  // absent are put there now, in the record's order.
   for (auto const& row : kFields) {
-    if (isAbsent(row, record)) {  // the readers' reasons are not among `notes` yet
+    if (isAbsent(row, record)) {
       journal.notes.push_back(absence(row, format, journal));
     }
   }

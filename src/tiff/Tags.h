@@ -26,7 +26,7 @@ inline constexpr Tag ExifIFDPointer = {0x8769, "ExifIFDPointer"};
 inline constexpr Tag ISOSpeedRatings = {0x8827, "ISOSpeedRatings", "iso"};
 inline constexpr Tag DateTimeOriginal = {0x9003, "DateTimeOriginal", "dateTimeOriginal"};
 inline constexpr Tag DateTimeDigitized = {0x9004, "DateTimeDigitized", "dateTimeDigitized"};
-// Only checked, not used: see `TagList`.
+// Not used. But a malformed entry with this tag is a sign of damage, so it is looked at.
 inline constexpr Tag OffsetTimeOriginal = {0x9011, "OffsetTimeOriginal"};
 inline constexpr Tag ShutterSpeedValue = {0x9201, "ShutterSpeedValue", "shutterSpeedValue"};
 inline constexpr Tag ApertureValue = {0x9202, "ApertureValue", "apertureValue"};

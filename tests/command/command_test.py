@@ -222,13 +222,13 @@ class Endings(CommandTest):
         for name in ("walked/b.tif", "walked/c.tif"):
             self.put(name, photo())
         with self.start("-q", "--jsonl", "walked", "--files-from", "-", stdin=subprocess.PIPE, stdout=subprocess.PIPE,
+                        bufsize=0,  # or a second line could wait in a buffer, where `select` does not see it
                         preexec_fn=lambda: signal.signal(signal.SIGINT, signal.SIG_IGN)) as process:
             for name in ["walked/b.tif", "walked/c.tif"] + 3 * ["a.tif"]:
                 self.assertTrue(select.select([process.stdout], [], [], 60)[0])
                 self.assertEqual(json.loads(process.stdout.readline())["path"], name)
                 if name != "walked/b.tif":
                     process.stdin.write(b"a.tif\n")
-                    process.stdin.flush()
                 process.send_signal(signal.SIGINT)
             process.send_signal(signal.SIGTERM)
             self.assertEqual(process.wait(60), -signal.SIGTERM)

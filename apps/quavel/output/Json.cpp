@@ -18,8 +18,8 @@ void appendValue(std::string& json, Value const& value, bool isForTerminal) {
   auto const* const text = std::get_if<std::string>(&value);
   auto const* const number = std::get_if<float>(&value);
   if (text != nullptr && mayNeedEscapes(*text)) {
-    // JSON escapes control characters itself. If the text has others that could steer the terminal,
-    // all that is not ASCII becomes \uNNNN.
+    // What could steer the terminal is escaped by making all that is not ASCII \uNNNN. (JSON
+    // escapes control characters anyway.)
     bool const couldSteer = isForTerminal && escaped(*text) != *text;
     json +=
         nlohmann::json(*text).dump(-1, ' ', couldSteer, nlohmann::json::error_handler_t::replace);
@@ -107,7 +107,7 @@ TextMaker jsonObjectMaker(Form const& form, bool isForTerminal) {
     object.reserve(700);  // enough for most records: to grow it by steps costs more than to fill it
     appendMembers(object, outcome.record ? ofRecord : ofProblem, outcome, isForTerminal);
     object += form.hasNotes ? notesOf(outcome, isForTerminal) : "";
-    object.replace(0, 1, "{");  // replaces the first comma, if there is a member
+    object.replace(0, 1, "{");  // in place of the first comma; inserted if there is no member
     object += form.kind == FormKind::Jsonl ? "}\n" : "}";
     return object;
   };

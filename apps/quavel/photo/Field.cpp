@@ -41,8 +41,8 @@ Value captureDateOf(Outcome const& outcome) {
   return outcome.record ? presentOrAbsent(outcome.record->captureDate()) : Value();
 }
 
-/// The first date that is not blank, to sort and select by. `captureDate` does not skip a blank
-/// one, which a record has until `tidyDates` clears it.
+/// The first date that is not blank, to sort and select by. A record for programs may have blank
+/// ones, as in the file, and `captureDate` would return such a date.
 Value usableCaptureDate(QVMetadata const& record) {
   for (auto const* date : {&record.dateTimeOriginal, &record.dateTimeDigitized, &record.dateTime}) {
     if (!isAbsent(*date)) {

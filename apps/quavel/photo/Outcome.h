@@ -21,7 +21,7 @@ struct Problem {
   int systemError = 0;         ///< The `errno` that caused it; 0: none.
 };
 
-/// One file to read, or a folder or a list that cannot be read.
+/// One file to read; or, with a problem, a folder or a list of paths that cannot be read.
 struct Input {
   std::string path;
   bool isRegular = false;  ///< Known to be a regular file; false: still to be checked.
@@ -31,11 +31,11 @@ struct Input {
 /// The result of reading one file.
 struct Outcome {
   std::string path;
-  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or no longer needed for output.
+  std::shared_ptr<quavel::QVMetadata> record;  ///< Null: none, or freed after the output was made.
   Problem problem;                             ///< Why there is no record.
   char const* format = "";                     ///< Such as "JPEG"; empty: the extension names none.
   std::vector<quavel::QVNote> notes;           ///< Empty unless they are wanted.
-  std::uint64_t unnotedSteps = 0;              ///< Parts read after the few that `notes` names.
+  std::uint64_t unnotedSteps = 0;              ///< Parts read without trouble that have no note.
   bool isShown = true;                         ///< It meets the conditions of --where.
   std::string text;                            ///< Its output in the chosen form, once prepared.
   std::vector<std::string> cells;              ///< Its row of the table, instead of `text`.
