@@ -26,7 +26,7 @@ struct Options {
 struct ParsedOptions {
   Options options;
   std::optional<int> status;  ///< If set, the command only prints `text` and exits with this.
-  std::string text;  ///< For standard output; for Console::printMessage if the usage is wrong.
+  std::string text;  ///< For standard output; if the usage is wrong, a message for standard error.
 };
 
 ParsedOptions parseOptions(int argc, char const* const* argv);

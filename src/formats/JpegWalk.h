@@ -14,13 +14,13 @@ struct QVJPEGImage::WalkState {
   unsigned short frameHeight = 0;  ///< The greatest height, maybe in another one.
   std::int64_t nextOffset = 0;     ///< Of the next segment, from the walk's `baseOffset`.
   // For notes, when there is a journal. The numbers are positions in the file; -1: not met.
-  bool sawExif = false;        ///< An Exif segment, which was read.
+  bool sawExif = false;        ///< An Exif segment was met, and read without a failure.
   std::int64_t position = -1;  ///< The segment being read; set for each.
   /// The SOF0 that last made `frameWidth` or `frameHeight` greater. If all are 0 x 0: the first.
   std::int64_t sof0Position = -1;
   std::int64_t sof2Position = -1;       ///< The last SOF2 before the first SOS.
   std::int64_t firstScanPosition = -1;  ///< The first SOS.
-  char const* missingAtScan = "";       ///< "SOF0", "APP1" or both: not met before the first SOS.
+  char const* missingAtScan = "";       ///< Which of SOF0 and APP1 did not come before it.
 };
 
 namespace detail {
@@ -28,8 +28,8 @@ namespace detail {
 /// Notes that the walk ends at `position`, where no marker can be read. It may be beyond the data.
 void noteEnd(Journal* journal, std::int64_t position);
 
-/// Notes what size an Exif directory gives, for a record that gets no size: a side is then missing,
-/// at most 500, or from 2^31 on. If the record gets a size, the note is not shown.
+/// Notes the size that an Exif directory gives, as the reason for a record without one; only then
+/// it is shown. A side counts if it is above 500 and below 2^31, from where on it is negative here.
 void noteExifSize(DirectoryPointer const& exifIFD, int width, int height);
 
 }  // namespace detail

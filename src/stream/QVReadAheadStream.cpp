@@ -71,8 +71,8 @@ bool QVReadAheadStream::seekSource(std::int64_t target) {
   } else if (seekByBase(*source_, target)) {
     return true;
   }
-  // A source may also stop at its end. That is no refusal: a read delivers nothing there, as it
-  // would past the end.
+  // A source that is still at 0 has refused. Elsewhere, it has moved to the target or, as some do,
+  // to its end, where a read delivers nothing either.
   return source_->getOffset() != 0;
 }
 
@@ -124,7 +124,8 @@ std::int64_t QVReadAheadStream::readSource(Block const& block, std::size_t count
   bool const mustSeek = sourcePosition_ != position_;
   sourcePosition_ = -1;  // not known until the read succeeds
   if (mustSeek) {
-    // A high position has been tried by our `setOffset`. One that fits no `long` needs it again.
+    // Not checked: our `setOffset` has tried a position that the source may refuse. One that fits
+    // no `long` is reached in this way only.
     if (fitsLong(position_)) {
       source_->setOffset(static_cast<long>(position_));
     } else if (!seekSource(position_)) {

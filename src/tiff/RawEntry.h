@@ -72,7 +72,8 @@ inline std::uint32_t valueOffset(RawEntry const& entry, bool isReversed) {
 }
 
 /// Appends the entry's values. The type must be known and not UNDEFINED, the count not too large,
-/// and the whole field must have been read. False: the data does not hold all values.
+/// and the bytes of the field that it uses must have been read. False: the data does not hold all
+/// values.
 bool readValues(QVStream& stream, RawEntry const& entry,
                 std::vector<QVTiffImageFileDirectoryEntryValue>& values);
 

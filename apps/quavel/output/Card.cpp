@@ -33,7 +33,7 @@ std::string cardOf(Form const& form, Outcome const& outcome) {
   static Fields const usualFields = cardFields();
   bool const fieldsAreChosen = !form.fields.empty();
   bool const showAbsent = form.showAbsent.value_or(fieldsAreChosen);
-  // Who chooses fields gets the path only by choosing it.
+  // If fields are chosen, the path is shown only as one of them.
   std::string card = fieldsAreChosen ? "" : escapedPath(outcome.path) + "\n";
   for (auto const* field : fieldsAreChosen ? form.fields : usualFields) {
     std::string const text = inWords(*field, outcome);

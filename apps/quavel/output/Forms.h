@@ -25,7 +25,8 @@ TextMaker csvRowMaker(Form const& form, bool isForTerminal);
 
 /// JSON objects, each on one line. For JSON Lines, each includes its line end; in an array, the
 /// writer adds commas and line ends. An infinity, which JSON lacks, is "Infinity" or "-Infinity".
-/// With `isForTerminal`, characters are escaped as for CSV. The maker keeps a reference to `form`.
+/// With `isForTerminal`, characters are escaped as for CSV. This maker keeps a reference to `form`;
+/// that of CSV does not.
 TextMaker jsonObjectMaker(Form const& form, bool isForTerminal);
 
 /// A table for people. It is laid out a page of 500 rows at a time, so that no more are held in

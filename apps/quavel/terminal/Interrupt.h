@@ -15,8 +15,8 @@ void writeAll(int fd, std::string_view bytes);
 }  // namespace app
 
 /// On SIGINT, SIGTERM and SIGHUP, a signal handler completes the output (see `setTail`) and ends
-/// the process. A thread that waits for signals would slow down a run that needs no other thread:
-/// system calls are faster in a process of one thread.
+/// the process. It is a handler, not a thread that waits for signals, because system calls become
+/// slower as soon as a process has a second thread.
 namespace app::interrupt {
 
 /// Installs the handler. To be called once, before any thread is started. Signals that the process
@@ -24,7 +24,7 @@ namespace app::interrupt {
 void install();
 
 /// Threads that the calling thread starts while this lives receive no signals, so that the handler
-/// runs on the thread that writes.
+/// runs on the thread that writes, never beside a write.
 class BlockSignals {
  public:
   BlockSignals();
